@@ -1,0 +1,140 @@
+// The vector layer over AVX2: two blocks of 16 bytes. The meaning of each operation stands in lanes.h.
+#ifndef SIMD_AVX2_H
+#define SIMD_AVX2_H
+
+#include <immintrin.h>
+#include <stddef.h>
+#include <stdint.h>
+
+namespace simgp::avx2 {
+
+inline constexpr int bytes = 32;
+inline constexpr int blocks = 2;
+
+// One register type stands for all lanes.
+using u8v = __m256i;
+using u16v = __m256i;
+using s16v = __m256i;
+
+inline u8v as_u8(u16v v) { return v; }
+inline u16v as_u16(u8v v) { return v; }
+inline s16v as_s16(u16v v) { return v; }
+
+inline u8v load(const uint8_t *p) {
+    return _mm256_loadu_si256(reinterpret_cast<const __m256i *>(p));
+}
+inline void store(uint8_t *p, u8v v) { _mm256_storeu_si256(reinterpret_cast<__m256i *>(p), v); }
+inline u16v load_widen(const uint8_t *p) {
+    return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i *>(p)));
+}
+
+inline u8v set_u8(uint8_t x) { return _mm256_set1_epi8(static_cast<char>(x)); }
+inline u16v set_u16(uint16_t x) { return _mm256_set1_epi16(static_cast<int16_t>(x)); }
+
+inline u8v bit_and(u8v a, u8v b) { return _mm256_and_si256(a, b); }
+inline u8v bit_or(u8v a, u8v b) { return _mm256_or_si256(a, b); }
+template <int N>
+inline u16v shl(u16v a) {
+    return _mm256_slli_epi16(a, N);
+}
+template <int N>
+inline u16v shr(u16v a) {
+    return _mm256_srli_epi16(a, N);
+}
+
+inline s16v add(s16v a, s16v b) { return _mm256_add_epi16(a, b); }
+inline s16v add_sat(s16v a, s16v b) { return _mm256_adds_epi16(a, b); }
+
+// The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
+template <int A, int B, int C>
+inline s16v pair_dot(u8v v) {
+    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    constexpr bool negative = A < 0 || B < 0;
+    constexpr int a = negative ? -A : A, b = negative ? -B : B;
+    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
+    const __m256i centred = _mm256_xor_si256(v, _mm256_set1_epi8(-128));
+    const __m256i dot = _mm256_maddubs_epi16(_mm256_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
+    const __m256i c = _mm256_set1_epi16(static_cast<int16_t>(C));
+    return negative ? _mm256_sub_epi16(c, dot) : _mm256_add_epi16(dot, c);
+}
+inline s16v low_minus_128_shl8(u8v v) {
+    return _mm256_slli_epi16(_mm256_xor_si256(v, _mm256_set1_epi8(-128)), 8);
+}
+
+inline u16v even(u8v v) { return _mm256_and_si256(v, _mm256_set1_epi16(255)); }
+inline u16v odd(u8v v) { return _mm256_srli_epi16(v, 8); }
+inline u8v join(u16v even, u16v odd) { return _mm256_or_si256(even, _mm256_slli_epi16(odd, 8)); }
+template <int N>
+inline u8v narrow_join(s16v even, s16v odd) {
+    const __m256i halves =
+        _mm256_packus_epi16(_mm256_srai_epi16(even, N), _mm256_srai_epi16(odd, N));
+    return _mm256_shuffle_epi8(
+        halves, _mm256_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15,  //
+                                 0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15));
+}
+
+inline u16v pack565(s16v hi, s16v mid, s16v lo) {
+    const __m256i zero = _mm256_setzero_si256();
+    hi = _mm256_and_si256(_mm256_max_epi16(hi, zero), _mm256_set1_epi16(0x7C00));
+    mid = _mm256_and_si256(_mm256_srli_epi16(_mm256_max_epi16(mid, zero), 4),
+                           _mm256_set1_epi16(0x07E0));
+    lo = _mm256_srli_epi16(_mm256_max_epi16(lo, zero), 10);
+    return _mm256_or_si256(_mm256_or_si256(_mm256_add_epi16(hi, hi), mid), lo);
+}
+
+inline u8v natural_to_by8(u8v v) { return _mm256_permute4x64_epi64(v, 0xD8); }
+inline u8v natural_to_by4(u8v v) {
+    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 2, 4, 6, 1, 3, 5, 7));
+}
+inline u8v by8_to_natural(u8v v) { return _mm256_permute4x64_epi64(v, 0xD8); }
+inline u8v by8_to_by4(u8v v) {
+    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 2, 6, 1, 5, 3, 7));
+}
+
+struct pair_u8 {
+    u8v even, odd;
+};
+inline pair_u8 load_split(const uint8_t *p) {
+    const __m256i a = load(p), b = load(p + bytes);
+    return {_mm256_packus_epi16(even(a), even(b)), _mm256_packus_epi16(odd(a), odd(b))};
+}
+
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+    store(p, _mm256_unpacklo_epi16(even, odd));
+    store(p + bytes, _mm256_unpackhi_epi16(even, odd));
+}
+
+// Each vector is shuffled once, so that its bytes stand where any of the three outputs wants them, and
+// each output blended from the three. A byte i of a block goes to place 3i + k of the 48 output bytes,
+// k = 0, 1, 2 for a, b, c; place modulo 16 differs for all 16 bytes of a block.
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+    const auto twice = [](__m128i v) { return _mm256_broadcastsi128_si256(v); };
+    a = _mm256_shuffle_epi8(
+        a, twice(_mm_setr_epi8(0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10, 5)));
+    b = _mm256_shuffle_epi8(
+        b, twice(_mm_setr_epi8(5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10)));
+    c = _mm256_shuffle_epi8(
+        c, twice(_mm_setr_epi8(10, 5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15)));
+    const __m256i m1 = twice(_mm_setr_epi8(0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0));
+    const __m256i m2 = twice(_mm_setr_epi8(0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0));
+    const auto blend = [&](__m256i x, __m256i y, __m256i z) {  // places 0, 1, 2 modulo 3
+        return _mm256_blendv_epi8(_mm256_blendv_epi8(x, y, m1), z, m2);
+    };
+    const __m256i first = blend(a, b, c), second = blend(b, c, a), third = blend(c, a, b);
+    store(p, _mm256_permute2x128_si256(first, second, 0x20));
+    store(p + bytes, _mm256_blend_epi32(third, first, 0xF0));
+    store(p + 2 * bytes, _mm256_permute2x128_si256(second, third, 0x31));
+}
+
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
+    const __m256i cd_lo = _mm256_unpacklo_epi8(c, d), cd_hi = _mm256_unpackhi_epi8(c, d);
+    store(p, _mm256_unpacklo_epi16(ab_lo, cd_lo));
+    store(p + bytes, _mm256_unpackhi_epi16(ab_lo, cd_lo));
+    store(p + 2 * bytes, _mm256_unpacklo_epi16(ab_hi, cd_hi));
+    store(p + 3 * bytes, _mm256_unpackhi_epi16(ab_hi, cd_hi));
+}
+
+}  // namespace simgp::avx2
+
+#endif

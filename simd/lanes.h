@@ -1,0 +1,208 @@
+// The vector layer over plain lanes: the meaning of every operation, one line each. The other headers of
+// this folder offer the same vocabulary over an instruction set and are tested against this one.
+//
+// A vector has `bytes` bytes. Operations work on all lanes alike, except those that move bytes within
+// blocks of 16 bytes, the unit that wide x86 registers are made of; blocks = bytes / 16.
+//
+// Order of pixels. What lies in blocks comes out of in-block shuffles in pieces. Kernels therefore bring
+// their input into an order in which the stores at the end find whole vectors:
+//   natural   byte i is pixel i
+//   by8       block j holds granules j and blocks + j, each of 8 bytes
+//   by4       block j holds granules j, blocks + j, 2 blocks + j, 3 blocks + j, each of 4 bytes
+// With one block all three are the same.
+#ifndef SIMD_LANES_H
+#define SIMD_LANES_H
+
+#include <stddef.h>
+#include <stdint.h>
+#include <string.h>
+
+#ifndef SIMD_LANES_BYTES
+#define SIMD_LANES_BYTES 32
+#define SIMD_LANES_NAMESPACE lanes
+#endif
+
+namespace simgp::SIMD_LANES_NAMESPACE {
+
+inline constexpr int bytes = SIMD_LANES_BYTES;
+inline constexpr int blocks = bytes / 16;
+
+template <typename T>
+struct vec {
+    static constexpr int count = bytes / (int)sizeof(T);
+    T lane[count];
+};
+using u8v = vec<uint8_t>;
+using u16v = vec<uint16_t>;
+using s16v = vec<int16_t>;
+
+template <typename To, typename From>
+inline To cast(From v) {
+    static_assert(sizeof(To) == sizeof(From));
+    To r;
+    memcpy(&r, &v, sizeof r);
+    return r;
+}
+
+// Result lane i = f(i).
+template <typename V, typename F>
+inline V make(F f) {
+    V r;
+    for (int i = 0; i < V::count; i++) r.lane[i] = static_cast<decltype(r.lane[0] + 0)>(f(i));
+    return r;
+}
+
+inline int clamp_to(int low, int high, int x) { return x < low ? low : x > high ? high : x; }
+
+// Reinterpretation of the same bytes; 16-bit lanes are little-endian.
+inline u8v as_u8(u16v v) { return cast<u8v>(v); }
+inline u16v as_u16(u8v v) { return cast<u16v>(v); }
+inline u16v as_u16(s16v v) { return cast<u16v>(v); }
+inline s16v as_s16(u16v v) { return cast<s16v>(v); }
+
+// Memory, at any address.
+inline u8v load(const uint8_t *p) {
+    u8v r;
+    memcpy(&r, p, bytes);
+    return r;
+}
+inline void store(uint8_t *p, u8v v) { memcpy(p, &v, bytes); }
+// bytes / 2 bytes, each widened to a 16-bit lane.
+inline u16v load_widen(const uint8_t *p) {
+    return make<u16v>([&](int i) { return p[i]; });
+}
+
+inline u8v set_u8(uint8_t x) {
+    return make<u8v>([&](int) { return x; });
+}
+inline u16v set_u16(uint16_t x) {
+    return make<u16v>([&](int) { return x; });
+}
+
+// Bits.
+inline u8v bit_and(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] & b.lane[i]; });
+}
+inline u8v bit_or(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] | b.lane[i]; });
+}
+inline u16v bit_and(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return a.lane[i] & b.lane[i]; });
+}
+inline u16v bit_or(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return a.lane[i] | b.lane[i]; });
+}
+template <int N>
+inline u16v shl(u16v a) {
+    return make<u16v>([&](int i) { return uint16_t(a.lane[i] << N); });
+}
+template <int N>
+inline u16v shr(u16v a) {
+    return make<u16v>([&](int i) { return a.lane[i] >> N; });
+}
+
+// Signed 16-bit sums, wrapping and saturating.
+inline s16v add(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return int16_t(a.lane[i] + b.lane[i]); });
+}
+inline s16v add_sat(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return clamp_to(-32768, 32767, a.lane[i] + b.lane[i]); });
+}
+
+// A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the same
+// sign and at most 255 in size, and the sum of the two products fits 16 bits.
+template <int A, int B, int C>
+inline s16v pair_dot(u8v v) {
+    return make<s16v>([&](int i) {
+        return int16_t(A * (v.lane[2 * i] - 128) + B * (v.lane[2 * i + 1] - 128) + C);
+    });
+}
+// 256 (low byte - 128) of each byte pair.
+inline s16v low_minus_128_shl8(u8v v) {
+    return make<s16v>([&](int i) { return 256 * (v.lane[2 * i] - 128); });
+}
+
+// Byte pairs: lane i of even and odd is byte 2i and 2i + 1.
+inline u16v even(u8v v) {
+    return make<u16v>([&](int i) { return v.lane[2 * i]; });
+}
+inline u16v odd(u8v v) {
+    return make<u16v>([&](int i) { return v.lane[2 * i + 1]; });
+}
+// Byte 2i from the low byte of even lane i, byte 2i + 1 from that of odd; the high bytes must be 0.
+inline u8v join(u16v even, u16v odd) {
+    return make<u8v>([&](int i) { return (i & 1 ? odd : even).lane[i / 2]; });
+}
+// Byte 2i = clamp(even lane i >> N), byte 2i + 1 = clamp(odd lane i >> N), to 0 ... 255.
+template <int N>
+inline u8v narrow_join(s16v even, s16v odd) {
+    return make<u8v>(
+        [&](int i) { return clamp_to(0, 255, (i & 1 ? odd : even).lane[i / 2] >> N); });
+}
+
+// The 565 word of three channels with 7 fractional bits, high to low; negative channels count as 0.
+inline u16v pack565(s16v hi, s16v mid, s16v lo) {
+    return make<u16v>([&](int i) {
+        auto channel = [&](s16v v) { return v.lane[i] < 0 ? 0 : v.lane[i]; };
+        return channel(hi) >> 10 << 11 | channel(mid) >> 9 << 5 | channel(lo) >> 10;
+    });
+}
+
+// Orders of pixels, see above.
+template <int Granule>
+inline u8v natural_to(u8v v) {
+    constexpr int parts = 16 / Granule;
+    return make<u8v>([&](int i) {
+        const int block = i / 16, part = i % 16 / Granule;
+        return v.lane[(part * blocks + block) * Granule + i % Granule];
+    });
+    static_assert(parts * Granule == 16);
+}
+inline u8v natural_to_by8(u8v v) { return natural_to<8>(v); }
+inline u8v natural_to_by4(u8v v) { return natural_to<4>(v); }
+inline u8v by8_to_natural(u8v v) {
+    return make<u8v>([&](int i) {
+        const int granule = i / 8;
+        return v.lane[granule % blocks * 16 + granule / blocks * 8 + i % 8];
+    });
+}
+inline u8v by8_to_by4(u8v v) { return natural_to_by4(by8_to_natural(v)); }
+
+// 2 bytes bytes, split: byte 2i and 2i + 1 of memory are byte i of even and odd, in by8 order.
+struct pair_u8 {
+    u8v even, odd;
+};
+inline pair_u8 load_split(const uint8_t *p) {
+    return {natural_to_by8(make<u8v>([&](int i) { return p[2 * i]; })),
+            natural_to_by8(make<u8v>([&](int i) { return p[2 * i + 1]; }))};
+}
+
+// Stores of 2 bytes, 3 bytes and 4 bytes bytes: even and odd words of pixels in by8 order, alternating;
+// the bytes of three vectors in natural order, in turn; the bytes of four vectors in by4 order, in turn.
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+    u8v lo = by8_to_natural(join(bit_and(even, set_u16(255)), bit_and(odd, set_u16(255))));
+    u8v hi = by8_to_natural(join(shr<8>(even), shr<8>(odd)));
+    for (int i = 0; i < bytes; i++) {
+        p[2 * i] = lo.lane[i];
+        p[2 * i + 1] = hi.lane[i];
+    }
+}
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+    for (int i = 0; i < bytes; i++) {
+        p[3 * i] = a.lane[i];
+        p[3 * i + 1] = b.lane[i];
+        p[3 * i + 2] = c.lane[i];
+    }
+}
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    const u8v v[4] = {a, b, c, d};
+    for (int i = 0; i < bytes; i++) {
+        const int granule = i / 4;
+        const int from = granule % blocks * 16 + granule / blocks * 4 + i % 4;
+        for (int k = 0; k < 4; k++) p[4 * i + k] = v[k].lane[from];
+    }
+}
+
+}  // namespace simgp::SIMD_LANES_NAMESPACE
+
+#endif
