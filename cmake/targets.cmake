@@ -17,6 +17,10 @@ endif()
 set(sse41_flags -msse4.1)
 set(avx2_flags -mavx2)
 set(avx512_flags -mavx512f -mavx512bw -mavx512dq -mavx512vl -mavx512vbmi -mprefer-vector-width=512)
+# False warnings from the intrinsics header of GCC 12 and older.
+if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
+  list(APPEND avx512_flags -Wno-uninitialized -Wno-maybe-uninitialized)
+endif()
 message(STATUS "simgp: vector rows for: ${SIMGP_TARGETS}")
 
 # Areas, from the list that the code has.

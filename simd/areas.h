@@ -1,5 +1,5 @@
-// The areas that have rows: each is a family of inner loops with scalar rows (<family>/<area>.cpp) and
-// vector rows (<family>/vector/<area>.h). The build reads this list too.
+// The areas that have rows: each is a family of inner loops with scalar rows (<family>/<area>.cpp)
+// and vector rows (<family>/vector/<area>.h). The build reads this list too.
 #ifndef SIMD_AREAS_H
 #define SIMD_AREAS_H
 

@@ -1,4 +1,5 @@
-// The vector layer over AVX2: two blocks of 16 bytes. The meaning of each operation stands in lanes.h.
+// The vector layer over AVX2: two blocks of 16 bytes. The meaning of each operation stands in
+// lanes.h.
 #ifndef SIMD_AVX2_H
 #define SIMD_AVX2_H
 
@@ -53,12 +54,17 @@ inline s16v pair_dot(u8v v) {
     constexpr int a = negative ? -A : A, b = negative ? -B : B;
     static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
     const __m256i centred = _mm256_xor_si256(v, _mm256_set1_epi8(-128));
-    const __m256i dot = _mm256_maddubs_epi16(_mm256_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
+    const __m256i dot =
+        _mm256_maddubs_epi16(_mm256_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
     const __m256i c = _mm256_set1_epi16(static_cast<int16_t>(C));
     return negative ? _mm256_sub_epi16(c, dot) : _mm256_add_epi16(dot, c);
 }
 inline s16v low_minus_128_shl8(u8v v) {
     return _mm256_slli_epi16(_mm256_xor_si256(v, _mm256_set1_epi8(-128)), 8);
+}
+inline s16v high_minus_128_shl8(u8v v) {
+    return _mm256_xor_si256(_mm256_and_si256(v, _mm256_set1_epi16(static_cast<int16_t>(0xFF00))),
+                            _mm256_set1_epi16(-32768));
 }
 
 inline u16v even(u8v v) { return _mm256_and_si256(v, _mm256_set1_epi16(255)); }
@@ -99,14 +105,18 @@ inline pair_u8 load_split(const uint8_t *p) {
     return {_mm256_packus_epi16(even(a), even(b)), _mm256_packus_epi16(odd(a), odd(b))};
 }
 
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
+    store(p, _mm256_unpacklo_epi8(even, odd));
+    store(p + bytes, _mm256_unpackhi_epi8(even, odd));
+}
 inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
     store(p, _mm256_unpacklo_epi16(even, odd));
     store(p + bytes, _mm256_unpackhi_epi16(even, odd));
 }
 
-// Each vector is shuffled once, so that its bytes stand where any of the three outputs wants them, and
-// each output blended from the three. A byte i of a block goes to place 3i + k of the 48 output bytes,
-// k = 0, 1, 2 for a, b, c; place modulo 16 differs for all 16 bytes of a block.
+// Each vector is shuffled once, so that its bytes stand where any of the three outputs wants them,
+// and each output blended from the three. A byte i of a block goes to place 3i + k of the 48 output
+// bytes, k = 0, 1, 2 for a, b, c; place modulo 16 differs for all 16 bytes of a block.
 inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     const auto twice = [](__m128i v) { return _mm256_broadcastsi128_si256(v); };
     a = _mm256_shuffle_epi8(

@@ -1,11 +1,12 @@
-// The vector layer over plain lanes: the meaning of every operation, one line each. The other headers of
-// this folder offer the same vocabulary over an instruction set and are tested against this one.
+// The vector layer over plain lanes: the meaning of every operation, one line each. The other
+// headers of this folder offer the same vocabulary over an instruction set and are tested against
+// this one.
 //
-// A vector has `bytes` bytes. Operations work on all lanes alike, except those that move bytes within
-// blocks of 16 bytes, the unit that wide x86 registers are made of; blocks = bytes / 16.
+// A vector has `bytes` bytes. Operations work on all lanes alike, except those that move bytes
+// within blocks of 16 bytes, the unit that wide x86 registers are made of; blocks = bytes / 16.
 //
-// Order of pixels. What lies in blocks comes out of in-block shuffles in pieces. Kernels therefore bring
-// their input into an order in which the stores at the end find whole vectors:
+// Order of pixels. What lies in blocks comes out of in-block shuffles in pieces. Kernels therefore
+// bring their input into an order in which the stores at the end find whole vectors:
 //   natural   byte i is pixel i
 //   by8       block j holds granules j and blocks + j, each of 8 bytes
 //   by4       block j holds granules j, blocks + j, 2 blocks + j, 3 blocks + j, each of 4 bytes
@@ -109,8 +110,8 @@ inline s16v add_sat(s16v a, s16v b) {
     return make<s16v>([&](int i) { return clamp_to(-32768, 32767, a.lane[i] + b.lane[i]); });
 }
 
-// A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the same
-// sign and at most 255 in size, and the sum of the two products fits 16 bits.
+// A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the
+// same sign and at most 255 in size, and the sum of the two products fits 16 bits.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
     return make<s16v>([&](int i) {
@@ -120,6 +121,11 @@ inline s16v pair_dot(u8v v) {
 // 256 (low byte - 128) of each byte pair.
 inline s16v low_minus_128_shl8(u8v v) {
     return make<s16v>([&](int i) { return 256 * (v.lane[2 * i] - 128); });
+}
+
+// The same of the high byte.
+inline s16v high_minus_128_shl8(u8v v) {
+    return make<s16v>([&](int i) { return 256 * (v.lane[2 * i + 1] - 128); });
 }
 
 // Byte pairs: lane i of even and odd is byte 2i and 2i + 1.
@@ -177,15 +183,19 @@ inline pair_u8 load_split(const uint8_t *p) {
             natural_to_by8(make<u8v>([&](int i) { return p[2 * i + 1]; }))};
 }
 
-// Stores of 2 bytes, 3 bytes and 4 bytes bytes: even and odd words of pixels in by8 order, alternating;
-// the bytes of three vectors in natural order, in turn; the bytes of four vectors in by4 order, in turn.
-inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
-    u8v lo = by8_to_natural(join(bit_and(even, set_u16(255)), bit_and(odd, set_u16(255))));
-    u8v hi = by8_to_natural(join(shr<8>(even), shr<8>(odd)));
+// Stores of 2, 3 and 4 vectors: the bytes of two vectors in by8 order, in turn; the words of the
+// even and the odd pixels in by8 order, in turn; the bytes of three vectors in natural order, in
+// turn; the bytes of four vectors in by4 order, in turn.
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
+    const u8v a = by8_to_natural(even), b = by8_to_natural(odd);
     for (int i = 0; i < bytes; i++) {
-        p[2 * i] = lo.lane[i];
-        p[2 * i + 1] = hi.lane[i];
+        p[2 * i] = a.lane[i];
+        p[2 * i + 1] = b.lane[i];
     }
+}
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+    store_zip8(p, join(bit_and(even, set_u16(255)), bit_and(odd, set_u16(255))),
+               join(shr<8>(even), shr<8>(odd)));
 }
 inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     for (int i = 0; i < bytes; i++) {

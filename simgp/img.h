@@ -1,4 +1,5 @@
-/* The image descriptor, pixel formats, rotation codes, result codes, and the types of the kernels. */
+/* The image descriptor, pixel formats, rotation codes, result codes, and the types of the kernels.
+ */
 #ifndef SIMGP_IMG_H
 #define SIMGP_IMG_H
 
@@ -12,68 +13,68 @@ SIMGP_BEGIN_DECLS
 /* Pixel formats -------------------------------------------------------------------------------
  *
  * The drawings show bytes in memory order, lowest address first, so they hold on every machine.
- * Y0 Y1 are the first two pixels of a line; a 16-bit word stands with its low byte first, as it lies
- * in memory. "W/2" and "H/2" of chroma planes are rounded up: a 5 x 3 picture in 4:2:0 has chroma
- * planes of 3 x 2 samples.
+ * Y0 Y1 are the first two pixels of a line; a 16-bit word stands with its low byte first, as it
+ * lies in memory. "W/2" and "H/2" of chroma planes are rounded up: a 5 x 3 picture in 4:2:0 has
+ * chroma planes of 3 x 2 samples.
  */
 enum {
     /* One plane of luma; no chroma.
-     *   plane 0: Y0 Y1 Y2 Y3 ...                                     W x H                        */
+     *   plane 0: Y0 Y1 Y2 Y3 ...                                     W x H */
     SIMGP_FMT_YUV400 = 0,
 
     /* Planar 4:2:0 ("I420"): one U and one V sample for each 2 x 2 block of pixels.
      *   plane 0: Y0 Y1 Y2 Y3 ...                                     W x H
      *   plane 1: U0 U1 ...                                           W/2 x H/2
-     *   plane 2: V0 V1 ...                                           W/2 x H/2                    */
+     *   plane 2: V0 V1 ...                                           W/2 x H/2 */
     SIMGP_FMT_YUV420 = 1,
 
     /* Planar 4:2:2 ("I422"): chroma of half width and full height ("narrow").
-     *   plane 0: Y,  W x H      plane 1: U, W/2 x H      plane 2: V, W/2 x H                      */
+     *   plane 0: Y,  W x H      plane 1: U, W/2 x H      plane 2: V, W/2 x H */
     SIMGP_FMT_YUV422N = 2,
 
     /* Planar 4:4:4: one U and one V sample for each pixel.
-     *   plane 0: Y,  W x H      plane 1: U, W x H        plane 2: V, W x H                        */
+     *   plane 0: Y,  W x H      plane 1: U, W x H        plane 2: V, W x H */
     SIMGP_FMT_YUV444 = 3,
 
     /* Planar 4:2:0 with V before U.
-     *   plane 0: Y,  W x H      plane 1: V, W/2 x H/2    plane 2: U, W/2 x H/2                    */
+     *   plane 0: Y,  W x H      plane 1: V, W/2 x H/2    plane 2: U, W/2 x H/2 */
     SIMGP_FMT_YV12 = 4,
 
     /* Planar 4:2:2 with V before U; chroma of half width and full height.
-     *   plane 0: Y,  W x H      plane 1: V, W/2 x H      plane 2: U, W/2 x H                      */
+     *   plane 0: Y,  W x H      plane 1: V, W/2 x H      plane 2: U, W/2 x H */
     SIMGP_FMT_YV16 = 5,
 
     /* Semi-planar 4:2:0, U first.
      *   plane 0: Y0 Y1 Y2 Y3 ...                                     W x H
-     *   plane 1: U0 V0 U1 V1 ...                                     W/2 pairs x H/2 lines        */
+     *   plane 1: U0 V0 U1 V1 ...                                     W/2 pairs x H/2 lines */
     SIMGP_FMT_NV12 = 6,
 
     /* Semi-planar 4:2:0, V first (what many cameras deliver).
      *   plane 0: Y0 Y1 Y2 Y3 ...                                     W x H
-     *   plane 1: V0 U0 V1 U1 ...                                     W/2 pairs x H/2 lines        */
+     *   plane 1: V0 U0 V1 U1 ...                                     W/2 pairs x H/2 lines */
     SIMGP_FMT_NV21 = 7,
 
     /* Planar, chroma of full width and half height ("wide").
-     *   plane 0: Y,  W x H      plane 1: U, W x H/2      plane 2: V, W x H/2                      */
+     *   plane 0: Y,  W x H      plane 1: U, W x H/2      plane 2: V, W x H/2 */
     SIMGP_FMT_YUV422W = 8,
 
-    /* NV12 cut into tiles of 64 bytes x 32 rows, as hardware video decoders write it; the strides of
-     * a tiled picture are not used.
-     *   plane 0: tiles of Y                      plane 1: tiles of U0 V0 U1 V1 ...                */
+    /* NV12 cut into tiles of 64 bytes x 32 rows, as hardware video decoders write it; the strides
+     * of a tiled picture are not used. plane 0: tiles of Y                      plane 1: tiles of
+     * U0 V0 U1 V1 ...                */
     SIMGP_FMT_T64X32 = 11,
 
     /* Packed 4:2:2: two pixels in four bytes.
-     *   plane 0: U0 Y0 V0 Y1   U1 Y2 V1 Y3 ...                       2 W bytes x H                */
+     *   plane 0: U0 Y0 V0 Y1   U1 Y2 V1 Y3 ...                       2 W bytes x H */
     SIMGP_FMT_UYVY = 100,
-    /*   plane 0: Y0 U0 Y1 V0   Y2 U1 Y3 V1 ...                       2 W bytes x H                */
+    /*   plane 0: Y0 U0 Y1 V0   Y2 U1 Y3 V1 ...                       2 W bytes x H */
     SIMGP_FMT_YUYV = 101,
 
     /* 16-bit RGB, one little-endian word a pixel.
      *   byte 0:  G2 G1 G0 B4 B3 B2 B1 B0   (bit 7 ... bit 0)
-     *   byte 1:  R4 R3 R2 R1 R0 G5 G4 G3                                                          */
+     *   byte 1:  R4 R3 R2 R1 R0 G5 G4 G3 */
     SIMGP_FMT_RGB565 = 200,
     /*   byte 0:  G2 G1 G0 R4 R3 R2 R1 R0
-     *   byte 1:  B4 B3 B2 B1 B0 G5 G4 G3                                                          */
+     *   byte 1:  B4 B3 B2 B1 B0 G5 G4 G3 */
     SIMGP_FMT_BGR565 = 201,
 
     /* 24-bit RGB, three bytes a pixel. */
@@ -99,16 +100,16 @@ enum {
 /* Results of the functions that take descriptors. Every failure is found before a pixel is touched:
  * a call that does not return SIMGP_OK has written nothing. */
 enum {
-    SIMGP_OK = 0,               /* the operation ran */
-    SIMGP_ERR_PARAM = -1,       /* the two formats break the operation's rule, or a bad argument */
-    SIMGP_ERR_UNSUPPORTED = -3  /* the format, or the pair of formats, has no implementation */
+    SIMGP_OK = 0,              /* the operation ran */
+    SIMGP_ERR_PARAM = -1,      /* the two formats break the operation's rule, or a bad argument */
+    SIMGP_ERR_UNSUPPORTED = -3 /* the format, or the pair of formats, has no implementation */
 };
 
 /* The image descriptor --------------------------------------------------------------------------
  *
- * The caller fills it and owns it, and every buffer it points to; the library reads it, never writes
- * it, and keeps no pointer to it. Index k of each array is the plane number; entries beyond the
- * format's planes are ignored and may hold anything.
+ * The caller fills it and owns it, and every buffer it points to; the library reads it, never
+ * writes it, and keeps no pointer to it. Index k of each array is the plane number; entries beyond
+ * the format's planes are ignored and may hold anything.
  *
  * Conversions take the picture's size from the source alone: of the destination they read stride[],
  * plane[] and format, never width[] and height[].
@@ -122,7 +123,8 @@ enum {
  *   SIMGP_FMT_RGBA8888   640            480            2560           pixels
  *
  * Strides are not checked. They may be negative where plane[k] then points to the line that is
- * processed first (a bottom-up picture). Validate sizes that come from a stream before you get here.
+ * processed first (a bottom-up picture). Validate sizes that come from a stream before you get
+ * here.
  */
 typedef struct simgp_img {
     int32_t width[4];      /* samples in a line of plane k (pairs, for interleaved chroma) */
@@ -148,16 +150,16 @@ SIMGP_STATIC_ASSERT(sizeof(simgp_img) == 120, "simgp_img changed its size");
 
 /* Types of the kernels ---------------------------------------------------------------------------
  *
- * Below the descriptor functions stand the kernels that do the work. They may be called directly; they
- * return nothing, check nothing, and trust what they are given.
+ * Below the descriptor functions stand the kernels that do the work. They may be called directly;
+ * they return nothing, check nothing, and trust what they are given.
  */
 
 /* A conversion of a whole picture. The arrays are those of two descriptors:
- *   src_planes, src_widths, src_heights, src_strides   plane[], width[], height[], stride[] of the source
- *   dst_strides, dst_planes                            stride[], plane[] of the destination
+ *   src_planes, src_widths, src_heights, src_strides   plane[], width[], height[], stride[] of the
+ * source dst_strides, dst_planes                            stride[], plane[] of the destination
  * Only the entries of planes that the formats have are read. The picture is src_widths[0] x
- * src_heights[0] pixels; a width or height of 0 or less writes nothing. Source and destination must not
- * share memory unless the function says so. */
+ * src_heights[0] pixels; a width or height of 0 or less writes nothing. Source and destination must
+ * not share memory unless the function says so. */
 typedef void simgp_csc_fn(uint8_t *const *src_planes, const int32_t *src_widths,
                           const int32_t *src_heights, const int32_t *src_strides,
                           const int32_t *dst_strides, uint8_t *const *dst_planes);

@@ -6,15 +6,15 @@
 
 SIMGP_BEGIN_DECLS
 
-/* All kernels here but two (grey, and NV21 to RGB565) compute ITU-R BT.601, limited range, with 8 fractional bits. With
- * Yc = 298 (Y - 16), Uc = U - 128, Vc = V - 128:
+/* All kernels here but two (grey, and NV21 to RGB565) compute ITU-R BT.601, limited range, with 8
+ * fractional bits. With Yc = 298 (Y - 16), Uc = U - 128, Vc = V - 128:
  *
  *   R = clamp((Yc + 409 Vc + 128) >> 8)
  *   G = clamp((Yc - 100 Uc - 208 Vc + 128) >> 8)
  *   B = clamp((Yc + 516 Uc + 128) >> 8)
  *
- * where >> rounds toward minus infinity and clamp limits to 0 ... 255. 16-bit outputs drop the low bits
- * of each channel; 32-bit outputs get alpha 255. Y = 81, U = 90, V = 240 becomes pure red.
+ * where >> rounds toward minus infinity and clamp limits to 0 ... 255. 16-bit outputs drop the low
+ * bits of each channel; 32-bit outputs get alpha 255. Y = 81, U = 90, V = 240 becomes pure red.
  *
  * Chroma is repeated, never interpolated: pixel (x, y) takes sample
  *   YUV420, YV12, NV12, NV21   (x / 2, y / 2)
@@ -23,23 +23,23 @@ SIMGP_BEGIN_DECLS
  *   YUV444                     (x, y)
  *
  * Planes
- *   source        as drawn at the format's code (img.h); src_planes[k] with src_strides[k]. Of the widths
- *                 and heights only entry 0 is read: the picture is W x H pixels.
- *   destination   dst_planes[0], H lines of W pixels, dst_strides[0] bytes apart.
- * Any W and H work; of 0 or less nothing is written. An odd W uses chroma sample W / 2 for its last
- * column, an odd H chroma line H / 2 for its last row (but see below). Read are the W x H luma samples
- * and the chroma samples that belong to them, written are the W x H pixels: nothing beyond column W - 1,
- * no padding. No pointer or stride needs to be aligned; strides may be negative. Source and destination
- * must not share memory, except that simgp_csc_yuv400_to_rgb565 also works where the luma of a line lies
- * in the same line of the output, at its end or behind it (line y: luma at dst line y + W or above).
- * Pure functions: any number of calls may run at once on separate destinations. */
+ *   source        as drawn at the format's code (img.h); src_planes[k] with src_strides[k]. Of the
+ * widths and heights only entry 0 is read: the picture is W x H pixels. destination dst_planes[0],
+ * H lines of W pixels, dst_strides[0] bytes apart. Any W and H work; of 0 or less nothing is
+ * written. An odd W uses chroma sample W / 2 for its last column, an odd H chroma line H / 2 for
+ * its last row (but see below). Read are the W x H luma samples and the chroma samples that belong
+ * to them, written are the W x H pixels: nothing beyond column W - 1, no padding. No pointer or
+ * stride needs to be aligned; strides may be negative. Source and destination must not share
+ * memory, except that simgp_csc_yuv400_to_rgb565 also works where the luma of a line lies in the
+ * same line of the output, at its end or behind it (line y: luma at dst line y + W or above). Pure
+ * functions: any number of calls may run at once on separate destinations. */
 
 /* Grey: no matrix, R = G = B = Y. */
 SIMGP_API simgp_csc_fn simgp_csc_yuv400_to_rgb565;
 
 /* Where W is not a multiple of 4 and H is odd, the four kernels to RGB565, RGBA8888, BGRA8888 and
- * ARGB8888 give the first chroma line to row 0 alone, and every later one to two rows: row y takes line
- * (y + 1) / 2. */
+ * ARGB8888 give the first chroma line to row 0 alone, and every later one to two rows: row y takes
+ * line (y + 1) / 2. */
 SIMGP_API simgp_csc_fn simgp_csc_yuv420_to_rgb565;
 SIMGP_API simgp_csc_fn simgp_csc_yuv420_to_bgr565;
 SIMGP_API simgp_csc_fn simgp_csc_yuv420_to_rgb888;

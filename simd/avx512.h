@@ -1,0 +1,161 @@
+// The vector layer over AVX-512 (F, BW, DQ, VL, VBMI): four blocks of 16 bytes. The meaning of each
+// operation stands in lanes.h.
+#ifndef SIMD_AVX512_H
+#define SIMD_AVX512_H
+
+#include <immintrin.h>
+#include <stddef.h>
+#include <stdint.h>
+
+namespace simgp::avx512 {
+
+inline constexpr int bytes = 64;
+inline constexpr int blocks = 4;
+
+// One register type stands for all lanes.
+using u8v = __m512i;
+using u16v = __m512i;
+using s16v = __m512i;
+
+inline u8v as_u8(u16v v) { return v; }
+inline u16v as_u16(u8v v) { return v; }
+inline s16v as_s16(u16v v) { return v; }
+
+inline u8v load(const uint8_t *p) {
+    return _mm512_loadu_si512(reinterpret_cast<const __m512i *>(p));
+}
+inline void store(uint8_t *p, u8v v) { _mm512_storeu_si512(reinterpret_cast<__m512i *>(p), v); }
+inline u16v load_widen(const uint8_t *p) {
+    return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i *>(p)));
+}
+
+inline u8v set_u8(uint8_t x) { return _mm512_set1_epi8(static_cast<char>(x)); }
+inline u16v set_u16(uint16_t x) { return _mm512_set1_epi16(static_cast<int16_t>(x)); }
+
+inline u8v bit_and(u8v a, u8v b) { return _mm512_and_si512(a, b); }
+inline u8v bit_or(u8v a, u8v b) { return _mm512_or_si512(a, b); }
+template <int N>
+inline u16v shl(u16v a) {
+    return _mm512_slli_epi16(a, N);
+}
+template <int N>
+inline u16v shr(u16v a) {
+    return _mm512_srli_epi16(a, N);
+}
+
+inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
+inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }
+
+// The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
+template <int A, int B, int C>
+inline s16v pair_dot(u8v v) {
+    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    constexpr bool negative = A < 0 || B < 0;
+    constexpr int a = negative ? -A : A, b = negative ? -B : B;
+    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
+    const __m512i centred = _mm512_xor_si512(v, _mm512_set1_epi8(-128));
+    const __m512i dot =
+        _mm512_maddubs_epi16(_mm512_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
+    const __m512i c = _mm512_set1_epi16(static_cast<int16_t>(C));
+    return negative ? _mm512_sub_epi16(c, dot) : _mm512_add_epi16(dot, c);
+}
+inline s16v low_minus_128_shl8(u8v v) {
+    return _mm512_slli_epi16(_mm512_xor_si512(v, _mm512_set1_epi8(-128)), 8);
+}
+inline s16v high_minus_128_shl8(u8v v) {
+    return _mm512_xor_si512(_mm512_and_si512(v, _mm512_set1_epi16(static_cast<int16_t>(0xFF00))),
+                            _mm512_set1_epi16(-32768));
+}
+
+inline u16v even(u8v v) { return _mm512_and_si512(v, _mm512_set1_epi16(255)); }
+inline u16v odd(u8v v) { return _mm512_srli_epi16(v, 8); }
+inline u8v join(u16v even, u16v odd) { return _mm512_or_si512(even, _mm512_slli_epi16(odd, 8)); }
+template <int N>
+inline u8v narrow_join(s16v even, s16v odd) {
+    const __m512i halves =
+        _mm512_packus_epi16(_mm512_srai_epi16(even, N), _mm512_srai_epi16(odd, N));
+    return _mm512_shuffle_epi8(halves, _mm512_broadcast_i32x4(_mm_setr_epi8(
+                                           0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15)));
+}
+
+inline u16v pack565(s16v hi, s16v mid, s16v lo) {
+    constexpr int select = 0xCA;  // first ? second : third, bit by bit
+    const __m512i zero = _mm512_setzero_si512();
+    hi = _mm512_max_epi16(hi, zero);
+    mid = _mm512_srli_epi16(_mm512_max_epi16(mid, zero), 4);
+    lo = _mm512_srli_epi16(_mm512_max_epi16(lo, zero), 10);
+    const __m512i upper = _mm512_ternarylogic_epi32(_mm512_set1_epi16(static_cast<int16_t>(0xF800)),
+                                                    _mm512_add_epi16(hi, hi), mid, select);
+    return _mm512_ternarylogic_epi32(_mm512_set1_epi16(static_cast<int16_t>(0xFFE0)), upper, lo,
+                                     select);
+}
+
+inline u8v natural_to_by8(u8v v) {
+    return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7), v);
+}
+inline u8v natural_to_by4(u8v v) {
+    return _mm512_permutexvar_epi32(
+        _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15), v);
+}
+inline u8v by8_to_natural(u8v v) {
+    return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), v);
+}
+inline u8v by8_to_by4(u8v v) {
+    return _mm512_permutexvar_epi32(
+        _mm512_setr_epi32(0, 8, 2, 10, 1, 9, 3, 11, 4, 12, 6, 14, 5, 13, 7, 15), v);
+}
+
+struct pair_u8 {
+    u8v even, odd;
+};
+inline pair_u8 load_split(const uint8_t *p) {
+    const __m512i a = load(p), b = load(p + bytes);
+    return {_mm512_packus_epi16(even(a), even(b)), _mm512_packus_epi16(odd(a), odd(b))};
+}
+
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
+    store(p, _mm512_unpacklo_epi8(even, odd));
+    store(p + bytes, _mm512_unpackhi_epi8(even, odd));
+}
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+    store(p, _mm512_unpacklo_epi16(even, odd));
+    store(p + bytes, _mm512_unpackhi_epi16(even, odd));
+}
+
+// Byte q of the 192 is byte q / 3 of a, b or c, as q modulo 3 is 0, 1 or 2: one index vector for
+// each output serves all three inputs.
+struct zip3_index {
+    alignas(64) uint8_t lane[3 * 64];
+    constexpr zip3_index() : lane() {
+        for (int q = 0; q < 3 * 64; q++) lane[q] = static_cast<uint8_t>(q / 3);
+    }
+};
+inline constexpr zip3_index zip3;
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+    constexpr __mmask64 every_third = 0x9249249249249249;  // bits 0, 3, ... 63
+    constexpr __mmask64 second[3] = {every_third << 1, every_third, every_third >> 1};
+    constexpr __mmask64 third[3] = {every_third << 2, every_third << 1, every_third};
+    const auto part = [&](int k) {
+        const __m512i index = load(zip3.lane + 64 * k);
+        __m512i v = _mm512_permutexvar_epi8(index, a);
+        v = _mm512_mask_permutexvar_epi8(v, second[k], index, b);
+        v = _mm512_mask_permutexvar_epi8(v, third[k], index, c);
+        store(p + bytes * k, v);
+    };
+    part(0);
+    part(1);
+    part(2);
+}
+
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    const __m512i ab_lo = _mm512_unpacklo_epi8(a, b), ab_hi = _mm512_unpackhi_epi8(a, b);
+    const __m512i cd_lo = _mm512_unpacklo_epi8(c, d), cd_hi = _mm512_unpackhi_epi8(c, d);
+    store(p, _mm512_unpacklo_epi16(ab_lo, cd_lo));
+    store(p + bytes, _mm512_unpackhi_epi16(ab_lo, cd_lo));
+    store(p + 2 * bytes, _mm512_unpacklo_epi16(ab_hi, cd_hi));
+    store(p + 3 * bytes, _mm512_unpackhi_epi16(ab_hi, cd_hi));
+}
+
+}  // namespace simgp::avx512
+
+#endif

@@ -1,0 +1,153 @@
+// The choice of the instruction set, made once and nowhere else.
+#include "simd/choose.h"
+
+#include <pthread.h>
+
+#include <atomic>
+
+#include "simd/areas.h"
+
+#if defined(__x86_64__) || defined(__i386__)
+#include <cpuid.h>
+#elif defined(__arm__)
+#include <sys/auxv.h>
+#endif
+
+namespace simgp {
+
+// clang-format off
+#define DECLARE(family, area) void fill_##area(rows &);
+namespace scalar { SIMGP_AREAS(DECLARE) }
+namespace neon   { SIMGP_AREAS(DECLARE) }
+namespace sse41  { SIMGP_AREAS(DECLARE) }
+namespace avx2   { SIMGP_AREAS(DECLARE) }
+namespace avx512 { SIMGP_AREAS(DECLARE) }
+#undef DECLARE
+// clang-format on
+
+namespace {
+
+struct cpu {
+    bool neon = false, sse41 = false, avx2 = false, avx512 = false;
+};
+
+#if defined(__x86_64__) || defined(__i386__)
+
+// The register states that the operating system saves (XCR0). Written as bytes, since the
+// instruction has a compiler intrinsic only where newer instructions are switched on.
+uint32_t saved_states() {
+    uint32_t low, high;
+    __asm__ volatile(".byte 0x0f, 0x01, 0xd0" : "=a"(low), "=d"(high) : "c"(0));
+    return low;
+}
+
+cpu detect() {
+    cpu has;
+    uint32_t a, b, c, d;
+    if (!__get_cpuid(1, &a, &b, &c, &d)) return has;
+    has.sse41 = c & bit_SSE4_1;
+    const uint32_t saved = c & bit_OSXSAVE ? saved_states() : 0;
+    const bool saves_ymm = (saved & 0x06) == 0x06;  // SSE and AVX state
+    const bool saves_zmm = (saved & 0xE6) == 0xE6;  // and opmask, upper halves, upper registers
+    if (!__get_cpuid_count(7, 0, &a, &b, &c, &d)) return has;
+    has.avx2 = saves_ymm && (b & bit_AVX2);
+    // The byte permutes (VBMI) came with the second generation, which no longer slows down for wide
+    // integer code: the first generation is better served by AVX2.
+    const uint32_t needed = bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL;
+    has.avx512 = saves_zmm && (b & needed) == needed && (c & bit_AVX512VBMI);
+    return has;
+}
+
+#elif defined(__arm__)
+
+cpu detect() {
+    cpu has;
+    has.neon = getauxval(AT_HWCAP) & (1u << 12);  // HWCAP_NEON
+    return has;
+}
+
+#elif defined(__aarch64__)
+
+cpu detect() { return {.neon = true}; }
+
+#else
+
+cpu detect() { return {}; }
+
+#endif
+
+rows tables[size_t(target::count)];
+bool available[size_t(target::count)];
+target best = target::scalar;
+pthread_once_t once = PTHREAD_ONCE_INIT;
+std::atomic<const rows *> live;
+
+void offer(target t, void (*const *fills)(rows &), size_t count) {
+    rows &table = tables[size_t(t)] = tables[size_t(target::scalar)];
+    for (size_t i = 0; i < count; i++) fills[i](table);
+    available[size_t(t)] = true;
+    best = t;
+}
+
+#define FILL(family, area) fill_##area,
+#define OFFER(name)                                                 \
+    {                                                               \
+        using namespace name;                                       \
+        void (*const fills[])(rows &) = {SIMGP_AREAS(FILL)};        \
+        offer(target::name, fills, sizeof fills / sizeof fills[0]); \
+    }
+
+void fill_tables() {
+    [[maybe_unused]] const cpu has = detect();
+    OFFER(scalar)
+#ifdef SIMGP_HAVE_neon
+    if (has.neon) OFFER(neon)
+#endif
+#ifdef SIMGP_HAVE_sse41
+    if (has.sse41) OFFER(sse41)
+#endif
+#ifdef SIMGP_HAVE_avx2
+    if (has.avx2) OFFER(avx2)
+#endif
+#ifdef SIMGP_HAVE_avx512
+    if (has.avx512) OFFER(avx512)
+#endif
+    live.store(&tables[size_t(best)], std::memory_order_release);
+}
+
+void ensure_tables() { pthread_once(&once, fill_tables); }
+
+}  // namespace
+
+const char *target_name(target t) {
+    constexpr const char *names[] = {"scalar", "neon", "sse41", "avx2", "avx512"};
+    return names[size_t(t)];
+}
+
+bool target_available(target t) {
+    ensure_tables();
+    return available[size_t(t)];
+}
+
+const rows &rows_of(target t) {
+    ensure_tables();
+    return tables[size_t(t)];
+}
+
+const rows &live_rows() {
+    const rows *table = live.load(std::memory_order_acquire);
+    if (!table) {
+        ensure_tables();
+        table = live.load(std::memory_order_acquire);
+    }
+    return *table;
+}
+
+target live_target() { return target(&live_rows() - tables); }
+
+void force_rows(const rows *table) {
+    ensure_tables();
+    live.store(table ? table : &tables[size_t(best)], std::memory_order_release);
+}
+
+}  // namespace simgp

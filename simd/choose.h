@@ -1,0 +1,33 @@
+// Which instruction set the library uses.
+#ifndef SIMD_CHOOSE_H
+#define SIMD_CHOOSE_H
+
+#include "simgp/rows.h"
+
+namespace simgp {
+
+// The instruction sets, from the least to the most wanted.
+enum class target : uint8_t { scalar, neon, sse41, avx2, avx512, count };
+
+const char *target_name(target t);
+
+// Compiled into this build, and offered by the processor and the operating system.
+bool target_available(target t);
+
+// The rows of one target; t must be available.
+const rows &rows_of(target t);
+
+// The rows in use: those of the most wanted target that is available, unless a test or a benchmark
+// has forced others. The choice is made at the first call, on whatever thread that is.
+const rows &live_rows();
+
+// The target in use.
+target live_target();
+
+// For tests and benchmarks: makes `table` the rows in use from now on, for all threads; null goes
+// back to the library's own choice.
+void force_rows(const rows *table);
+
+}  // namespace simgp
+
+#endif

@@ -1,0 +1,104 @@
+// The vector layer over NEON, on 32-bit and 64-bit ARM: one block of 16 bytes. The meaning of each
+// operation stands in lanes.h.
+#ifndef SIMD_NEON_H
+#define SIMD_NEON_H
+
+#include <arm_neon.h>
+#include <stddef.h>
+#include <stdint.h>
+
+namespace simgp::neon {
+
+inline constexpr int bytes = 16;
+inline constexpr int blocks = 1;
+
+using u8v = uint8x16_t;
+using u16v = uint16x8_t;
+using s16v = int16x8_t;
+
+inline u8v as_u8(u16v v) { return vreinterpretq_u8_u16(v); }
+inline u16v as_u16(u8v v) { return vreinterpretq_u16_u8(v); }
+inline u16v as_u16(s16v v) { return vreinterpretq_u16_s16(v); }
+inline s16v as_s16(u16v v) { return vreinterpretq_s16_u16(v); }
+
+inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
+inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
+inline u16v load_widen(const uint8_t *p) { return vmovl_u8(vld1_u8(p)); }
+
+inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
+inline u16v set_u16(uint16_t x) { return vdupq_n_u16(x); }
+
+inline u8v bit_and(u8v a, u8v b) { return vandq_u8(a, b); }
+inline u8v bit_or(u8v a, u8v b) { return vorrq_u8(a, b); }
+inline u16v bit_and(u16v a, u16v b) { return vandq_u16(a, b); }
+inline u16v bit_or(u16v a, u16v b) { return vorrq_u16(a, b); }
+template <int N>
+inline u16v shl(u16v a) {
+    return vshlq_n_u16(a, N);
+}
+template <int N>
+inline u16v shr(u16v a) {
+    return vshrq_n_u16(a, N);
+}
+
+inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
+inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }
+
+inline u16v even(u8v v) { return vandq_u16(as_u16(v), vdupq_n_u16(255)); }
+inline u16v odd(u8v v) { return vshrq_n_u16(as_u16(v), 8); }
+inline u8v join(u16v even, u16v odd) { return as_u8(vsliq_n_u16(even, odd, 8)); }
+
+// The offsets of 128 go into the constant, and the products are accumulated on it.
+template <int A, int B, int C>
+inline s16v pair_dot(u8v v) {
+    s16v sum = vdupq_n_s16(static_cast<int16_t>(C - 128 * (A + B)));
+    if constexpr (A != 0) sum = vmlaq_n_s16(sum, as_s16(even(v)), A);
+    if constexpr (B != 0) sum = vmlaq_n_s16(sum, as_s16(odd(v)), B);
+    return sum;
+}
+inline s16v low_minus_128_shl8(u8v v) {
+    return as_s16(veorq_u16(vshlq_n_u16(as_u16(v), 8), vdupq_n_u16(0x8000)));
+}
+inline s16v high_minus_128_shl8(u8v v) {
+    return as_s16(veorq_u16(vandq_u16(as_u16(v), vdupq_n_u16(0xFF00)), vdupq_n_u16(0x8000)));
+}
+
+template <int N>
+inline u8v narrow_join(s16v even, s16v odd) {
+    const uint8x8x2_t zip = vzip_u8(vqshrun_n_s16(even, N), vqshrun_n_s16(odd, N));
+    return vcombine_u8(zip.val[0], zip.val[1]);
+}
+
+inline u16v pack565(s16v hi, s16v mid, s16v lo) {
+    const u16v upper = vsriq_n_u16(vqshluq_n_s16(hi, 1), vqshluq_n_s16(mid, 1), 5);
+    return vsriq_n_u16(upper, vqshluq_n_s16(lo, 1), 11);
+}
+
+// With one block, all orders of pixels are the same.
+inline u8v natural_to_by8(u8v v) { return v; }
+inline u8v natural_to_by4(u8v v) { return v; }
+inline u8v by8_to_natural(u8v v) { return v; }
+inline u8v by8_to_by4(u8v v) { return v; }
+
+struct pair_u8 {
+    u8v even, odd;
+};
+inline pair_u8 load_split(const uint8_t *p) {
+    const uint8x16x2_t v = vld2q_u8(p);
+    return {v.val[0], v.val[1]};
+}
+
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) { vst2q_u8(p, uint8x16x2_t{{even, odd}}); }
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+    const uint16x8x2_t zip = vzipq_u16(even, odd);
+    vst1q_u8(p, as_u8(zip.val[0]));
+    vst1q_u8(p + bytes, as_u8(zip.val[1]));
+}
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) { vst3q_u8(p, uint8x16x3_t{{a, b, c}}); }
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    vst4q_u8(p, uint8x16x4_t{{a, b, c, d}});
+}
+
+}  // namespace simgp::neon
+
+#endif

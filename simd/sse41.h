@@ -1,0 +1,137 @@
+// The vector layer over SSE4.1: one block of 16 bytes. The meaning of each operation stands in
+// lanes.h.
+#ifndef SIMD_SSE41_H
+#define SIMD_SSE41_H
+
+#include <smmintrin.h>
+#include <stddef.h>
+#include <stdint.h>
+
+namespace simgp::sse41 {
+
+inline constexpr int bytes = 16;
+inline constexpr int blocks = 1;
+
+// One register type stands for all lanes.
+using u8v = __m128i;
+using u16v = __m128i;
+using s16v = __m128i;
+
+inline u8v as_u8(u16v v) { return v; }
+inline u16v as_u16(u8v v) { return v; }
+inline s16v as_s16(u16v v) { return v; }
+
+inline u8v load(const uint8_t *p) { return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p)); }
+inline void store(uint8_t *p, u8v v) { _mm_storeu_si128(reinterpret_cast<__m128i *>(p), v); }
+inline u16v load_widen(const uint8_t *p) {
+    return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const __m128i *>(p)));
+}
+
+inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
+inline u16v set_u16(uint16_t x) { return _mm_set1_epi16(static_cast<int16_t>(x)); }
+
+inline u8v bit_and(u8v a, u8v b) { return _mm_and_si128(a, b); }
+inline u8v bit_or(u8v a, u8v b) { return _mm_or_si128(a, b); }
+template <int N>
+inline u16v shl(u16v a) {
+    return _mm_slli_epi16(a, N);
+}
+template <int N>
+inline u16v shr(u16v a) {
+    return _mm_srli_epi16(a, N);
+}
+
+inline s16v add(s16v a, s16v b) { return _mm_add_epi16(a, b); }
+inline s16v add_sat(s16v a, s16v b) { return _mm_adds_epi16(a, b); }
+
+// The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
+template <int A, int B, int C>
+inline s16v pair_dot(u8v v) {
+    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    constexpr bool negative = A < 0 || B < 0;
+    constexpr int a = negative ? -A : A, b = negative ? -B : B;
+    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
+    const __m128i centred = _mm_xor_si128(v, _mm_set1_epi8(-128));
+    const __m128i dot =
+        _mm_maddubs_epi16(_mm_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
+    const __m128i c = _mm_set1_epi16(static_cast<int16_t>(C));
+    return negative ? _mm_sub_epi16(c, dot) : _mm_add_epi16(dot, c);
+}
+inline s16v low_minus_128_shl8(u8v v) {
+    return _mm_slli_epi16(_mm_xor_si128(v, _mm_set1_epi8(-128)), 8);
+}
+inline s16v high_minus_128_shl8(u8v v) {
+    return _mm_xor_si128(_mm_and_si128(v, _mm_set1_epi16(static_cast<int16_t>(0xFF00))),
+                         _mm_set1_epi16(-32768));
+}
+
+inline u16v even(u8v v) { return _mm_and_si128(v, _mm_set1_epi16(255)); }
+inline u16v odd(u8v v) { return _mm_srli_epi16(v, 8); }
+inline u8v join(u16v even, u16v odd) { return _mm_or_si128(even, _mm_slli_epi16(odd, 8)); }
+template <int N>
+inline u8v narrow_join(s16v even, s16v odd) {
+    const __m128i halves = _mm_packus_epi16(_mm_srai_epi16(even, N), _mm_srai_epi16(odd, N));
+    return _mm_shuffle_epi8(halves,
+                            _mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15));
+}
+
+inline u16v pack565(s16v hi, s16v mid, s16v lo) {
+    const __m128i zero = _mm_setzero_si128();
+    hi = _mm_and_si128(_mm_max_epi16(hi, zero), _mm_set1_epi16(0x7C00));
+    mid = _mm_and_si128(_mm_srli_epi16(_mm_max_epi16(mid, zero), 4), _mm_set1_epi16(0x07E0));
+    lo = _mm_srli_epi16(_mm_max_epi16(lo, zero), 10);
+    return _mm_or_si128(_mm_or_si128(_mm_add_epi16(hi, hi), mid), lo);
+}
+
+// With one block, all orders of pixels are the same.
+inline u8v natural_to_by8(u8v v) { return v; }
+inline u8v natural_to_by4(u8v v) { return v; }
+inline u8v by8_to_natural(u8v v) { return v; }
+inline u8v by8_to_by4(u8v v) { return v; }
+
+struct pair_u8 {
+    u8v even, odd;
+};
+inline pair_u8 load_split(const uint8_t *p) {
+    const __m128i a = load(p), b = load(p + bytes);
+    return {_mm_packus_epi16(even(a), even(b)), _mm_packus_epi16(odd(a), odd(b))};
+}
+
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
+    store(p, _mm_unpacklo_epi8(even, odd));
+    store(p + bytes, _mm_unpackhi_epi8(even, odd));
+}
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+    store(p, _mm_unpacklo_epi16(even, odd));
+    store(p + bytes, _mm_unpackhi_epi16(even, odd));
+}
+
+// Each vector is shuffled once, so that its bytes stand where any of the three outputs wants them,
+// and each output blended from the three. A byte i of a block goes to place 3i + k of the 48 output
+// bytes, k = 0, 1, 2 for a, b, c; place modulo 16 differs for all 16 bytes of a block.
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+    a = _mm_shuffle_epi8(a, _mm_setr_epi8(0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10, 5));
+    b = _mm_shuffle_epi8(b, _mm_setr_epi8(5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15, 10));
+    c = _mm_shuffle_epi8(c, _mm_setr_epi8(10, 5, 0, 11, 6, 1, 12, 7, 2, 13, 8, 3, 14, 9, 4, 15));
+    const __m128i m1 = _mm_setr_epi8(0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0);
+    const __m128i m2 = _mm_setr_epi8(0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0);
+    const auto blend = [&](__m128i x, __m128i y, __m128i z) {  // places 0, 1, 2 modulo 3
+        return _mm_blendv_epi8(_mm_blendv_epi8(x, y, m1), z, m2);
+    };
+    store(p, blend(a, b, c));
+    store(p + bytes, blend(b, c, a));
+    store(p + 2 * bytes, blend(c, a, b));
+}
+
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    const __m128i ab_lo = _mm_unpacklo_epi8(a, b), ab_hi = _mm_unpackhi_epi8(a, b);
+    const __m128i cd_lo = _mm_unpacklo_epi8(c, d), cd_hi = _mm_unpackhi_epi8(c, d);
+    store(p, _mm_unpacklo_epi16(ab_lo, cd_lo));
+    store(p + bytes, _mm_unpackhi_epi16(ab_lo, cd_lo));
+    store(p + 2 * bytes, _mm_unpacklo_epi16(ab_hi, cd_hi));
+    store(p + 3 * bytes, _mm_unpackhi_epi16(ab_hi, cd_hi));
+}
+
+}  // namespace simgp::sse41
+
+#endif

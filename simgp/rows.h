@@ -1,0 +1,67 @@
+// The table of rows: every inner loop of the library, with its signature written once.
+//
+// Scalar rows define the results; each instruction set has a table of its own in which its vector
+// rows have taken the place of the scalar ones. simd/choose.h tells which table is in use.
+#ifndef SIMGP_ROWS_H
+#define SIMGP_ROWS_H
+
+#include <stddef.h>
+#include <stdint.h>
+
+namespace simgp {
+
+// How the samples of one row of pixels lie in memory.
+enum class yuv_layout : uint8_t {
+    grey,  // y: a sample per pixel; no chroma
+    half,  // y; u, v: a sample for two pixels
+    full,  // y; u, v: a sample per pixel
+    uv,    // y; u: pairs U V, one for two pixels
+    vu,    // y; u: pairs V U, one for two pixels
+    uyvy,  // y: bytes U Y V Y for two pixels
+    yuyv,  // y: bytes Y U Y V for two pixels
+    count
+};
+
+// How a pixel is stored.
+enum class rgb_packing : uint8_t {
+    rgb565,
+    bgr565,
+    rgb888,
+    bgr888,
+    rgba8888,
+    bgra8888,
+    argb8888,
+    count
+};
+
+// Converts `width` >= 1 pixels of a row. Pointers that the layout does not use may be null. The row
+// reads the samples of its pixels and writes the pixels, nothing else. dst may overlap y as far as
+// the pixels up to and with x lie on samples up to and with x only.
+using yuv_to_rgb_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                            ptrdiff_t width);
+
+struct rows {
+    // yuv2rgb: null where the library has no such conversion.
+    yuv_to_rgb_row *yuv_to_rgb[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
+    yuv_to_rgb_row *vu_to_rgb565_coarse;  // with the coefficients of 6 fractional bits
+
+    yuv_to_rgb_row *&yuv_to_rgb_slot(yuv_layout layout, rgb_packing packing) {
+        return yuv_to_rgb[size_t(layout)][size_t(packing)];
+    }
+};
+
+}  // namespace simgp
+
+// The rows from YUV to RGB that the library has: X(layout, packing). Scalar and vector tables are
+// filled from this one list.
+// clang-format off
+#define SIMGP_YUV_TO_RGB_ROWS(X)                                                            \
+    X(grey, rgb565)                                                                         \
+    X(half, rgb565) X(half, bgr565) X(half, rgb888) X(half, bgr888)                         \
+    X(half, rgba8888) X(half, bgra8888) X(half, argb8888)                                   \
+    X(full, rgb565) X(full, bgr565)                                                         \
+    X(uv, rgb565) X(uv, bgr565) X(uv, rgb888)                                               \
+    X(vu, bgr565) X(vu, rgb888)
+// clang-format on
+
+#endif

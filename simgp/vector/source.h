@@ -1,0 +1,95 @@
+// Sources: how the samples of a span of pixels are read.
+//
+// A source loads the samples of `bytes` pixels, in the order of pixels that the packer wants: luma
+// as one vector, chroma as byte pairs, one pair for two pixels or, with full chroma, a vector of
+// pairs for the even pixels and one for the odd.
+#ifndef SIMGP_VECTOR_SOURCE_H
+#define SIMGP_VECTOR_SOURCE_H
+
+#include <string.h>
+
+#include "simgp/vector/packer.h"
+
+namespace simgp::SIMD_TARGET {
+
+struct samples {
+    const uint8_t *y, *u, *v;
+};
+
+// Room on the stack for the samples of less than a vector of pixels, read by the loads of a whole
+// one. Bytes behind the samples hold 0.
+struct staged {
+    uint8_t y[2 * bytes] = {}, u[bytes] = {}, v[bytes] = {};
+
+    samples all() const { return {y, u, v}; }
+};
+
+struct yuv_half {
+    u8v y, pairs;
+};
+struct yuv_full {
+    u8v y, pairs_even, pairs_odd;
+};
+
+template <yuv_layout>
+struct source;
+
+template <>
+struct source<yuv_layout::half> {
+    static constexpr pair_order pairs = pair_order::uv;
+    static constexpr bool pixels_in_pairs = true;
+
+    template <pixel_order Order>
+    static yuv_half load(const samples &s, ptrdiff_t x) {
+        const u8v uv = join(load_widen(s.u + x / 2), load_widen(s.v + x / 2));
+        return {arrange<Order>(SIMD_TARGET::load(s.y + x)), arrange<Order>(uv)};
+    }
+    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        memcpy(to.y, s.y + x, size_t(count));
+        memcpy(to.u, s.u + x / 2, size_t(count + 1) / 2);
+        memcpy(to.v, s.v + x / 2, size_t(count + 1) / 2);
+    }
+};
+
+template <>
+struct source<yuv_layout::full> {
+    static constexpr pair_order pairs = pair_order::uv;
+    static constexpr bool pixels_in_pairs = false;
+
+    template <pixel_order Order>
+    static yuv_full load(const samples &s, ptrdiff_t x) {
+        const u8v u = arrange<Order>(SIMD_TARGET::load(s.u + x));
+        const u8v v = arrange<Order>(SIMD_TARGET::load(s.v + x));
+        return {arrange<Order>(SIMD_TARGET::load(s.y + x)), join(even(u), even(v)),
+                join(odd(u), odd(v))};
+    }
+    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        memcpy(to.y, s.y + x, size_t(count));
+        memcpy(to.u, s.u + x, size_t(count));
+        memcpy(to.v, s.v + x, size_t(count));
+    }
+};
+
+template <pair_order Pairs>
+struct source_pairs {
+    static constexpr pair_order pairs = Pairs;
+    static constexpr bool pixels_in_pairs = true;
+
+    template <pixel_order Order>
+    static yuv_half load(const samples &s, ptrdiff_t x) {
+        return {arrange<Order>(SIMD_TARGET::load(s.y + x)),
+                arrange<Order>(SIMD_TARGET::load(s.u + x))};
+    }
+    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        memcpy(to.y, s.y + x, size_t(count));
+        memcpy(to.u, s.u + x, size_t(count + 1) / 2 * 2);
+    }
+};
+template <>
+struct source<yuv_layout::uv> : source_pairs<pair_order::uv> {};
+template <>
+struct source<yuv_layout::vu> : source_pairs<pair_order::vu> {};
+
+}  // namespace simgp::SIMD_TARGET
+
+#endif

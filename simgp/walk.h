@@ -1,0 +1,77 @@
+// The walk over planes and rows that all conversion kernels share.
+#ifndef SIMGP_WALK_H
+#define SIMGP_WALK_H
+
+#include "simgp/img.h"
+#include "simgp/rows.h"
+
+namespace simgp {
+
+// The six arguments of a conversion kernel.
+struct csc_args {
+    uint8_t *const *src_planes;
+    const int32_t *src_widths, *src_heights, *src_strides, *dst_strides;
+    uint8_t *const *dst_planes;
+};
+
+// The lines of a plane; of one that is not there, null.
+struct plane_lines {
+    uint8_t *first;
+    ptrdiff_t stride;
+
+    uint8_t *line(ptrdiff_t y) const { return first ? first + y * stride : nullptr; }
+};
+
+inline plane_lines src_lines(const csc_args &a, int plane) {
+    if (plane < 0) return {nullptr, 0};
+    return {a.src_planes[plane], a.src_strides[plane]};
+}
+inline plane_lines dst_lines(const csc_args &a, int plane) {
+    return {a.dst_planes[plane], a.dst_strides[plane]};
+}
+
+// Where a YUV format keeps its chroma: the layout of its rows, the planes of U and V (-1: none;
+// pairs lie in the plane of U), and log2 of the rows that share a chroma line.
+struct yuv_planes {
+    yuv_layout layout;
+    int8_t u, v;
+    uint8_t shared_rows_log2;
+};
+inline constexpr yuv_planes planes_yuv400{yuv_layout::grey, -1, -1, 0};
+inline constexpr yuv_planes planes_yuv420{yuv_layout::half, 1, 2, 1};
+inline constexpr yuv_planes planes_yv12{yuv_layout::half, 2, 1, 1};
+inline constexpr yuv_planes planes_yuv422n{yuv_layout::half, 1, 2, 0};
+inline constexpr yuv_planes planes_yuv422w{yuv_layout::full, 1, 2, 1};
+inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, 0};
+inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, 1};
+inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, 1};
+
+// Calls `row` for every row from top to bottom. Row y takes chroma line (y + lead) >>
+// shared_rows_log2.
+inline void walk_yuv_to_rgb(const csc_args &a, const yuv_planes &planes, yuv_to_rgb_row *row,
+                            int lead = 0) {
+    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
+    if (width < 1) return;
+    const plane_lines luma = src_lines(a, 0), u = src_lines(a, planes.u),
+                      v = src_lines(a, planes.v);
+    const plane_lines out = dst_lines(a, 0);
+    for (ptrdiff_t y = 0; y < height; y++) {
+        const ptrdiff_t chroma = (y + lead) >> planes.shared_rows_log2;
+        row(luma.line(y), u.line(chroma), v.line(chroma), out.line(y), width);
+    }
+}
+
+}  // namespace simgp
+
+// Heads the definition of an exported conversion kernel, whose body then finds the arguments in
+// `args`.
+#define SIMGP_CSC_KERNEL(name, ...)                                                              \
+    void name(uint8_t *const *src_planes, const int32_t *src_widths, const int32_t *src_heights, \
+              const int32_t *src_strides, const int32_t *dst_strides,                            \
+              uint8_t *const *dst_planes) {                                                      \
+        const simgp::csc_args args{src_planes,  src_widths,  src_heights,                        \
+                                   src_strides, dst_strides, dst_planes};                        \
+        __VA_ARGS__;                                                                             \
+    }
+
+#endif
