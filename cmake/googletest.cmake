@@ -1,15 +1,10 @@
-# GTest::gtest and GTest::gtest_main. Debian's googletest package holds sources, which every compiler,
-# processor and sanitizer can build; elsewhere an installed GoogleTest will do.
-set(SIMGP_GOOGLETEST /usr/src/googletest CACHE PATH "Sources of GoogleTest, built with the tests if they exist")
+# GTest::gtest_main. Debian's package googletest holds the sources, which every compiler, processor and
+# sanitizer can build; elsewhere an installed GoogleTest will do.
+set(SIMGP_GOOGLETEST /usr/src/googletest CACHE PATH "Sources of GoogleTest, built with the tests")
 if(EXISTS ${SIMGP_GOOGLETEST}/CMakeLists.txt)
   set(BUILD_GMOCK OFF CACHE BOOL "" FORCE)
   set(INSTALL_GTEST OFF CACHE BOOL "" FORCE)
   add_subdirectory(${SIMGP_GOOGLETEST} ${PROJECT_BINARY_DIR}/googletest EXCLUDE_FROM_ALL)
-  if(SIMGP_SANITIZE)
-    foreach(library gtest gtest_main)
-      target_compile_options(${library} PRIVATE -fsanitize=${SIMGP_SANITIZE})
-    endforeach()
-  endif()
 else()
   find_package(GTest REQUIRED)
 endif()
