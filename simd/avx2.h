@@ -25,8 +25,11 @@ inline u8v load(const uint8_t *p) {
     return _mm256_loadu_si256(reinterpret_cast<const __m256i *>(p));
 }
 inline void store(uint8_t *p, u8v v) { _mm256_storeu_si256(reinterpret_cast<__m256i *>(p), v); }
-inline u16v load_widen(const uint8_t *p) {
-    return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i *>(p)));
+inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+    const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i *>(p));
+    const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i *>(q));
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_unpacklo_epi8(a, b)),
+                                   _mm_unpackhi_epi8(a, b), 1);
 }
 
 inline u8v set_u8(uint8_t x) { return _mm256_set1_epi8(static_cast<char>(x)); }
@@ -58,6 +61,18 @@ inline s16v pair_dot(u8v v) {
         _mm256_maddubs_epi16(_mm256_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
     const __m256i c = _mm256_set1_epi16(static_cast<int16_t>(C));
     return negative ? _mm256_sub_epi16(c, dot) : _mm256_add_epi16(dot, c);
+}
+// K v / 2 = (256 v)(128 K) >> 16.
+template <int K, int C>
+inline s16v half_product_high(u8v v) {
+    return _mm256_add_epi16(
+        _mm256_mulhi_epu16(_mm256_and_si256(v, set_u16(0xFF00)), set_u16(128 * K)),
+        set_u16(static_cast<uint16_t>(C)));
+}
+template <int K, int C>
+inline s16v half_product_low(u8v v) {
+    return _mm256_add_epi16(_mm256_mulhi_epu16(_mm256_slli_epi16(v, 8), set_u16(128 * K)),
+                            set_u16(static_cast<uint16_t>(C)));
 }
 inline s16v low_minus_128_shl8(u8v v) {
     return _mm256_slli_epi16(_mm256_xor_si256(v, _mm256_set1_epi8(-128)), 8);

@@ -25,8 +25,11 @@ inline u8v load(const uint8_t *p) {
     return _mm512_loadu_si512(reinterpret_cast<const __m512i *>(p));
 }
 inline void store(uint8_t *p, u8v v) { _mm512_storeu_si512(reinterpret_cast<__m512i *>(p), v); }
-inline u16v load_widen(const uint8_t *p) {
-    return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i *>(p)));
+inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+    const auto widen = [](const uint8_t *from) {
+        return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i *>(from)));
+    };
+    return _mm512_or_si512(widen(p), _mm512_slli_epi16(widen(q), 8));
 }
 
 inline u8v set_u8(uint8_t x) { return _mm512_set1_epi8(static_cast<char>(x)); }
@@ -58,6 +61,18 @@ inline s16v pair_dot(u8v v) {
         _mm512_maddubs_epi16(_mm512_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
     const __m512i c = _mm512_set1_epi16(static_cast<int16_t>(C));
     return negative ? _mm512_sub_epi16(c, dot) : _mm512_add_epi16(dot, c);
+}
+// K v / 2 = (256 v)(128 K) >> 16.
+template <int K, int C>
+inline s16v half_product_high(u8v v) {
+    return _mm512_add_epi16(
+        _mm512_mulhi_epu16(_mm512_and_si512(v, set_u16(0xFF00)), set_u16(128 * K)),
+        set_u16(static_cast<uint16_t>(C)));
+}
+template <int K, int C>
+inline s16v half_product_low(u8v v) {
+    return _mm512_add_epi16(_mm512_mulhi_epu16(_mm512_slli_epi16(v, 8), set_u16(128 * K)),
+                            set_u16(static_cast<uint16_t>(C)));
 }
 inline s16v low_minus_128_shl8(u8v v) {
     return _mm512_slli_epi16(_mm512_xor_si512(v, _mm512_set1_epi8(-128)), 8);

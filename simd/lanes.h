@@ -68,9 +68,9 @@ inline u8v load(const uint8_t *p) {
     return r;
 }
 inline void store(uint8_t *p, u8v v) { memcpy(p, &v, bytes); }
-// bytes / 2 bytes, each widened to a 16-bit lane.
-inline u16v load_widen(const uint8_t *p) {
-    return make<u16v>([&](int i) { return p[i]; });
+// bytes / 2 bytes from p and as many from q, in turn.
+inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+    return make<u8v>([&](int i) { return (i & 1 ? q : p)[i / 2]; });
 }
 
 inline u8v set_u8(uint8_t x) {
@@ -117,6 +117,16 @@ inline s16v pair_dot(u8v v) {
     return make<s16v>([&](int i) {
         return int16_t(A * (v.lane[2 * i] - 128) + B * (v.lane[2 * i + 1] - 128) + C);
     });
+}
+// floor(K high byte / 2) + C of each byte pair, kept to 16 bits; K is 0 ... 511. And the same of
+// the low byte.
+template <int K, int C>
+inline s16v half_product_high(u8v v) {
+    return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i + 1] >> 1) + C); });
+}
+template <int K, int C>
+inline s16v half_product_low(u8v v) {
+    return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i] >> 1) + C); });
 }
 // 256 (low byte - 128) of each byte pair.
 inline s16v low_minus_128_shl8(u8v v) {

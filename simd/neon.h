@@ -23,7 +23,10 @@ inline s16v as_s16(u16v v) { return vreinterpretq_s16_u16(v); }
 
 inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
 inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
-inline u16v load_widen(const uint8_t *p) { return vmovl_u8(vld1_u8(p)); }
+inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+    const uint8x8x2_t zip = vzip_u8(vld1_u8(p), vld1_u8(q));
+    return vcombine_u8(zip.val[0], zip.val[1]);
+}
 
 inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
 inline u16v set_u16(uint16_t x) { return vdupq_n_u16(x); }
@@ -55,6 +58,19 @@ inline s16v pair_dot(u8v v) {
     if constexpr (A != 0) sum = vmlaq_n_s16(sum, as_s16(even(v)), A);
     if constexpr (B != 0) sum = vmlaq_n_s16(sum, as_s16(odd(v)), B);
     return sum;
+}
+template <int K, int C>
+inline s16v half_product(u16v v) {
+    const u16v sum = vmlaq_n_u16(vdupq_n_u16(static_cast<uint16_t>(C)), v, K / 2);
+    return as_s16(K & 1 ? vsraq_n_u16(sum, v, 1) : sum);
+}
+template <int K, int C>
+inline s16v half_product_high(u8v v) {
+    return half_product<K, C>(odd(v));
+}
+template <int K, int C>
+inline s16v half_product_low(u8v v) {
+    return half_product<K, C>(even(v));
 }
 inline s16v low_minus_128_shl8(u8v v) {
     return as_s16(veorq_u16(vshlq_n_u16(as_u16(v), 8), vdupq_n_u16(0x8000)));

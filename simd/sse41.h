@@ -23,8 +23,9 @@ inline s16v as_s16(u16v v) { return v; }
 
 inline u8v load(const uint8_t *p) { return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p)); }
 inline void store(uint8_t *p, u8v v) { _mm_storeu_si128(reinterpret_cast<__m128i *>(p), v); }
-inline u16v load_widen(const uint8_t *p) {
-    return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const __m128i *>(p)));
+inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+    return _mm_unpacklo_epi8(_mm_loadl_epi64(reinterpret_cast<const __m128i *>(p)),
+                             _mm_loadl_epi64(reinterpret_cast<const __m128i *>(q)));
 }
 
 inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
@@ -56,6 +57,17 @@ inline s16v pair_dot(u8v v) {
         _mm_maddubs_epi16(_mm_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
     const __m128i c = _mm_set1_epi16(static_cast<int16_t>(C));
     return negative ? _mm_sub_epi16(c, dot) : _mm_add_epi16(dot, c);
+}
+// K v / 2 = (256 v)(128 K) >> 16.
+template <int K, int C>
+inline s16v half_product_high(u8v v) {
+    return _mm_add_epi16(_mm_mulhi_epu16(_mm_and_si128(v, set_u16(0xFF00)), set_u16(128 * K)),
+                         set_u16(static_cast<uint16_t>(C)));
+}
+template <int K, int C>
+inline s16v half_product_low(u8v v) {
+    return _mm_add_epi16(_mm_mulhi_epu16(_mm_slli_epi16(v, 8), set_u16(128 * K)),
+                         set_u16(static_cast<uint16_t>(C)));
 }
 inline s16v low_minus_128_shl8(u8v v) {
     return _mm_slli_epi16(_mm_xor_si128(v, _mm_set1_epi8(-128)), 8);

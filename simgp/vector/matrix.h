@@ -6,7 +6,7 @@
 // moves from luma to chroma, so that both fit. Ranges, with the rounding constant 64:
 //
 //   luma   149 (Y - 16) - 3248                 -5632 ... 32363
-//   r      204 Vc + floor(Vc / 2) + 64 + 3248  -22864 ... 29283
+//   r      floor(409 Vc / 2) + 64 + 3248       -22864 ... 29283
 //   g      -50 Uc - 104 Vc + 64 + 3248         -16246 ... 23024
 //   b256   256 Uc                              -32768 ... 32512
 //   b2     2 Uc + 64 + 3248                      3056 ... 3566
@@ -17,7 +17,7 @@
 // above 0.
 //
 // The coarse matrix (6 fractional bits) is computed at twice its scale and has the same form, with
-// 150 for 149 and 204 Vc alone in r.
+// 150 for 149 and 204 Vc in r.
 #ifndef SIMGP_VECTOR_MATRIX_H
 #define SIMGP_VECTOR_MATRIX_H
 
@@ -35,7 +35,8 @@ struct chroma_terms {
 // Which sample of a chroma pair comes first.
 enum class pair_order { uv, vu };
 
-template <int LUMA, bool HALF_V>
+// RED is twice the factor of Vc in r.
+template <int LUMA, int RED>
 struct matrix_s7 {
     static constexpr int offset = 3248;
     static constexpr int chroma_bias = offset + 64;
@@ -49,12 +50,8 @@ struct matrix_s7 {
     static chroma_terms chroma(u8v pairs) {
         constexpr bool uv = Order == pair_order::uv;
         chroma_terms t;
-        if constexpr (HALF_V) {  // floor(Vc / 2) = (V >> 1) - 64
-            const s16v half = as_s16(uv ? shr<9>(as_u16(pairs)) : shr<1>(even(pairs)));
-            t.r = add(pair_dot < uv ? 0 : 204, uv ? 204 : 0, chroma_bias - 64 > (pairs), half);
-        } else {
-            t.r = pair_dot < uv ? 0 : 204, uv ? 204 : 0, chroma_bias > (pairs);
-        }
+        t.r = uv ? half_product_high<RED, chroma_bias - 64 * RED>(pairs)
+                 : half_product_low<RED, chroma_bias - 64 * RED>(pairs);
         t.g = pair_dot < uv ? -50 : -104, uv ? -104 : -50, chroma_bias > (pairs);
         t.b256 = uv ? low_minus_128_shl8(pairs) : high_minus_128_shl8(pairs);
         t.b2 = pair_dot < uv ? 2 : 0, uv ? 0 : 2, chroma_bias > (pairs);
@@ -66,8 +63,8 @@ struct matrix_s7 {
     }
 };
 
-using bt601 = matrix_s7<149, true>;
-using bt601_coarse = matrix_s7<150, false>;
+using bt601 = matrix_s7<149, 409>;
+using bt601_coarse = matrix_s7<150, 408>;
 
 }  // namespace simgp::SIMD_TARGET
 

@@ -41,8 +41,8 @@ struct source<yuv_layout::half> {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        const u8v uv = join(load_widen(s.u + x / 2), load_widen(s.v + x / 2));
-        return {arrange<Order>(SIMD_TARGET::load(s.y + x)), arrange<Order>(uv)};
+        return {arrange<Order>(SIMD_TARGET::load(s.y + x)),
+                arrange<Order>(load_zip(s.u + x / 2, s.v + x / 2))};
     }
     static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         memcpy(to.y, s.y + x, size_t(count));
