@@ -25,10 +25,11 @@ message(STATUS "simgp: vector rows for: ${SIMGP_TARGETS}")
 
 # Areas, from the list that the code has.
 set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${PROJECT_SOURCE_DIR}/simd/areas.h)
-file(STRINGS ${PROJECT_SOURCE_DIR}/simd/areas.h area_lines REGEX "^ +X\\(")
+file(READ ${PROJECT_SOURCE_DIR}/simd/areas.h area_list)
+string(REGEX MATCHALL "X\\([a-z]+, [a-z0-9_]+\\)" area_list "${area_list}")
 set(SIMGP_AREAS "")
-foreach(line IN LISTS area_lines)
-  string(REGEX REPLACE "^ +X\\(([a-z]+), ([a-z0-9_]+)\\).*" "\\1/\\2" area "${line}")
+foreach(area IN LISTS area_list)
+  string(REGEX REPLACE "X\\((.*), (.*)\\)" "\\1/\\2" area "${area}")
   list(APPEND SIMGP_AREAS ${area})
 endforeach()
 

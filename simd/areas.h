@@ -5,7 +5,9 @@
 
 // clang-format off
 #define SIMGP_AREAS(X) \
-    X(simgp, yuv2rgb)
+    X(simgp, yuv2rgb) \
+    X(scmn, mem)      \
+    X(scmn, keyframe)
 // clang-format on
 
 #endif

@@ -34,9 +34,23 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 
 inline u8v set_u8(uint8_t x) { return _mm256_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm256_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_u32(uint32_t x) { return _mm256_set1_epi32(static_cast<int>(x)); }
+
+inline void store_stream(uint8_t *p, u8v v) {
+    _mm256_stream_si256(reinterpret_cast<__m256i *>(p), v);
+}
+inline void stream_end() { _mm_sfence(); }
+
+inline u8v min_u8(u8v a, u8v b) { return _mm256_min_epu8(a, b); }
+inline int first_zero(u8v v) {
+    const unsigned zero =
+        static_cast<unsigned>(_mm256_movemask_epi8(_mm256_cmpeq_epi8(v, _mm256_setzero_si256())));
+    return zero ? __builtin_ctz(zero) : bytes;
+}
 
 inline u8v bit_and(u8v a, u8v b) { return _mm256_and_si256(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm256_or_si256(a, b); }
+inline u8v bit_xor(u8v a, u8v b) { return _mm256_xor_si256(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
     return _mm256_slli_epi16(a, N);

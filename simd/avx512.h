@@ -34,9 +34,22 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 
 inline u8v set_u8(uint8_t x) { return _mm512_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm512_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_u32(uint32_t x) { return _mm512_set1_epi32(static_cast<int>(x)); }
+
+inline void store_stream(uint8_t *p, u8v v) {
+    _mm512_stream_si512(reinterpret_cast<__m512i *>(p), v);
+}
+inline void stream_end() { _mm_sfence(); }
+
+inline u8v min_u8(u8v a, u8v b) { return _mm512_min_epu8(a, b); }
+inline int first_zero(u8v v) {
+    const uint64_t zero = _mm512_testn_epi8_mask(v, v);
+    return zero ? __builtin_ctzll(zero) : bytes;
+}
 
 inline u8v bit_and(u8v a, u8v b) { return _mm512_and_si512(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm512_or_si512(a, b); }
+inline u8v bit_xor(u8v a, u8v b) { return _mm512_xor_si512(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
     return _mm512_slli_epi16(a, N);

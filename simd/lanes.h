@@ -79,6 +79,26 @@ inline u8v set_u8(uint8_t x) {
 inline u16v set_u16(uint16_t x) {
     return make<u16v>([&](int) { return x; });
 }
+// The four bytes of x, lowest first, over and over.
+inline u8v set_u32(uint32_t x) {
+    return make<u8v>([&](int i) { return x >> i % 4 * 8 & 255; });
+}
+
+// A store to an address that is a multiple of `bytes`, past the caches where the machine can do
+// that; stream_end() orders a run of them before whatever is written next.
+inline void store_stream(uint8_t *p, u8v v) { store(p, v); }
+inline void stream_end() {}
+
+// The smaller of each pair of bytes; the index of the first byte that is 0, `bytes` if there is
+// none.
+inline u8v min_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] < b.lane[i] ? a.lane[i] : b.lane[i]; });
+}
+inline int first_zero(u8v v) {
+    int i = 0;
+    while (i < bytes && v.lane[i] != 0) i++;
+    return i;
+}
 
 // Bits.
 inline u8v bit_and(u8v a, u8v b) {
@@ -86,6 +106,9 @@ inline u8v bit_and(u8v a, u8v b) {
 }
 inline u8v bit_or(u8v a, u8v b) {
     return make<u8v>([&](int i) { return a.lane[i] | b.lane[i]; });
+}
+inline u8v bit_xor(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] ^ b.lane[i]; });
 }
 inline u16v bit_and(u16v a, u16v b) {
     return make<u16v>([&](int i) { return a.lane[i] & b.lane[i]; });

@@ -30,9 +30,22 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 
 inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
 inline u16v set_u16(uint16_t x) { return vdupq_n_u16(x); }
+inline u8v set_u32(uint32_t x) { return vreinterpretq_u8_u32(vdupq_n_u32(x)); }
+
+inline void store_stream(uint8_t *p, u8v v) { store(p, v); }
+inline void stream_end() {}
+
+inline u8v min_u8(u8v a, u8v b) { return vminq_u8(a, b); }
+inline int first_zero(u8v v) {
+    // Four bits for each byte, in one 64-bit word.
+    const uint8x8_t zero = vshrn_n_u16(as_u16(vceqq_u8(v, vdupq_n_u8(0))), 4);
+    const uint64_t bits = vget_lane_u64(vreinterpret_u64_u8(zero), 0);
+    return bits ? __builtin_ctzll(bits) / 4 : bytes;
+}
 
 inline u8v bit_and(u8v a, u8v b) { return vandq_u8(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return vorrq_u8(a, b); }
+inline u8v bit_xor(u8v a, u8v b) { return veorq_u8(a, b); }
 inline u16v bit_and(u16v a, u16v b) { return vandq_u16(a, b); }
 inline u16v bit_or(u16v a, u16v b) { return vorrq_u16(a, b); }
 template <int N>

@@ -30,9 +30,21 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 
 inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_u32(uint32_t x) { return _mm_set1_epi32(static_cast<int>(x)); }
+
+inline void store_stream(uint8_t *p, u8v v) { _mm_stream_si128(reinterpret_cast<__m128i *>(p), v); }
+inline void stream_end() { _mm_sfence(); }
+
+inline u8v min_u8(u8v a, u8v b) { return _mm_min_epu8(a, b); }
+inline int first_zero(u8v v) {
+    const unsigned zero =
+        static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(v, _mm_setzero_si128())));
+    return zero ? __builtin_ctz(zero) : bytes;
+}
 
 inline u8v bit_and(u8v a, u8v b) { return _mm_and_si128(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm_or_si128(a, b); }
+inline u8v bit_xor(u8v a, u8v b) { return _mm_xor_si128(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
     return _mm_slli_epi16(a, N);

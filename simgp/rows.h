@@ -40,10 +40,20 @@ enum class rgb_packing : uint8_t {
 using yuv_to_rgb_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                             ptrdiff_t width);
 
+// Repeats the four bytes of value, lowest first, over `size` bytes, a multiple of 32.
+using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
+
+// The first x from 0 to count - 1 with p[x] = p[x + 1] = 0 and (p[x + 2] & mask) = code, else
+// count. Reads p[0 .. count + 1].
+using find_code_row = ptrdiff_t(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t code);
+
 struct rows {
     // yuv2rgb: null where the library has no such conversion.
     yuv_to_rgb_row *yuv_to_rgb[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
     yuv_to_rgb_row *vu_to_rgb565_coarse;  // with the coefficients of 6 fractional bits
+
+    fill_row *fill;            // mem
+    find_code_row *find_code;  // keyframe
 
     yuv_to_rgb_row *&yuv_to_rgb_slot(yuv_layout layout, rgb_packing packing) {
         return yuv_to_rgb[size_t(layout)][size_t(packing)];

@@ -1,0 +1,16 @@
+// The build stamp, in a file of its own so that no other result depends on the time.
+#include "scmn/mem.h"
+
+#ifndef SCMN_BUILD_DATE
+#define SCMN_BUILD_DATE __DATE__
+#define SCMN_BUILD_TIME __TIME__
+#endif
+
+const char *scmn_version(void) {
+    static constexpr char text[] = SCMN_BUILD_DATE " " SCMN_BUILD_TIME "\n";
+    static char buffer[64];
+    // Any number of threads may write the same text here at once.
+    for (unsigned i = 0; i < sizeof text; i++)
+        __atomic_store_n(&buffer[i], text[i], __ATOMIC_RELAXED);
+    return buffer;
+}
