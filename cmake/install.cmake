@@ -19,5 +19,17 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/simgp-config-version.cmak
 install(FILES ${PROJECT_BINARY_DIR}/simgp-config.cmake ${PROJECT_BINARY_DIR}/simgp-config-version.cmake
         DESTINATION ${package_dir})
 
+# Found from where the file lies, so that the installed tree can be moved, unless folders are absolute.
+if(IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}" OR IS_ABSOLUTE "${CMAKE_INSTALL_INCLUDEDIR}")
+  set(pc_prefix ${CMAKE_INSTALL_PREFIX})
+  set(pc_libdir ${CMAKE_INSTALL_FULL_LIBDIR})
+  set(pc_includedir ${CMAKE_INSTALL_FULL_INCLUDEDIR})
+else()
+  file(RELATIVE_PATH up /prefix/${CMAKE_INSTALL_LIBDIR}/pkgconfig /prefix)
+  string(REGEX REPLACE "/$" "" up "${up}")
+  set(pc_prefix "\${pcfiledir}/${up}")
+  set(pc_libdir "\${prefix}/${CMAKE_INSTALL_LIBDIR}")
+  set(pc_includedir "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}")
+endif()
 configure_file(cmake/simgp.pc.in ${PROJECT_BINARY_DIR}/simgp.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/simgp.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)

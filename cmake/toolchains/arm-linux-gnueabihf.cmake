@@ -8,7 +8,7 @@ set(flags "-march=armv7-a -mthumb -mfloat-abi=hard -mfpu=vfpv3-d16")
 set(CMAKE_C_FLAGS_INIT "${flags}")
 set(CMAKE_CXX_FLAGS_INIT "${flags}")
 
-set(CMAKE_FIND_ROOT_PATH /usr/arm-linux-gnueabihf)
+list(APPEND CMAKE_FIND_ROOT_PATH /usr/arm-linux-gnueabihf)
 set(CMAKE_FIND_ROOT_PATH_MODE_PROGRAM NEVER)
 set(CMAKE_FIND_ROOT_PATH_MODE_LIBRARY ONLY)
 set(CMAKE_FIND_ROOT_PATH_MODE_INCLUDE ONLY)

@@ -1,0 +1,16 @@
+# Each public header compiles alone, as C11, C++17 and C++20, without a warning.
+. "$(dirname "$0")/gate.sh" "$1"
+
+for header in $public_headers; do
+    printf '#include "%s"\n#include "%s"\nint main(void) { return 0; }\n' "$header" "$header" >"$scratch/use.c"
+    cp "$scratch/use.c" "$scratch/use.cpp"
+    strict="-pedantic -Wall -Wextra -Wundef -Werror -fsyntax-only -I$source_dir"
+    # shellcheck disable=SC2086
+    {
+        "$cc" $c_flags -std=c11 -Wstrict-prototypes $strict "$scratch/use.c" || fault "$header is no C11."
+        for standard in c++17 c++20; do
+            "$cxx" $cxx_flags -std=$standard $strict "$scratch/use.cpp" || fault "$header is no $standard."
+        done
+    }
+done
+finish
