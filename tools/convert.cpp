@@ -1,0 +1,87 @@
+// simgp-convert: takes frames from files, pipes or a test card through the library's conversions.
+#include <CLI/CLI.hpp>
+#include <cstdio>
+#include <exception>
+
+#include "tools/job.h"
+#include "tools/output.h"
+
+namespace {
+
+constexpr const char *examples = R"(
+Inputs: Y4M video (mono, 4:2:0, 4:2:2, 4:4:4 of 8 bits), PNG, raw frames with --format and --size,
+a moving test card testcard:[WIDTHxHEIGHT][@FRAMES], and "-" for the standard input.
+Outputs by their ending: .png, .ppm, .y4m, anything else raw frames; "-" is the standard output.
+
+Examples:
+  simgp-convert clip.y4m -o frame-%04d.png
+  simgp-convert clip.y4m -o overview.png --sheet
+  simgp-convert clip.y4m -o screen.rgb565 --dither
+  simgp-convert camera.nv21 --size 640x480 -o camera.png --frames 1
+  simgp-convert photo.png -o photo.t64x32
+  simgp-convert photo.t64x32 --size 640x480 -o back.png --verbose
+  simgp-convert testcard:320x240@50 -o card.y4m
+  ffmpeg -i film.mp4 -f yuv4mpegpipe -pix_fmt yuv420p - | simgp-convert - -o film.png --sheet
+)";
+
+}  // namespace
+
+int main(int argc, char **argv) {
+    tools::tidy_on_signals();
+
+    CLI::App app("Converts pictures and video frames between the formats of the simgp library.",
+                 "simgp-convert");
+    app.footer(examples);
+    tools::Job job;
+    bool list = false;
+    std::string demo;
+    app.add_option("input", job.source.path, "file, \"-\", or testcard:[WxH][@FRAMES]");
+    app.add_option("-o,--output", job.output, "file, out-%04d.png for a file each frame, or \"-\"");
+    app.add_option("-t,--to", job.to,
+                   "destination format; without it, what suits the output best (see --list)");
+    app.add_option("-f,--format", job.source.format, "format of raw frames or of the test card");
+    app.add_option("-s,--size", job.source.size, "size of raw frames, such as 640x480");
+    app.add_option("-n,--frames", job.frames, "stop after so many frames")
+        ->check(CLI::PositiveNumber);
+    app.add_flag("-d,--dither", job.dither, "dither on the way to 16-bit RGB");
+    app.add_flag("--sheet", job.sheet, "put the frames on one contact sheet");
+    app.add_option("--columns", job.columns, "pictures in a row of the sheet")
+        ->check(CLI::PositiveNumber);
+    app.add_option("--as", job.as, "kind of output, whatever its name says")
+        ->check(CLI::IsMember({"png", "ppm", "y4m", "raw"}));
+    app.add_flag("-v,--verbose", job.verbose, "say which conversions are used");
+    app.add_flag("-q,--quiet", job.quiet, "no progress bar, no notes");
+    app.add_flag("--list", list, "list all conversions");
+    app.add_option("--demo", demo,
+                   "write pictures that show what the library does into this folder");
+
+    try {
+        app.parse(argc, argv);
+        if (!list && demo.empty()) {
+            if (job.source.path.empty()) throw CLI::RequiredError("input");
+            if (job.output.empty()) throw CLI::RequiredError("--output");
+        }
+    } catch (const CLI::Success &wish) {
+        return app.exit(wish);
+    } catch (const CLI::ParseError &error) {
+        std::fprintf(stderr, "simgp-convert: %s (see --help)\n", error.what());
+        return 2;
+    }
+
+    try {
+        if (list) {
+            std::fputs(tools::list_conversions().c_str(), stdout);
+        } else if (!demo.empty()) {
+            tools::demo(demo, job.source);
+        } else {
+            tools::run(job);
+        }
+    } catch (const std::bad_alloc &) {
+        std::fprintf(stderr, "simgp-convert: not enough memory\n");
+        return 1;
+    } catch (const std::exception &error) {
+        std::fprintf(stderr, "simgp-convert: %s\n", error.what());
+        return 1;
+    }
+    return 0;
+}

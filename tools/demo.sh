@@ -1,0 +1,27 @@
+#!/bin/bash
+# demo.sh SIMGP_CONVERT FOLDER [FILE]: writes the demonstration's pictures into FOLDER, from FILE or the
+# test card. What is neither Y4M nor PNG is decoded by ffmpeg, if that is installed.
+set -euo pipefail
+
+[ $# -ge 2 ] && [ $# -le 3 ] || {
+    echo "usage: demo.sh SIMGP_CONVERT FOLDER [FILE]" >&2
+    exit 2
+}
+convert=$1 folder=$2 file=${3:-}
+
+[ -n "$file" ] || exec "$convert" --demo "$folder"
+
+[ -r "$file" ] && [ -f "$file" ] || {
+    echo "demo: cannot read '$file'" >&2
+    exit 1
+}
+case $(head -c 9 "$file" | tr -d '\0\r\n') in
+    YUV4MPEG2 | *PNG*) exec "$convert" --demo "$folder" "$file" ;;
+esac
+command -v ffmpeg >/dev/null || {
+    echo "demo: '$file' is neither Y4M nor PNG; install ffmpeg to show it" >&2
+    exit 1
+}
+# The first 41 frames are enough; one that is empty says why by itself.
+ffmpeg -v error -nostdin -i "$file" -frames:v 41 -an -f yuv4mpegpipe -pix_fmt yuv420p - |
+    "$convert" --demo "$folder" -

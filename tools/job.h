@@ -1,0 +1,33 @@
+// One run of simgp-convert: source -> stages -> sink.
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+#include "tools/source.h"
+
+namespace tools {
+
+struct Job {
+    SourceOptions source;
+    std::string output;
+    std::string to;      // destination format; empty: what suits the output
+    std::string as;      // png, ppm, y4m, raw; empty: by the ending of `output`
+    int64_t frames = 0;  // stop after so many; 0: all
+    bool dither = false;
+    bool sheet = false;
+    int columns = 0;
+    bool verbose = false;
+    bool quiet = false;  // no progress bar, no notes
+};
+
+void run(const Job &job);
+
+/// The --list page: what converts into what.
+std::string list_conversions();
+
+/// Writes the demonstration's pictures into the folder `directory`, which is made if it is missing,
+/// and says on standard output what they show.
+void demo(const std::string &directory, const SourceOptions &source);
+
+}  // namespace tools

@@ -1,0 +1,108 @@
+#include "tools/sheet.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+#include "tools/rgb.h"
+#include "tools/sink.h"
+#include "tools/text.h"
+
+namespace tools {
+
+namespace {
+
+constexpr int gap = 8;
+constexpr uint8_t paper = 48;
+
+class SheetSink : public Sink {
+  public:
+    SheetSink(const std::string &path, WriteStill write, int columns)
+        : output_(path), write_(write), columns_(columns) {}
+
+    void put(const Picture &picture) override {
+        if (frame_ % every_ == 0) {
+            if (tiles_.size() == 64) {
+                for (size_t k = 0; k < 32; ++k) tiles_[k] = std::move(tiles_[2 * k]);
+                tiles_.resize(32);
+                every_ *= 2;
+            }
+            if (frame_ % every_ == 0)
+                tiles_.push_back(make_tile(picture, "frame " + std::to_string(frame_), 320, 240));
+        }
+        ++frame_;
+    }
+    void finish() override {
+        write_(output_, lay_out(tiles_, columns_));
+        output_.commit();
+    }
+
+  private:
+    Output output_;
+    WriteStill write_;
+    int columns_;
+    int64_t frame_ = 0, every_ = 1;
+    std::vector<Tile> tiles_;
+};
+
+}  // namespace
+
+Tile make_tile(const Picture &picture, const std::string &label, int max_width, int max_height) {
+    Picture full = to_rgb888(picture);
+    const int by = std::max({1, (full.width() + max_width - 1) / max_width,
+                             (full.height() + max_height - 1) / max_height});
+    if (by == 1) return {std::move(full), label};
+    const int width = std::max(full.width() / by, 1), height = std::max(full.height() / by, 1);
+    Picture small({&full.format(), width, height});
+    for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x)
+            for (int c = 0; c < 3; ++c) {
+                const int bottom = std::min(y * by + by, full.height());
+                const int right = std::min(x * by + by, full.width());
+                int sum = 0, pixels = 0;
+                for (int fy = y * by; fy < bottom; ++fy)
+                    for (int fx = x * by; fx < right; ++fx, ++pixels)
+                        sum += *full.sample(c, fx, fy);
+                *small.sample(c, x, y) = uint8_t((sum + pixels / 2) / pixels);
+            }
+    return {std::move(small), label};
+}
+
+Picture lay_out(const std::vector<Tile> &tiles, int columns) {
+    if (tiles.empty()) throw Fault("no picture for the sheet");
+    int cell_width = 0, cell_height = 0;
+    for (const Tile &tile : tiles) {
+        const int label_width = text_width(tile.label, 1);
+        cell_width = std::max({cell_width, tile.picture.width(), label_width});
+        cell_height = std::max(cell_height, tile.picture.height());
+    }
+    const int count = int(tiles.size());
+    if (columns <= 0)
+        columns = int(std::lround(std::sqrt(double(count) * cell_height / cell_width)));
+    columns = std::clamp(columns, 1, count);
+    const int scale = cell_width >= 200 ? 2 : 1;
+    // A label that does not fit at the larger scale is written at the smaller one.
+    const int label_height = text_height * scale + 4;
+    const int lines = (count + columns - 1) / columns;
+    const int width = columns * (cell_width + gap) + gap;
+    const int height = lines * (cell_height + label_height + gap) + gap;
+    check_size(width, height, "contact sheet");
+    Picture sheet({&format_coded(SIMGP_FMT_RGB888), width, height});
+    for (int y = 0; y < height; ++y) std::memset(sheet.row(0, y), paper, sheet.row_bytes(0));
+    for (int k = 0; k < count; ++k) {
+        const Tile &tile = tiles[k];
+        const int x = gap + k % columns * (cell_width + gap);
+        const int y = gap + k / columns * (cell_height + label_height + gap);
+        draw_text(sheet, x, y, tile.label, text_width(tile.label, scale) <= cell_width ? scale : 1);
+        for (int line = 0; line < tile.picture.height(); ++line)
+            std::memcpy(sheet.sample(0, x, y + label_height + line), tile.picture.row(0, line),
+                        tile.picture.row_bytes(0));
+    }
+    return sheet;
+}
+
+std::unique_ptr<Sink> sheet_sink(const std::string &path, WriteStill write, int columns) {
+    return std::make_unique<SheetSink>(path, write, columns);
+}
+
+}  // namespace tools

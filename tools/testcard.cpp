@@ -1,0 +1,110 @@
+// A test card that moves, drawn from formulas:
+//
+//   upper 5/8   eight colour bars: white, yellow, cyan, green, magenta, red, blue, black
+//   next 1/8    a ramp of grey from black to white, where few bits show as steps
+//   lower 1/4   every chroma at one luma: U rises to the right, V rises downwards
+//   a white square with a black rim that wanders over the bars, one step a frame
+#include <algorithm>
+#include <charconv>
+
+#include "tools/road.h"
+#include "tools/source.h"
+
+namespace tools {
+
+namespace {
+
+struct Yuv {
+    uint8_t y, u, v;
+};
+
+// ITU-R BT.601, limited range, of the full-scale colours.
+constexpr Yuv bars[8] = {{235, 128, 128}, {210, 16, 146}, {170, 166, 16}, {145, 54, 34},
+                         {106, 202, 222}, {81, 90, 240},  {41, 240, 110}, {16, 128, 128}};
+
+/// Runs from 0 to `top` and back.
+int back_and_forth(int64_t step, int top) {
+    if (top <= 0) return 0;
+    const int at = int(step % (2 * int64_t{top}));
+    return at <= top ? at : 2 * top - at;
+}
+
+/// Maps 0 ... count - 1 to low ... high.
+uint8_t ramp(int at, int count, int low, int high) {
+    return uint8_t(low + (count > 1 ? int64_t{high - low} * at / (count - 1) : 0));
+}
+
+Yuv card(int x, int y, int width, int height, int64_t frame) {
+    const int bars_end = height * 5 / 8, ramp_end = height * 6 / 8;
+    if (y < bars_end) {
+        const int side = std::max(bars_end / 4, 1), speed = std::max(width / 80, 1);
+        const int left = back_and_forth(frame * speed, width - side);
+        const int top = back_and_forth(frame * speed + bars_end / 3, bars_end - side);
+        const int dx = x - left, dy = y - top;
+        if (dx >= 0 && dx < side && dy >= 0 && dy < side) {
+            const int rim = std::max(side / 10, 1);
+            const bool inner = dx >= rim && dx < side - rim && dy >= rim && dy < side - rim;
+            return inner ? bars[0] : bars[7];
+        }
+        return bars[int64_t{x} * 8 / width];
+    }
+    if (y < ramp_end) return {ramp(x, width, 16, 235), 128, 128};
+    return {130, ramp(x, width, 16, 240), ramp(y - ramp_end, height - ramp_end, 16, 240)};
+}
+
+class Testcard : public Source {
+  public:
+    Testcard(const std::string &spec, const Format &format) {
+        name_ = spec;
+        std::string size = spec.substr(std::string("testcard:").size());
+        if (const size_t at = size.find('@'); at != std::string::npos) {
+            const std::string count = size.substr(at + 1);
+            const char *end = count.data() + count.size();
+            const auto result = std::from_chars(count.data(), end, frames_);
+            if (result.ec != std::errc() || result.ptr != end || frames_ < 1)
+                throw Fault(spec, ": '", count, "' is not a number of frames");
+            size.resize(at);
+        }
+        int width = 640, height = 480;
+        if (!size.empty()) parse_size(size, spec, width, height);
+        shape_ = {&format, width, height};
+        // It is drawn in YUV; other formats are reached from 4:2:0 with the library.
+        const bool drawn = !format.is_rgb() && format.kind != Kind::tiled;
+        drawing_ = Picture({drawn ? &format : &format_coded(SIMGP_FMT_YUV420), width, height});
+        if (!drawn) road_ = std::make_unique<Road>(drawing_.shape(), format, false);
+    }
+
+    bool next(Picture &to) override {
+        if (frame_ == frames_) return false;
+        for (int y = 0; y < drawing_.height(); ++y)
+            for (int x = 0; x < drawing_.width(); ++x) draw(x, y);
+        to = road_ ? road_->run(drawing_) : drawing_;
+        ++frame_;
+        return true;
+    }
+    double done() const override { return double(frame_) / double(frames_); }
+
+  private:
+    /// Shared chroma samples are those of the top left pixel, as in the library's own conversions.
+    void draw(int x, int y) {
+        const Yuv colour = card(x, y, drawing_.width(), drawing_.height(), frame_);
+        const uint8_t value[3] = {colour.y, colour.u, colour.v};
+        for (int c = 0; c < 3; ++c) {
+            const Channel &channel = drawing_.format().channel[c];
+            const int mask = (1 << channel.x_shift) - 1, lines = (1 << channel.y_shift) - 1;
+            if (channel.step && !(x & mask) && !(y & lines)) *drawing_.sample(c, x, y) = value[c];
+        }
+    }
+
+    int64_t frame_ = 0, frames_ = 1;
+    Picture drawing_;
+    std::unique_ptr<Road> road_;
+};
+
+}  // namespace
+
+std::unique_ptr<Source> open_testcard(const std::string &spec, const Format &format) {
+    return std::make_unique<Testcard>(spec, format);
+}
+
+}  // namespace tools

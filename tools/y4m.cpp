@@ -1,0 +1,177 @@
+// Y4M, uncompressed video: a line of text about the stream, then for each frame a line that begins
+// with FRAME and the tight planes.
+#include <charconv>
+
+#include "tools/sink.h"
+#include "tools/source.h"
+
+namespace tools {
+
+namespace {
+
+constexpr size_t longest_line = 1024;
+
+/// The layouts of the colour space tag. 4:2:0 comes in several sitings of chroma, which say where a
+/// sample belongs, not where it lies in memory.
+const Format *format_of_tag(std::string_view tag) {
+    for (const char *same : {"420", "420jpeg", "420mpeg2", "420paldv"})
+        if (tag == same) return &format_coded(SIMGP_FMT_YUV420);
+    if (tag == "422") return &format_coded(SIMGP_FMT_YUV422N);
+    if (tag == "444") return &format_coded(SIMGP_FMT_YUV444);
+    if (tag == "mono") return &format_coded(SIMGP_FMT_YUV400);
+    return nullptr;
+}
+
+/// "420p10", "mono16": the digits after the last letter that is followed by digits only.
+bool high_depth(std::string_view tag) {
+    for (const char *begin : {"420p", "422p", "444p", "440p", "mono"})
+        if (tag.starts_with(begin)) {
+            const std::string_view depth = tag.substr(4);
+            return !depth.empty() &&
+                   depth.find_first_not_of("0123456789") == std::string_view::npos;
+        }
+    return false;
+}
+
+class Y4mSource : public Source {
+  public:
+    explicit Y4mSource(std::unique_ptr<Input> input) : input_(std::move(input)) {
+        name_ = input_->name();
+        std::string header;
+        if (!input_->line(header, longest_line)) fail(0, "the Y4M header has no end");
+        if (!header.starts_with("YUV4MPEG2 "))
+            fail(0, "the Y4M header does not begin with YUV4MPEG2");
+        std::string colour = "420";
+        int64_t width = -1, height = -1;
+        for (size_t at = 10; at < header.size();) {
+            const size_t end = std::min(header.find(' ', at), header.size());
+            const std::string tag = header.substr(at, end - at),
+                              value = tag.substr(tag.empty() ? 0 : 1);
+            const int64_t begin = int64_t(at);
+            at = end + 1;
+            if (tag.empty()) continue;
+            switch (tag[0]) {
+                case 'W':
+                    width = number(value, begin);
+                    break;
+                case 'H':
+                    height = number(value, begin);
+                    break;
+                case 'C':
+                    colour = value;
+                    break;
+                case 'F':
+                    tempo_.rate = value;
+                    break;
+                case 'I':
+                    tempo_.interlacing = value;
+                    break;
+                case 'A':
+                    tempo_.aspect = value;
+                    break;
+                case 'X':
+                    break;  // comments and extensions
+                default:
+                    fail(begin, "unknown tag '", tag, "' in the Y4M header");
+            }
+            if (tag[0] == 'C') {
+                if (high_depth(colour))
+                    fail(begin, "colour space C", colour,
+                         " has more than 8 bits a sample; only 8-bit ", "video is supported");
+                shape_.format = format_of_tag(colour);
+                if (!shape_.format)
+                    fail(begin, "unknown colour space tag C", colour,
+                         "; mono, 420, 422 and 444 are supported");
+            }
+        }
+        if (width < 0 || height < 0) fail(0, "the Y4M header lacks ", width < 0 ? "W" : "H");
+        check_size(width, height, name_ + ": byte 0: Y4M header");
+        if (!shape_.format) shape_.format = format_of_tag(colour);
+        shape_.width = int(width);
+        shape_.height = int(height);
+    }
+
+    bool next(Picture &to) override {
+        const int64_t begin = input_->offset();
+        if (input_->peek(1).empty()) return false;
+        std::string header;
+        if (!input_->line(header, longest_line) ||
+            !(header == "FRAME" || header.starts_with("FRAME ")))
+            input_->fail(frame_, begin, "no FRAME line where a frame should begin");
+        read_frame(*input_, to, frame_);
+        ++frame_;
+        return true;
+    }
+
+    double done() const override {
+        return input_->size() > 0 ? double(input_->offset()) / double(input_->size()) : -1;
+    }
+
+  private:
+    template <class... Part>
+    [[noreturn]] void fail(int64_t at, const Part &...part) const {
+        input_->fail(-1, at, part...);
+    }
+
+    int64_t number(const std::string &text, int64_t at) const {
+        int64_t value = 0;
+        const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
+        if (result.ec == std::errc::invalid_argument || result.ptr != text.data() + text.size())
+            fail(at, "'", text, "' is not a number");
+        if (result.ec != std::errc()) fail(at, "impossible size ", text);
+        return value;
+    }
+
+    std::unique_ptr<Input> input_;
+    int64_t frame_ = 0;
+};
+
+class Y4mSink : public Sink {
+  public:
+    Y4mSink(const std::string &path, const Tempo &tempo) : output_(path), tempo_(tempo) {}
+
+    void put(const Picture &picture) override {
+        if (frames_++ == 0) {
+            std::ostringstream header;
+            header << "YUV4MPEG2 W" << picture.width() << " H" << picture.height() << " F"
+                   << tempo_.rate << " I" << tempo_.interlacing << " A" << tempo_.aspect << " C"
+                   << y4m_tag(picture.format()) << "\n";
+            output_.write(header.str());
+        }
+        output_.write("FRAME\n");
+        write_frame(output_, picture);
+    }
+    void finish() override { output_.commit(); }
+
+  private:
+    Output output_;
+    Tempo tempo_;
+    int64_t frames_ = 0;
+};
+
+}  // namespace
+
+std::string_view y4m_tag(const Format &format) {
+    switch (format.code) {
+        case SIMGP_FMT_YUV400:
+            return "mono";
+        case SIMGP_FMT_YUV420:
+            return "420jpeg";
+        case SIMGP_FMT_YUV422N:
+            return "422";
+        case SIMGP_FMT_YUV444:
+            return "444";
+        default:
+            return {};
+    }
+}
+
+std::unique_ptr<Source> open_y4m(std::unique_ptr<Input> input) {
+    return std::make_unique<Y4mSource>(std::move(input));
+}
+
+std::unique_ptr<Sink> y4m_sink(const std::string &path, const Tempo &tempo) {
+    return std::make_unique<Y4mSink>(path, tempo);
+}
+
+}  // namespace tools
