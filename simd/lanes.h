@@ -30,6 +30,7 @@ inline constexpr int blocks = bytes / 16;
 
 template <typename T>
 struct vec {
+    using type = T;
     static constexpr int count = bytes / (int)sizeof(T);
     T lane[count];
 };
@@ -49,7 +50,7 @@ inline To cast(From v) {
 template <typename V, typename F>
 inline V make(F f) {
     V r;
-    for (int i = 0; i < V::count; i++) r.lane[i] = static_cast<decltype(r.lane[0] + 0)>(f(i));
+    for (int i = 0; i < V::count; i++) r.lane[i] = static_cast<typename V::type>(f(i));
     return r;
 }
 

@@ -1,0 +1,429 @@
+#include "tests/rig.h"
+
+#include <signal.h>
+
+#include <cstring>
+
+#include "simd/areas.h"
+#include "simgp/simgp.h"
+
+#if defined(__SANITIZE_ADDRESS__)
+#define RIG_ASAN 1
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer)
+#define RIG_ASAN 1
+#endif
+#endif
+#ifdef RIG_ASAN
+#include <sanitizer/asan_interface.h>
+#endif
+
+// The vector rows over plain lanes, compiled for the tests alone.
+namespace simgp::lanes {
+#define DECLARE(family, area) void fill_##area(rows &);
+SIMGP_AREAS(DECLARE)
+#undef DECLARE
+}  // namespace simgp::lanes
+
+namespace rig {
+
+namespace {
+
+uint64_t number_from(const char *variable, uint64_t otherwise) {
+    const char *text = getenv(variable);
+    return text && *text ? strtoull(text, nullptr, 0) : otherwise;
+}
+
+// What runs now, for a program that ends at an inaccessible page.
+char running[512];
+
+void report_fault(int number) {
+    const char *text[] = {"\nfault in: ", running, "\n"};
+    for (const char *t : text)
+        if (write(STDERR_FILENO, t, strlen(t)) < 0) break;
+    signal(number, SIG_DFL);  // the instruction is tried again and ends the program
+}
+
+void watch_faults() {
+    static const bool watching = [] {
+        struct sigaction action = {};
+        action.sa_handler = report_fault;
+        sigaction(SIGSEGV, &action, nullptr);
+        sigaction(SIGBUS, &action, nullptr);
+        return true;
+    }();
+    (void)watching;
+}
+
+constexpr size_t reach = 128;  // bytes that are watched on either side of a destination
+
+uint8_t pattern(ptrdiff_t i, unsigned salt) {
+    return uint8_t((unsigned(i) * 0x9E3779B1u ^ salt * 0x85EBCA6Bu) >> 21);
+}
+
+}  // namespace
+
+uint64_t seed() {
+    static const uint64_t value = number_from("SIMGP_TEST_SEED", 1);
+    return value;
+}
+
+bool quick() {
+    static const bool value = number_from("SIMGP_TEST_QUICK", 0) != 0;
+    return value;
+}
+
+void fill_bytes(uint8_t *p, size_t size, content what, rng &random) {
+    static constexpr uint8_t corners[] = {0,   1,   15,  16,  17,  100, 127, 128,
+                                          129, 156, 200, 235, 236, 240, 254, 255};
+    for (size_t i = 0; i < size; i++) {
+        const uint64_t r =
+            what == content::random || what == content::extremes || what == content::corners
+                ? random.next() >> 56
+                : 0;
+        switch (what) {
+            case content::random:
+                p[i] = uint8_t(r);
+                break;
+            case content::extremes:
+                p[i] = r & 1 ? 255 : 0;
+                break;
+            case content::corners:
+                p[i] = corners[r & 15];
+                break;
+            case content::alternating:
+                p[i] = i & 1 ? 255 : 0;
+                break;
+            case content::ones:
+                p[i] = 255;
+                break;
+            default:
+                p[i] = 0;
+        }
+    }
+}
+
+// Planes and pictures
+// ------------------------------------------------------------------------------
+
+plane_shape samples(int32_t width, int32_t height, int sample_bytes) {
+    const ptrdiff_t w = width > 0 ? width : 0, h = height > 0 ? height : 0;
+    return {width, height, sample_bytes, h ? w * sample_bytes : 0, w ? h : 0};
+}
+
+static plane_shape tiles(int32_t width, int32_t rows) {
+    const ptrdiff_t w = width, tile_rows = (rows + 31) / 32;
+    const ptrdiff_t bytes =
+        8192 * ((w + 127) / 128 * (tile_rows / 2) + (tile_rows & 1) * ((w + 255) / 256));
+    return {width, rows, 1, bytes, 1};
+}
+
+std::vector<plane_shape> shapes_of(int format, int32_t w, int32_t h) {
+    const int32_t half_w = (w + 1) / 2, half_h = (h + 1) / 2;
+    const plane_shape luma = samples(w, h), quarter = samples(half_w, half_h),
+                      narrow = samples(half_w, h), wide = samples(w, half_h);
+    switch (format) {
+        case SIMGP_FMT_YUV400:
+            return {luma};
+        case SIMGP_FMT_YUV420:
+        case SIMGP_FMT_YV12:
+            return {luma, quarter, quarter};
+        case SIMGP_FMT_YUV422N:
+        case SIMGP_FMT_YV16:
+            return {luma, narrow, narrow};
+        case SIMGP_FMT_YUV422W:
+            return {luma, wide, wide};
+        case SIMGP_FMT_YUV444:
+            return {luma, luma, luma};
+        case SIMGP_FMT_NV12:
+        case SIMGP_FMT_NV21:
+            return {luma, samples(half_w, half_h, 2)};
+        case SIMGP_FMT_T64X32:
+            return {tiles(w, h), tiles(w, h / 2)};
+        case SIMGP_FMT_UYVY:
+        case SIMGP_FMT_YUYV:
+        case SIMGP_FMT_RGB565:
+        case SIMGP_FMT_BGR565:
+            return {samples(w, h, 2)};
+        case SIMGP_FMT_RGB888:
+        case SIMGP_FMT_BGR888:
+            return {samples(w, h, 3)};
+        case SIMGP_FMT_RGBA8888:
+        case SIMGP_FMT_BGRA8888:
+        case SIMGP_FMT_ARGB8888:
+            return {samples(w, h, 4)};
+        default:
+            fprintf(stderr, "shapes_of: no format %d\n", format);
+            abort();
+    }
+}
+
+placement any_placement(flush where, rng &random) {
+    static constexpr ptrdiff_t paddings[] = {0, 0, 1, 2, 3, 7, 16, 61};
+    placement p;
+    p.where = where;
+    p.gap = random.below(3) ? 0 : size_t(1 + random.below(40));
+    p.padding = paddings[random.below(8)];
+    p.bottom_up = random.below(4) == 0;
+    return p;
+}
+
+static size_t extent(const plane_shape &s, ptrdiff_t step) {
+    return s.rows ? size_t((s.rows - 1) * step + s.row_bytes) : 0;
+}
+
+plane::plane(const plane_shape &shape, const placement &place)
+    : shape_(shape),
+      stride_((shape.row_bytes + place.padding) * (place.bottom_up ? -1 : 1)),
+      memory_(extent(shape, shape.row_bytes + place.padding), place.where, place.gap),
+      first_(memory_.data()) {
+    if (place.bottom_up && shape.rows) first_ -= (shape.rows - 1) * stride_;
+}
+
+void plane::fill(content what, rng &random) {
+    fill_bytes(memory_.data(), memory_.size(), content::random, random);
+    for (ptrdiff_t y = 0; y < shape_.rows; y++)
+        fill_bytes(row(y), size_t(shape_.row_bytes), what, random);
+}
+
+void plane::fill_pattern(unsigned salt) {
+    salt_ = salt;
+    const auto [begin, end] = memory_.room(reach);
+    for (uint8_t *p = begin; p < end; p++) *p = pattern(p - memory_.data(), salt);
+}
+
+std::string plane::stray_write() const {
+    const ptrdiff_t step = stride_ < 0 ? -stride_ : stride_;
+    const auto [begin, end] = memory_.room(reach);
+    uint8_t *p = begin;
+    const auto check_to = [&](uint8_t *to) {
+        for (; p < to; p++)
+            if (*p != pattern(p - memory_.data(), salt_)) return false;
+        return true;
+    };
+    bool clean = true;
+    for (ptrdiff_t i = 0; clean && i < shape_.rows; i++) {
+        clean = check_to(memory_.data() + i * step);
+        if (clean) p += shape_.row_bytes;
+    }
+    if (clean && check_to(end)) return "";
+    const ptrdiff_t at = p - memory_.data();
+    char text[160];
+    const ptrdiff_t line = at < 0 || !step           ? 0
+                           : at / step < shape_.rows ? at / step
+                                                     : shape_.rows - 1;
+    snprintf(text, sizeof text,
+             "byte %td of memory row %td, outside the %td visible ones, was written: 0x%02x",
+             at - line * step, line, shape_.row_bytes, *p);
+    return text;
+}
+
+void plane::forbid_padding() {
+#ifdef RIG_ASAN
+    const ptrdiff_t step = stride_ < 0 ? -stride_ : stride_;
+    for (ptrdiff_t i = 0; i + 1 < shape_.rows; i++)
+        ASAN_POISON_MEMORY_REGION(memory_.data() + i * step + shape_.row_bytes,
+                                  size_t(step - shape_.row_bytes));
+    forbidden_ = true;
+#endif
+}
+
+void plane::allow_padding() {
+#ifdef RIG_ASAN
+    if (forbidden_) ASAN_UNPOISON_MEMORY_REGION(memory_.data(), memory_.size());
+#endif
+    forbidden_ = false;
+}
+
+picture::picture(const std::vector<plane_shape> &shapes, const std::vector<placement> &places) {
+    parts.reserve(shapes.size());
+    for (size_t k = 0; k < shapes.size(); k++) parts.emplace_back(shapes[k], places[k]);
+    for (size_t k = 0; k < 4; k++) {
+        const bool there = k < shapes.size();
+        planes[k] = there ? parts[k].row(0) : reinterpret_cast<uint8_t *>(uintptr_t(16));
+        widths[k] = there ? shapes[k].width : INT32_MIN;
+        heights[k] = there ? shapes[k].height : INT32_MAX;
+        strides[k] = there ? int32_t(parts[k].stride()) : INT32_MIN;
+    }
+}
+
+picture::picture(const std::vector<plane_shape> &shapes, const placement &place)
+    : picture(shapes, std::vector<placement>(shapes.size(), place)) {}
+
+void picture::fill(content what, rng &random) {
+    for (plane &p : parts) p.fill(what, random);
+}
+
+void picture::fill_pattern(unsigned salt) {
+    for (plane &p : parts) p.fill_pattern(salt);
+}
+
+std::string picture::stray_write() const {
+    for (size_t k = 0; k < parts.size(); k++) {
+        const std::string found = parts[k].stray_write();
+        if (!found.empty()) return "plane " + std::to_string(k) + ": " + found;
+    }
+    return "";
+}
+
+simgp_img picture::img(int format) const {
+    simgp_img image;
+    memset(&image, 0xA5, sizeof image);  // what is never read may hold anything
+    for (int k = 0; k < 4; k++) {
+        image.plane[k] = planes[k];
+        image.width[k] = widths[k];
+        image.height[k] = heights[k];
+        image.stride[k] = strides[k];
+    }
+    image.format = format;
+    return image;
+}
+
+std::string difference(const picture &expected, const picture &got) {
+    for (size_t k = 0; k < expected.parts.size(); k++) {
+        const plane_shape &s = expected.parts[k].shape();
+        for (ptrdiff_t y = 0; y < s.rows; y++) {
+            const uint8_t *e = expected.parts[k].row(y), *g = got.parts[k].row(y);
+            if (memcmp(e, g, size_t(s.row_bytes)) == 0) continue;
+            ptrdiff_t x = 0;
+            while (e[x] == g[x]) x++;
+            char text[200];
+            snprintf(text, sizeof text,
+                     "plane %zu: sample (%td, %td), its byte %td: expected 0x%02x, got 0x%02x", k,
+                     x / s.sample_bytes, y, x % s.sample_bytes, e[x], g[x]);
+            return text;
+        }
+    }
+    return "";
+}
+
+// Targets
+// ------------------------------------------------------------------------------------------
+
+const std::vector<target_rows> &all_targets() {
+    using simgp::target;
+    static const simgp::rows lanes = [] {
+        simgp::rows table = simgp::rows_of(target::scalar);
+#define FILL(family, area) simgp::lanes::fill_##area(table);
+        SIMGP_AREAS(FILL)
+#undef FILL
+        return table;
+    }();
+    static const std::vector<target_rows> all = [] {
+        std::vector<target_rows> found = {{"scalar", &simgp::rows_of(target::scalar)},
+                                          {"lanes", &lanes}};
+        for (int t = int(target::scalar) + 1; t < int(target::count); t++)
+            if (simgp::target_available(target(t)))
+                found.push_back({simgp::target_name(target(t)), &simgp::rows_of(target(t))});
+        return found;
+    }();
+    return all;
+}
+
+// Drivers
+// ------------------------------------------------------------------------------------------
+
+namespace {
+
+std::string describe(const picture &p) {
+    std::string text;
+    for (const plane &part : p.parts)
+        text += (text.empty() ? "" : ", ") + std::to_string(part.stride());
+    return text;
+}
+
+bool check_job(const std::string &name, int width, int height, flush where, const job &j,
+               rng &random) {
+    const auto places = [&](size_t count) {
+        std::vector<placement> p(count);
+        for (placement &place : p) place = any_placement(where, random);
+        return p;
+    };
+    const auto dst_places = places(j.dst.size());
+    picture src(j.src, places(j.src.size())), expected(j.dst, dst_places), got(j.dst, dst_places);
+    const content what = content(random.below(int(content::count) + 2) % int(content::count));
+    src.fill(what, random);
+    std::vector<std::vector<uint8_t>> before;
+    for (const plane &p : src.parts)
+        for (ptrdiff_t y = 0; y < p.shape().rows; y++)
+            before.emplace_back(p.row(y), p.row(y) + p.shape().row_bytes);
+
+    const unsigned salt = unsigned(random.next());
+    const auto run = [&](const target_rows &t, picture &dst, unsigned background) {
+        snprintf(running, sizeof running,
+                 "%s, %d x %d, %s rows, planes flush at their %s, content %d, strides %s -> %s, "
+                 "SIMGP_TEST_SEED=%llu",
+                 name.c_str(), width, height, t.name, where == flush::at_end ? "end" : "start",
+                 int(what), describe(src).c_str(), describe(dst).c_str(),
+                 (unsigned long long)seed());
+        dst.fill_pattern(background);
+        for (plane &p : src.parts) p.forbid_padding();
+        forced rows(t);
+        j.run(src, dst);
+        for (plane &p : src.parts) p.allow_padding();
+
+        std::string fault = dst.stray_write();
+        size_t i = 0;
+        for (const plane &p : src.parts)
+            for (ptrdiff_t y = 0; y < p.shape().rows; y++, i++)
+                if (memcmp(before[i].data(), p.row(y), before[i].size()) != 0)
+                    fault = "the source was written";
+        return fault;
+    };
+    for (const target_rows &t : all_targets()) {
+        const bool first = &t == &all_targets()[0];
+        std::string fault = run(t, first ? expected : got, first || j.holes ? salt : ~salt);
+        if (fault.empty() && !first) fault = difference(expected, got);
+        if (fault.empty()) continue;
+        ADD_FAILURE() << fault << "\n  in: " << running;
+        return false;
+    }
+    return true;
+}
+
+}  // namespace
+
+bool check_jobs(const std::string &name, const sweep &sizes,
+                const std::function<job(int width, int height)> &make) {
+    watch_faults();
+    rng random(seed());
+    int heights = 0;
+    const auto check = [&](int width, int height) {
+        const job j = make(width, height);
+        return check_job(name, width, height, flush::at_end, j, random) &&
+               check_job(name, width, height, flush::at_start, j, random);
+    };
+    for (int round = 0; round < (quick() ? 1 : sizes.rounds); round++)
+        for (int width = sizes.step_x; width <= sizes.max_width; width += sizes.step_x) {
+            const int height = (1 + heights++ % (sizes.max_height / sizes.step_y)) * sizes.step_y;
+            if (!check(width, height)) return false;
+        }
+    for (const auto &[width, height] : sizes.large)
+        if (!check((width + sizes.step_x - 1) / sizes.step_x * sizes.step_x,
+                   (height + sizes.step_y - 1) / sizes.step_y * sizes.step_y))
+            return false;
+    return true;
+}
+
+bool check_csc(const std::string &name, simgp_csc_fn *kernel, int from, int to,
+               const sweep &sizes) {
+    return check_jobs(name, sizes, [&](int width, int height) {
+        return job{shapes_of(from, width, height), shapes_of(to, width, height),
+                   [=](const picture &src, const picture &dst) { call(kernel, src, dst); },
+                   to == SIMGP_FMT_T64X32};
+    });
+}
+
+bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sample_bytes,
+                    int dst_sample_bytes, const sweep &sizes) {
+    return check_jobs(name, sizes, [&](int width, int height) {
+        return job{{samples(width, height, src_sample_bytes)},
+                   {samples(width, height, dst_sample_bytes)},
+                   [=](const picture &src, const picture &dst) {
+                       kernel(src.planes[0], width, height, src.strides[0], dst.strides[0],
+                              dst.planes[0]);
+                   }};
+    });
+}
+
+}  // namespace rig

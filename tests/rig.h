@@ -1,0 +1,196 @@
+// The test rig: pictures in guarded memory, seeded inputs, every target in turn, and drivers that
+// hold a kernel's vector rows against its scalar rows. A family of kernels takes a line:
+//
+//   rig::check_csc("simgp_csc_nv12_to_rgb565", simgp_csc_nv12_to_rgb565, SIMGP_FMT_NV12,
+//                  SIMGP_FMT_RGB565);
+//
+// Environment of the test programs:
+//   SIMGP_TEST_SEED=n           the seed of all random inputs (default 1); failures print it
+//   SIMGP_TEST_QUICK=1          fewer rounds and strided sweeps, for emulators
+//   SIMGP_TEST_EXPECT_TARGET=t  the rows that must be in use (see choice in simd_test.cpp)
+#ifndef TESTS_RIG_H
+#define TESTS_RIG_H
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "simd/choose.h"
+#include "simgp/img.h"
+#include "tests/guard.h"
+
+namespace rig {
+
+uint64_t seed();
+bool quick();
+
+// Random numbers, the same on every machine (splitmix64).
+class rng {
+  public:
+    explicit rng(uint64_t start) : state_(start) {}
+    uint64_t next() {
+        uint64_t z = state_ += 0x9E3779B97F4A7C15u;
+        z = (z ^ z >> 30) * 0xBF58476D1CE4E5B9u;
+        z = (z ^ z >> 27) * 0x94D049BB133111EBu;
+        return z ^ z >> 31;
+    }
+    int below(int n) { return int(next() >> 33) % n; }
+
+  private:
+    uint64_t state_;
+};
+
+// Inputs: random bytes; 0 and 255 at random; 0 and 255 in turn; values where formulas saturate or
+// change their sign; all 0; all 255.
+enum class content { random, extremes, alternating, corners, zeros, ones, count };
+void fill_bytes(uint8_t *p, size_t size, content what, rng &random);
+
+// Planes and pictures
+// ------------------------------------------------------------------------------
+
+// The visible bytes of a plane, and what a descriptor says of it.
+struct plane_shape {
+    int32_t width, height;  // the descriptor's words
+    int sample_bytes;
+    ptrdiff_t row_bytes, rows;
+};
+// width x height samples.
+plane_shape samples(int32_t width, int32_t height, int sample_bytes = 1);
+
+// The planes of a W x H picture, chroma rounded up. Of a tiled plane all bytes count as one row.
+std::vector<plane_shape> shapes_of(int format, int32_t width, int32_t height);
+
+// Where a plane lies: beside an inaccessible page or `gap` bytes away, its rows `padding` bytes
+// apart, from top to bottom or (with a negative stride) from bottom to top.
+struct placement {
+    flush where = flush::at_end;
+    size_t gap = 0;
+    ptrdiff_t padding = 0;
+    bool bottom_up = false;
+};
+placement any_placement(flush where, rng &random);
+
+class plane {
+  public:
+    plane(const plane_shape &shape, const placement &place);
+    plane(plane &&) = default;
+    ~plane() { allow_padding(); }
+
+    const plane_shape &shape() const { return shape_; }
+    ptrdiff_t stride() const { return stride_; }
+    uint8_t *row(ptrdiff_t y) const { return first_ + y * stride_; }
+
+    // As a source: random padding, visible bytes as asked.
+    void fill(content what, rng &random);
+    // As a destination: a pattern everywhere, in the surroundings too.
+    void fill_pattern(unsigned salt);
+    // The first byte outside the visible ones that no longer holds the pattern, in words; or "".
+    std::string stray_write() const;
+
+    // Under AddressSanitizer, makes the bytes between the rows inaccessible, as far as it can.
+    void forbid_padding();
+    void allow_padding();
+
+  private:
+    plane_shape shape_;
+    ptrdiff_t stride_;
+    guarded memory_;
+    uint8_t *first_;
+    unsigned salt_ = 0;
+    bool forbidden_ = false;
+};
+
+// Planes with the arrays of the kernel convention. Entries of planes that are not there hold values
+// that end the program when they are used.
+class picture {
+  public:
+    picture(const std::vector<plane_shape> &shapes, const std::vector<placement> &places);
+    // All planes packed and at the end of their memory.
+    explicit picture(const std::vector<plane_shape> &shapes, const placement &place = {});
+
+    std::vector<plane> parts;
+    uint8_t *planes[4];
+    int32_t widths[4], heights[4], strides[4];
+
+    uint8_t *row(int k, ptrdiff_t y) const { return parts[size_t(k)].row(y); }
+    void fill(content what, rng &random);
+    void fill_pattern(unsigned salt);
+    std::string stray_write() const;
+    simgp_img img(int format) const;
+};
+
+inline void call(simgp_csc_fn *kernel, const picture &src, const picture &dst) {
+    kernel(src.planes, src.widths, src.heights, src.strides, dst.strides, dst.planes);
+}
+
+// The first visible byte in which two pictures differ, in words; or "".
+std::string difference(const picture &expected, const picture &got);
+
+// Targets
+// ------------------------------------------------------------------------------------------
+
+struct target_rows {
+    const char *name;
+    const simgp::rows *rows;
+};
+// Scalar first; then `lanes`, the vector rows compiled over plain lanes; then every target that the
+// processor offers.
+const std::vector<target_rows> &all_targets();
+
+// Puts a target's rows into use, as long as it lives.
+class forced {
+  public:
+    explicit forced(const target_rows &t) { simgp::force_rows(t.rows); }
+    ~forced() { simgp::force_rows(nullptr); }
+    forced(const forced &) = delete;
+};
+
+// fn(const target_rows &) under the rows of each target.
+template <typename F>
+void for_each_target(F fn) {
+    for (const target_rows &t : all_targets()) {
+        SCOPED_TRACE(t.name);
+        forced rows(t);
+        fn(t);
+    }
+}
+
+// Drivers
+// ------------------------------------------------------------------------------------------
+
+// One call of something: the planes that it reads, those that it writes, and how it is called.
+struct job {
+    std::vector<plane_shape> src, dst;
+    std::function<void(const picture &src, const picture &dst)> run;
+    bool holes = false;  // dst has bytes that nothing writes, such as the unused slots of tiles
+};
+
+// The sizes to try: every width from 1 to two of the widest vectors and 1 more, in steps, with
+// small heights; then a few large pictures.
+struct sweep {
+    int step_x = 1, step_y = 1;  // widths and heights are multiples of these
+    int max_width = 2 * 64 + 1;
+    int max_height = 5;
+    int rounds = 2;
+    std::vector<std::pair<int, int>> large = {{640, 6}, {1918, 5}, {259, 67}};
+};
+
+// Runs the jobs of all sizes with the scalar rows and with those of every other target, on the same
+// inputs, with planes flush at their end and at their start, packed and padded, top-down and
+// bottom-up. Reports the first of these: a visible byte that differs, a byte written elsewhere, a
+// source that changed. False after a failure.
+bool check_jobs(const std::string &name, const sweep &sizes,
+                const std::function<job(int width, int height)> &make);
+
+// check_jobs for a conversion kernel between two formats, and for a kernel of one plane (whose
+// destination has the size of the source).
+bool check_csc(const std::string &name, simgp_csc_fn *kernel, int from, int to,
+               const sweep &sizes = {});
+bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sample_bytes,
+                    int dst_sample_bytes, const sweep &sizes = {});
+
+}  // namespace rig
+
+#endif
