@@ -1,0 +1,380 @@
+// simgp-bench: the comparisons, measured in rotation.
+#include "bench/bench.h"
+
+#include <benchmark/benchmark.h>
+#include <libyuv.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+#include <time.h>
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <map>
+#include <numeric>
+#include <random>
+
+#include "simd/choose.h"
+
+namespace bench {
+
+void fail(const std::string &message) {
+    fprintf(stderr, "simgp-bench: %s\n", message.c_str());
+    exit(1);
+}
+
+std::function<void()> memory_traffic(std::shared_ptr<void> keep, const uint8_t *read, size_t n,
+                                     uint8_t *written, size_t m) {
+    return [=] {
+        (void)keep;
+        const size_t both = std::min(n, m);
+        memcpy(written, read, both);
+        if (m > both) memset(written + both, 1, m - both);
+        uint8_t near[4096];
+        for (size_t i = both; i < n; i += sizeof near) {
+            memcpy(near, read + i, std::min(sizeof near, n - i));
+            benchmark::DoNotOptimize(near);
+        }
+        benchmark::ClobberMemory();
+    };
+}
+
+namespace {
+
+using simgp::target;
+
+struct settings {
+    std::vector<target> targets;
+    int rounds = 41;
+    double batch_us = 100;
+};
+
+struct quartiles {
+    double low = 0, middle = 0, high = 0;
+};
+quartiles quartiles_of(std::vector<double> v) {
+    std::sort(v.begin(), v.end());
+    const auto at = [&](double part) { return v[size_t(part * double(v.size() - 1) + 0.5)]; };
+    return {at(0.25), at(0.5), at(0.75)};
+}
+
+// One line of the table: our rows of one target.
+struct line {
+    std::string name, size, target_name, best_peer;
+    double ns = 0, peer_ns = 0;
+    quartiles peer, scalar, limit, round;  // quotients of speeds; 0: not measured
+    goal goals;
+    double round_goal = 0;
+
+    // The goals that are not met, and whether there are any at all.
+    std::string missed() const {
+        std::string text;
+        const auto want = [&](const char *what, double goal, const quartiles &got) {
+            if (goal == 0 || got.middle == 0 || got.middle >= goal) return;
+            char s[60];
+            snprintf(s, sizeof s, "%s%s %.2g", text.empty() ? "" : ", ", what, goal);
+            text += s;
+        };
+        want("peer", goals.peer, peer);
+        want("scalar", goals.scalar, scalar);
+        want("limit", goals.limit, limit);
+        want("1080p", round_goal, round);
+        return text;
+    }
+    bool has_goals() const {
+        return (goals.peer && peer.middle) || (goals.scalar && scalar.middle) ||
+               (goals.limit && limit.middle) || (round_goal && round.middle);
+    }
+};
+
+// Runs all contenders of a match in rotation; the lines have what came out.
+class rotation {
+  public:
+    rotation(const match &m, const settings &s) : m_(m), s_(s), random_(1) {
+        add(target::scalar, m.ours, m.units);
+        for (target t : s.targets) add(t, m.ours, m.units);
+        if (m.round_size)
+            for (target t : s.targets) add(t, m.round_size, m.round_units);
+        for (const contender &p : m.peers) add(target::count, p.run, m.units);
+        if (m.limit) add(target::count, m.limit, m.units);
+        order_.resize(all_.size());
+        std::iota(order_.begin(), order_.end(), size_t(0));
+        for (entry &e : all_) {
+            e.calls = std::max(1, int(s.batch_us * 1e3 / std::max(1.0, batch(e) * e.units)));
+        }
+    }
+
+    // One round; the seconds that it took.
+    double round() {
+        std::shuffle(order_.begin(), order_.end(), random_);
+        double seconds = 0;
+        for (size_t i : order_) {
+            entry &e = all_[i];
+            const double ns = batch(e);
+            e.ns.push_back(ns);
+            seconds += ns * e.units * e.calls * 1e-9;
+        }
+        return seconds;
+    }
+
+    std::vector<line> lines(const std::string &name, const std::string &size) const {
+        std::vector<line> lines;
+        const size_t first_round = 1 + s_.targets.size();
+        const size_t first_peer = first_round + (m_.round_size ? s_.targets.size() : 0);
+        const size_t limit = first_peer + m_.peers.size();
+        size_t best = first_peer;
+        for (size_t p = first_peer; p < limit; p++)
+            if (median(p) < median(best)) best = p;
+        for (size_t t = 0; t < s_.targets.size(); t++) {
+            line l;
+            l.name = name;
+            l.size = size;
+            l.target_name = simgp::target_name(s_.targets[t]);
+            l.ns = median(1 + t);
+            l.scalar = quotient(0, 1 + t);
+            if (!m_.peers.empty()) {
+                l.best_peer = m_.peers[best - first_peer].name;
+                l.peer_ns = median(best);
+                l.peer = quotient(best, 1 + t);
+            }
+            if (m_.round_size) l.round = quotient(first_round + t, 1 + t);
+            if (m_.limit) l.limit = quotient(limit, 1 + t);
+            l.goals = m_.goals;
+            l.round_goal = m_.round_goal;
+            lines.push_back(l);
+        }
+        return lines;
+    }
+
+    // Median times by contender.
+    std::map<std::string, double> times() const {
+        std::map<std::string, double> times;
+        times["scalar_ns"] = median(0);
+        for (size_t t = 0; t < s_.targets.size(); t++)
+            times[std::string(simgp::target_name(s_.targets[t])) + "_ns"] = median(1 + t);
+        const size_t first_peer = 1 + s_.targets.size() * (m_.round_size ? 2 : 1);
+        for (size_t p = 0; p < m_.peers.size(); p++)
+            times[m_.peers[p].name + "_ns"] = median(first_peer + p);
+        if (m_.limit) times["limit_ns"] = median(all_.size() - 1);
+        return times;
+    }
+
+  private:
+    struct entry {
+        target rows;  // count: not ours
+        std::function<void()> run;
+        double units;
+        int calls;
+        std::vector<double> ns;  // per unit, by round
+    };
+
+    void add(target rows, const std::function<void()> &run, double units) {
+        all_.push_back({rows, run, units, 1, {}});
+    }
+
+    // Time of this thread: what others run on the machine meanwhile does not count, but for what it
+    // takes of caches and memory.
+    static double cpu_ns() {
+        timespec t;
+        clock_gettime(CLOCK_THREAD_CPUTIME_ID, &t);
+        return double(t.tv_sec) * 1e9 + double(t.tv_nsec);
+    }
+
+    // A batch; nanoseconds per unit. Processors switch the upper lanes of their vector units off
+    // when these have not been used for half a millisecond, and run at a quarter of their speed
+    // for up to 150 microseconds when they switch them on: so each contender warms up unmeasured.
+    static double batch(const entry &e) {
+        const auto run = [&e](int calls) {
+            const double start = cpu_ns();
+            for (int i = 0; i < calls; i++) e.run();
+            return cpu_ns() - start;
+        };
+        if (e.rows != target::count) simgp::force_rows(&simgp::rows_of(e.rows));
+        for (double warm = 0; warm < 200e3;) warm += run(1);
+        const double ns = run(e.calls);
+        simgp::force_rows(nullptr);
+        return ns / e.calls / e.units;
+    }
+
+    double median(size_t i) const { return quartiles_of(all_[i].ns).middle; }
+
+    // Speed of `mine` divided by that of `other`.
+    quartiles quotient(size_t other, size_t mine) const {
+        std::vector<double> q;
+        for (size_t r = 0; r < all_[mine].ns.size(); r++)
+            q.push_back(all_[other].ns[r] / all_[mine].ns[r]);
+        return quartiles_of(q);
+    }
+
+    match m_;
+    settings s_;
+    std::mt19937 random_;
+    std::vector<entry> all_;
+    std::vector<size_t> order_;
+};
+
+// Prints the lines that the benchmarks leave behind.
+class table : public benchmark::BenchmarkReporter {
+  public:
+    std::vector<line> fresh;
+    int met = 0;
+    std::vector<std::string> short_of;
+
+    bool ReportContext(const Context &) override {
+        print("operation", "size", "rows", "ns", "x scalar", "best peer", "its ns", "x peer",
+              "quartiles", "x limit", "x 1080p", "goals");
+        print("-", "-", "-", "-", "-", "-", "-", "-", "-", "-", "-", "-");
+        return true;
+    }
+
+    void ReportRuns(const std::vector<Run> &) override {
+        for (const line &l : fresh) {
+            const std::string missed = l.missed();
+            if (!missed.empty())
+                short_of.push_back(l.name + " " + l.size + " " + l.target_name + ": " + missed);
+            met += l.has_goals() && missed.empty();
+            const std::string spread =
+                l.peer.middle ? number(l.peer.low) + "-" + number(l.peer.high) : "";
+            print(l.name, l.size, l.target_name, number(l.ns, 3), number(l.scalar.middle, 1),
+                  l.best_peer, number(l.peer_ns, 3), number(l.peer.middle), spread,
+                  number(l.limit.middle), number(l.round.middle),
+                  !missed.empty() ? "SHORT: " + missed
+                  : l.has_goals() ? "met"
+                                  : "");
+        }
+        fflush(stdout);
+        fresh.clear();
+    }
+
+  private:
+    static std::string number(double v, int digits = 2) {
+        if (v == 0) return "";
+        char s[40];
+        snprintf(s, sizeof s, "%.*f", digits, v);
+        return s;
+    }
+
+    template <class... Cells>
+    static void print(const Cells &...cells) {
+        static constexpr int widths[] = {-26, -9, -6, 6, 8, -15, 6, 6, -11, 7, 7, -24};
+        int column = 0;
+        const auto one = [&](const std::string &cell) {
+            const int w = widths[column++];
+            if (cell == "-")
+                printf("|%s",
+                       std::string(size_t(abs(w)) + 1, '-').append(w > 0 ? ":" : "-").c_str());
+            else
+                printf("| %*s ", w, cell.c_str());
+        };
+        (one(cells), ...);
+        printf("|\n");
+    }
+};
+
+// Leaves libyuv the instruction sets up to one; "all" is its own choice.
+void limit_libyuv(const std::string &set) {
+    using namespace libyuv;
+    if (set == "all") return;
+    int flags = kCpuInitialized | kCpuHasX86 | kCpuHasSSE2 | kCpuHasSSSE3 | kCpuHasSSE41;
+    if (set == "avx2")
+        flags |= kCpuHasSSE42 | kCpuHasAVX | kCpuHasAVX2 | kCpuHasERMS | kCpuHasFMA3 | kCpuHasF16C;
+    else if (set != "sse41")
+        fail("--libyuv takes all, avx2 or sse41");
+    MaskCpuFlags(flags);
+}
+
+std::vector<target> parse_targets(const std::vector<std::string> &names) {
+    std::vector<target> targets;
+    for (int i = 1; i < int(target::count); i++) {
+        const target t = target(i);
+        const bool named =
+            std::find(names.begin(), names.end(), simgp::target_name(t)) != names.end();
+        const bool of_itself =
+            names.empty() && (t == target::avx2 || t == target::avx512 || t == target::neon);
+        if (!simgp::target_available(t)) {
+            if (named) fail(std::string(simgp::target_name(t)) + " is not available here");
+        } else if (named || of_itself) {
+            targets.push_back(t);
+        }
+    }
+    if (targets.empty()) targets.push_back(simgp::live_target());
+    return targets;
+}
+
+int run(int argc, char **argv) {
+    CLI::App app(
+        "Measures the library against libyuv, swscale, OpenCV, its own scalar rows, and memcpy and "
+        "memset\nof the same bytes, all in rotation. Times are nanoseconds per pixel (or byte); "
+        "'x' columns are\nquotients of speeds, ours divided by the other's, medians over the "
+        "rounds.");
+    app.footer(
+        "Options of Google Benchmark (--benchmark_...) are passed on.\n\n"
+        "  simgp-bench --quick\n"
+        "  simgp-bench --filter 'nv12_to' --size 1920x1080 --target avx2\n"
+        "  simgp-bench --json speed.json");
+    settings s;
+    std::string filter = ".", json, libyuv_set = "all";
+    std::vector<std::string> sizes, target_names;
+    bool quick = false, list = false;
+    app.add_option("--filter", filter, "only operations whose name matches this expression");
+    app.add_option("--size", sizes, "only these sizes, such as 1920x1080 (any size may be named)");
+    app.add_option("--target", target_names,
+                   "instruction sets (neon, sse41, avx2, avx512); otherwise avx2, avx512, neon");
+    app.add_option("--rounds", s.rounds, "rounds per comparison; a third for large pictures")
+        ->check(CLI::PositiveNumber);
+    app.add_option("--batch", s.batch_us, "microseconds a batch takes at least")
+        ->check(CLI::PositiveNumber);
+    app.add_option("--libyuv", libyuv_set, "instruction sets for libyuv: all, avx2, sse41");
+    app.add_option("--json", json, "write all times to this file as well");
+    app.add_flag("--quick", quick, "320x240 and 1920x1080 alone, few rounds");
+    app.add_flag("--list", list, "list the operations and sizes");
+    app.allow_extras();
+    CLI11_PARSE(app, argc, argv);
+
+    if (quick) {
+        if (sizes.empty()) sizes = {"320x240", "1920x1080"};
+        s.rounds = std::min(s.rounds, 15);
+    }
+    s.targets = parse_targets(target_names);
+    limit_libyuv(libyuv_set);
+
+    table out;
+    for (const comparison &c : yuv2rgb_comparisons()) {
+        const std::vector<std::string> &chosen = sizes.empty() ? c.sizes : sizes;
+        for (const std::string &size : chosen) {
+            const auto body = [&out, c, size, s](benchmark::State &state) {
+                rotation r(c.make(size), s);
+                for (auto _ : state) state.SetIterationTime(r.round());
+                for (const auto &[name, ns] : r.times()) state.counters[name] = ns;
+                out.fresh = r.lines(c.name, size);
+            };
+            int width = 0, height = 0;
+            sscanf(size.c_str(), "%dx%d", &width, &height);
+            const bool large = double(width) * height > 4e6;
+            benchmark::RegisterBenchmark((c.name + "/" + size).c_str(), body)
+                ->UseManualTime()
+                ->Iterations(large ? (s.rounds + 2) / 3 : s.rounds);
+        }
+    }
+
+    std::vector<std::string> words = {argv[0], "--benchmark_filter=" + filter};
+    if (!json.empty()) words.push_back("--benchmark_out=" + json);
+    if (list) words.push_back("--benchmark_list_tests");
+    for (const std::string &w : app.remaining()) words.push_back(w);
+    std::vector<char *> arguments;
+    for (std::string &w : words) arguments.push_back(w.data());
+    int count = int(arguments.size());
+    benchmark::Initialize(&count, arguments.data());
+    if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) return 1;
+    if (benchmark::RunSpecifiedBenchmarks(&out) == 0) return 1;
+    if (list) return 0;
+    printf("\n%d lines meet their goals, %d fall short", out.met, int(out.short_of.size()));
+    for (const std::string &text : out.short_of) printf("\n  %s", text.c_str());
+    printf("\n");
+    return 0;
+}
+
+}  // namespace
+}  // namespace bench
+
+int main(int argc, char **argv) { return bench::run(argc, argv); }

@@ -1,0 +1,69 @@
+// The frame of the benchmarks: a comparison is one operation at one size, done by our rows of
+// several targets, by the peers, and by memcpy and memset of the same bytes, all in one rotation.
+//
+// A machine is never quiet, so contenders are not measured one after the other. A round runs a
+// short batch of each, in an order that changes from round to round; every figure is the median
+// over the rounds, and ratios are taken within a round before the median is. What disturbs the
+// machine for longer than a round disturbs all contenders alike; what is shorter falls out of the
+// median.
+#ifndef BENCH_BENCH_H
+#define BENCH_BENCH_H
+
+#include <functional>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "simgp/img.h"
+
+namespace bench {
+
+// What a comparison has to reach; 0 where nothing is asked. All are quotients of speeds, ours
+// divided by the other's.
+struct goal {
+    double peer = 0;    // against the fastest peer
+    double scalar = 4;  // against our scalar rows
+    double limit = 0;   // against memcpy and memset of the same bytes
+};
+
+struct contender {
+    std::string name;
+    std::function<void()> run;
+};
+
+// One operation at one size, ready to run. The closures keep alive what they work on.
+struct match {
+    double units;                  // pixels (or bytes) that a run deals with
+    std::function<void()> ours;    // run once for every target
+    std::vector<contender> peers;  // what `ours` is held against
+    std::function<void()> limit;   // memory traffic of the same bytes; may be empty
+    goal goals;
+
+    // The same operation at a rounder size, for the cost of odd sizes; may be empty.
+    std::function<void()> round_size = {};
+    double round_units = 0;
+    double round_goal = 0;
+};
+
+// An operation. make(size) prepares a match, and ends the program if a peer does not compute the
+// same as we do.
+struct comparison {
+    std::string name;
+    std::vector<std::string> sizes;  // names of sizes, for make
+    std::function<match(const std::string &size)> make;
+};
+
+// What `n` bytes read and `m` bytes written cost at least: memcpy of the bytes in common, then
+// memset, or reads that leave the cache alone, of the others. Memory of both must exist.
+std::function<void()> memory_traffic(std::shared_ptr<void> keep, const uint8_t *read, size_t n,
+                                     uint8_t *written, size_t m);
+
+// Ends the program with a message on stderr.
+[[noreturn]] void fail(const std::string &message);
+
+// Each area's comparisons (bench/<area>_bench.cpp).
+std::vector<comparison> yuv2rgb_comparisons();
+
+}  // namespace bench
+
+#endif

@@ -1,0 +1,307 @@
+#include "bench/picture.h"
+
+#include <math.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+
+#include <algorithm>
+#include <chrono>
+
+extern "C" {
+#include <libavutil/log.h>
+#include <libswscale/swscale.h>
+}
+
+#include "simgp/csc.h"
+
+namespace bench {
+namespace {
+
+// A plane as a repeated group of bytes: Y U V R G B A, or w, W for the two bytes of a word of
+// 16-bit RGB.
+struct plane_shape {
+    const char *group;
+    int group_pixels_log2, rows_log2;
+};
+struct format_shape {
+    int format;
+    const char *name;
+    AVPixelFormat swscale;
+    plane_shape planes[3];
+};
+
+// clang-format off
+constexpr format_shape formats[] = {
+    {SIMGP_FMT_YUV400,   "yuv400",   AV_PIX_FMT_GRAY8,    {{"Y", 0, 0}}},
+    {SIMGP_FMT_YUV420,   "yuv420",   AV_PIX_FMT_YUV420P,  {{"Y", 0, 0}, {"U", 1, 1}, {"V", 1, 1}}},
+    {SIMGP_FMT_YUV422N,  "yuv422n",  AV_PIX_FMT_YUV422P,  {{"Y", 0, 0}, {"U", 1, 0}, {"V", 1, 0}}},
+    {SIMGP_FMT_YUV444,   "yuv444",   AV_PIX_FMT_YUV444P,  {{"Y", 0, 0}, {"U", 0, 0}, {"V", 0, 0}}},
+    {SIMGP_FMT_YV12,     "yv12",     AV_PIX_FMT_YUV420P,  {{"Y", 0, 0}, {"V", 1, 1}, {"U", 1, 1}}},
+    {SIMGP_FMT_YV16,     "yv16",     AV_PIX_FMT_YUV422P,  {{"Y", 0, 0}, {"V", 1, 0}, {"U", 1, 0}}},
+    {SIMGP_FMT_NV12,     "nv12",     AV_PIX_FMT_NV12,     {{"Y", 0, 0}, {"UV", 1, 1}}},
+    {SIMGP_FMT_NV21,     "nv21",     AV_PIX_FMT_NV21,     {{"Y", 0, 0}, {"VU", 1, 1}}},
+    {SIMGP_FMT_YUV422W,  "yuv422w",  AV_PIX_FMT_YUV440P,  {{"Y", 0, 0}, {"U", 0, 1}, {"V", 0, 1}}},
+    {SIMGP_FMT_UYVY,     "uyvy",     AV_PIX_FMT_UYVY422,  {{"UYVY", 1, 0}}},
+    {SIMGP_FMT_YUYV,     "yuyv",     AV_PIX_FMT_YUYV422,  {{"YUYV", 1, 0}}},
+    {SIMGP_FMT_RGB565,   "rgb565",   AV_PIX_FMT_RGB565LE, {{"wW", 0, 0}}},
+    {SIMGP_FMT_BGR565,   "bgr565",   AV_PIX_FMT_BGR565LE, {{"wW", 0, 0}}},
+    {SIMGP_FMT_RGB888,   "rgb888",   AV_PIX_FMT_RGB24,    {{"RGB", 0, 0}}},
+    {SIMGP_FMT_BGR888,   "bgr888",   AV_PIX_FMT_BGR24,    {{"BGR", 0, 0}}},
+    {SIMGP_FMT_RGBA8888, "rgba8888", AV_PIX_FMT_RGBA,     {{"RGBA", 0, 0}}},
+    {SIMGP_FMT_BGRA8888, "bgra8888", AV_PIX_FMT_BGRA,     {{"BGRA", 0, 0}}},
+    {SIMGP_FMT_ARGB8888, "argb8888", AV_PIX_FMT_ARGB,     {{"ARGB", 0, 0}}},
+};
+// clang-format on
+
+const format_shape &shape_of(int format) {
+    for (const format_shape &s : formats)
+        if (s.format == format) return s;
+    fail("no such format: " + std::to_string(format));
+}
+
+// The value of a channel at (x, y), each 0 ... 1.
+double channel(char name, double x, double y) {
+    switch (name) {
+        case 'Y':
+            return 16 + 219 * (0.8 * x + 0.2 * y);
+        case 'U':
+            return 128 + 90 * sin(6 * y + 2 * x);
+        case 'V':
+            return 128 + 90 * cos(5 * x - 3 * y);
+        case 'R':
+            return 255 * x;
+        case 'G':
+            return 255 * y;
+        case 'B':
+            return 127.5 + 127.5 * sin(4 * (x + y));
+        default:
+            return 255;
+    }
+}
+
+int to_word(int format, int r, int g, int b) {
+    if (format == SIMGP_FMT_BGR565) std::swap(r, b);
+    return r >> 3 << 11 | g >> 2 << 5 | b >> 3;
+}
+
+// Calls f(channel, value) for the channels of the byte; for a word's two bytes at its first.
+template <class F>
+void for_channels(int format, char name, const uint8_t *at, const F &f) {
+    if (name == 'W') return;
+    if (name != 'w') return f(name, *at);
+    const int word = at[0] | at[1] << 8;
+    const bool bgr = format == SIMGP_FMT_BGR565;
+    f(bgr ? 'B' : 'R', (word >> 11) * 255 / 31);
+    f('G', (word >> 5 & 63) * 255 / 63);
+    f(bgr ? 'R' : 'B', (word & 31) * 255 / 31);
+}
+
+// Calls f(name, byte, x, y), with x and y in 0 ... 1, for the bytes of all planes.
+template <class F>
+void for_bytes(const picture &p, const F &f) {
+    const format_shape &shape = shape_of(p.format);
+    for (int k = 0; k < 3 && shape.planes[k].group; k++) {
+        const plane_shape &plane = shape.planes[k];
+        const int size = int(strlen(plane.group));
+        const int groups =
+            (p.width[0] + (1 << plane.group_pixels_log2) - 1) >> plane.group_pixels_log2;
+        for (int y = 0; y < p.height[k]; y++) {
+            uint8_t *line = p.plane[k] + ptrdiff_t(y) * p.stride[k];
+            for (int g = 0; g < groups; g++)
+                for (int i = 0; i < size; i++)
+                    f(plane.group[i], line + g * size + i, double(g) / groups,
+                      double(y) / p.height[k]);
+        }
+    }
+}
+
+AVPixelFormat swscale_format(int format) { return shape_of(format).swscale; }
+
+bool v_before_u(int format) { return format == SIMGP_FMT_YV12 || format == SIMGP_FMT_YV16; }
+
+double microseconds(const std::function<void()> &f) {
+    const auto start = std::chrono::steady_clock::now();
+    f();
+    return std::chrono::duration<double, std::micro>(std::chrono::steady_clock::now() - start)
+        .count();
+}
+
+}  // namespace
+
+picture::picture(int format, int w, int h) : simgp_img{} {
+    this->format = format;
+    const format_shape &shape = shape_of(format);
+    size_t offsets[3] = {};
+    bytes = 0;
+    for (int k = 0; k < 3 && shape.planes[k].group; k++) {
+        const plane_shape &s = shape.planes[k];
+        const int groups = (w + (1 << s.group_pixels_log2) - 1) >> s.group_pixels_log2;
+        width[k] = k ? groups : w;
+        height[k] = (h + (1 << s.rows_log2) - 1) >> s.rows_log2;
+        stride[k] = (groups * int(strlen(s.group)) + 63) & -64;
+        offsets[k] = bytes;
+        bytes += size_t(stride[k]) * size_t(height[k]);
+    }
+    memory.reset(static_cast<uint8_t *>(aligned_alloc(4096, (bytes + 4095) & ~size_t(4095))), free);
+    memset(memory.get(), 0xA5, bytes);
+    for (int k = 0; k < 3 && shape.planes[k].group; k++) plane[k] = memory.get() + offsets[k];
+}
+
+void paint(const picture &p) {
+    uint32_t state = 1;
+    for_bytes(p, [&](char name, uint8_t *at, double x, double y) {
+        const auto value = [&](char c) {
+            state = state * 1664525 + 1013904223;
+            const double noise = c == 'U' || c == 'V' ? 0 : (state >> 24) / 128.0 - 1;
+            return int(std::clamp(channel(c, x, y) + noise, 0.0, 255.0));
+        };
+        if (name == 'W') return;
+        if (name != 'w') {
+            *at = uint8_t(value(name));
+            return;
+        }
+        const int word = to_word(p.format, value('R'), value('G'), value('B'));
+        at[0] = uint8_t(word);
+        at[1] = uint8_t(word >> 8);
+    });
+}
+
+void expect_alike(const std::string &what, const picture &a, const picture &b, double tolerance) {
+    double sums[128] = {}, counts[128] = {};
+    const ptrdiff_t to_b = b.memory.get() - a.memory.get();
+    for_bytes(a, [&](char name, uint8_t *at, double, double) {
+        int values[3], n = 0;
+        for_channels(a.format, name, at, [&](char, int value) { values[n++] = value; });
+        n = 0;
+        for_channels(a.format, name, at + to_b, [&](char c, int value) {
+            sums[int(c)] += abs(values[n++] - value);
+            counts[int(c)]++;
+        });
+    });
+    for (int c = 0; c < 128; c++) {
+        if (counts[c] == 0 || sums[c] / counts[c] <= tolerance) continue;
+        char text[100];
+        snprintf(text, sizeof text, ": channel %c differs by %.1f of 255 on average", c,
+                 sums[c] / counts[c]);
+        fail(what + text);
+    }
+}
+
+simgp_img lines(const simgp_img &p, int y, int count) {
+    simgp_img part = p;
+    const format_shape &shape = shape_of(p.format);
+    for (int k = 0; k < 3 && shape.planes[k].group; k++) {
+        const int log2 = shape.planes[k].rows_log2;
+        part.plane[k] += ptrdiff_t(y >> log2) * p.stride[k];
+        part.height[k] = (count + (1 << log2) - 1) >> log2;
+    }
+    return part;
+}
+
+peer libyuv_peer(operation f) {
+    return {"libyuv", [f](const simgp_img &, const simgp_img &) { return f; }};
+}
+
+peer libyuv_peer(operation first, int between, operation second) {
+    return {"libyuv, 2 steps", [=](const simgp_img &s, const simgp_img &) -> operation {
+                constexpr int band = 8;
+                const picture temporary(between, s.width[0], band);
+                return [=](const simgp_img &src, const simgp_img &dst) {
+                    for (int y = 0; y < src.height[0]; y += band) {
+                        const int count = std::min(band, src.height[0] - y);
+                        const simgp_img from = lines(src, y, count);
+                        const simgp_img mid = lines(temporary, 0, count);
+                        first(from, mid);
+                        second(mid, lines(dst, y, count));
+                    }
+                };
+            }};
+}
+
+std::vector<peer> swscale_peer(int from, int to, int extra_flags) {
+    av_log_set_level(AV_LOG_ERROR);
+    const AVPixelFormat a = swscale_format(from), b = swscale_format(to);
+    if (a == b || !sws_isSupportedInput(a) || !sws_isSupportedOutput(b)) return {};
+    const bool swap_src = v_before_u(from), swap_dst = v_before_u(to);
+
+    const operation_maker make = [=](const simgp_img &src, const simgp_img &dst) {
+        operation best;
+        double least = 0;
+        for (const int flags : {SWS_POINT, SWS_FAST_BILINEAR, SWS_BILINEAR}) {
+            std::shared_ptr<SwsContext> context(
+                sws_getContext(src.width[0], src.height[0], a, src.width[0], src.height[0], b,
+                               flags | extra_flags, nullptr, nullptr, nullptr),
+                sws_freeContext);
+            if (!context) continue;
+            const operation convert = [=](const simgp_img &s, const simgp_img &d) {
+                const uint8_t *from_planes[4] = {s.plane[0], s.plane[1 + swap_src],
+                                                 s.plane[2 - swap_src], nullptr};
+                const int from_strides[4] = {s.stride[0], s.stride[1 + swap_src],
+                                             s.stride[2 - swap_src], 0};
+                uint8_t *to_planes[4] = {d.plane[0], d.plane[1 + swap_dst], d.plane[2 - swap_dst],
+                                         nullptr};
+                const int to_strides[4] = {d.stride[0], d.stride[1 + swap_dst],
+                                           d.stride[2 - swap_dst], 0};
+                sws_scale(context.get(), from_planes, from_strides, 0, s.height[0], to_planes,
+                          to_strides);
+            };
+            const auto run = [&] { convert(src, dst); };
+            run();
+            const double time = std::min({microseconds(run), microseconds(run), microseconds(run)});
+            if (!best || time < least) best = convert, least = time;
+        }
+        if (!best) fail("swscale makes no context");
+        return best;
+    };
+    return {{"swscale", make}};
+}
+
+comparison compare(conversion c) {
+    if (c.name.empty()) c.name = std::string(shape_of(c.from).name) + "_to_" + shape_of(c.to).name;
+    if (!c.ours)
+        c.ours = [name = c.name](const simgp_img &s, const simgp_img &d) {
+            if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
+        };
+    if (c.swscale)
+        for (peer &p : swscale_peer(c.from, c.to)) c.peers.push_back(std::move(p));
+
+    const auto make = [c](const std::string &size) {
+        int width = 0, height = 0;
+        if (sscanf(size.c_str(), "%dx%d", &width, &height) != 2) fail("no size: " + size);
+        const picture src(c.from, width, height), dst(c.to, width, height);
+        paint(src);
+        c.ours(src, dst);
+
+        match m{};
+        m.units = double(src.pixels());
+        m.ours = [ours = c.ours, src, dst] { ours(src, dst); };
+        const picture other(c.to, width, height);
+        for (const peer &p : c.peers) {
+            const operation convert = p.make(src, other);
+            memset(other.memory.get(), 0xA5, other.bytes);
+            convert(src, other);
+            expect_alike(c.name + " by " + p.name, dst, other, c.tolerance);
+            m.peers.push_back({p.name, [=] { convert(src, dst); }});
+        }
+        m.limit = memory_traffic(src.memory, src.plane[0], src.bytes, dst.memory.get(), dst.bytes);
+
+        // Where a goal asks for the speed of memory, it is that of pictures beyond the cache, and
+        // the peer's that of those inside.
+        const bool in_cache = size == "320x240", usual = in_cache || size == "1920x1080";
+        if (usual) m.goals.scalar = c.goals.scalar;
+        if (c.goals.limit > 0 ? in_cache : usual) m.goals.peer = c.goals.peer;
+        if (size == "3840x2160") m.goals.limit = c.goals.limit;
+        if (size == "1918x1078") {
+            const picture round_src(c.from, 1920, 1080), round_dst(c.to, 1920, 1080);
+            paint(round_src);
+            m.round_size = [ours = c.ours, round_src, round_dst] { ours(round_src, round_dst); };
+            m.round_units = double(round_src.pixels());
+            m.round_goal = 0.9;
+        }
+        return m;
+    };
+    return {c.name, {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"}, make};
+}
+
+}  // namespace bench

@@ -1,0 +1,87 @@
+// Pictures for the benchmarks, and comparisons of conversions between two formats.
+#ifndef BENCH_PICTURE_H
+#define BENCH_PICTURE_H
+
+#include "bench/bench.h"
+
+namespace bench {
+
+// A descriptor with memory: planes on cache lines, lines padded to whole cache lines.
+struct picture : simgp_img {
+    picture(int format, int width, int height);
+
+    std::shared_ptr<uint8_t[]> memory;  // all planes, one after the other
+    size_t bytes;                       // of the planes
+
+    int pixels() const { return width[0] * height[0]; }
+};
+
+// Fills a picture with smooth colours and a little noise. Peers that interpolate or average chroma
+// then differ little from those that repeat or drop it.
+void paint(const picture &p);
+
+// Ends the program unless b shows what a shows: of each channel, the mean difference may be
+// `tolerance` of 255. Both have the same format and size.
+void expect_alike(const std::string &what, const picture &a, const picture &b, double tolerance);
+
+// A part of a picture: `count` lines from line y on; y is even.
+simgp_img lines(const simgp_img &p, int y, int count);
+
+using operation = std::function<void(const simgp_img &src, const simgp_img &dst)>;
+
+// What is made once for one pair of pictures, such as a scaler's context.
+using operation_maker = std::function<operation(const simgp_img &src, const simgp_img &dst)>;
+
+struct peer {
+    std::string name;
+    operation_maker make;
+};
+
+// A libyuv function over the first `From` planes of the source and `To` of the destination:
+// pointer, stride, pointer, stride, ..., what is given in `more`, width, height.
+template <int From, int To, class Function, class... More>
+operation of_planes(Function *f, More... more) {
+    return [=](const simgp_img &s, const simgp_img &d) {
+        const auto to = [&](auto... args) {
+            if constexpr (To == 1)
+                f(args..., d.plane[0], d.stride[0], more..., s.width[0], s.height[0]);
+            else if constexpr (To == 2)
+                f(args..., d.plane[0], d.stride[0], d.plane[1], d.stride[1], more..., s.width[0],
+                  s.height[0]);
+            else
+                f(args..., d.plane[0], d.stride[0], d.plane[1], d.stride[1], d.plane[2],
+                  d.stride[2], more..., s.width[0], s.height[0]);
+        };
+        if constexpr (From == 1)
+            to(s.plane[0], s.stride[0]);
+        else if constexpr (From == 2)
+            to(s.plane[0], s.stride[0], s.plane[1], s.stride[1]);
+        else
+            to(s.plane[0], s.stride[0], s.plane[1], s.stride[1], s.plane[2], s.stride[2]);
+    };
+}
+
+// libyuv as a peer; in two steps over a band of lines that stays in the cache, where it has no
+// direct way.
+peer libyuv_peer(operation f);
+peer libyuv_peer(operation first, int between, operation second);
+
+// swscale, with whichever of its fast modes takes least time. Nothing where it does not know the
+// formats.
+std::vector<peer> swscale_peer(int from, int to, int extra_flags = 0);
+
+// The conversion from one format to another at the usual sizes, ours by `ours`.
+struct conversion {
+    int from, to;
+    goal goals;
+    std::vector<peer> peers = {};  // besides swscale
+    std::string name = {};         // of itself "nv12_to_rgb565"
+    operation ours = {};           // of itself simgp_csc
+    double tolerance = 4;
+    bool swscale = true;
+};
+comparison compare(conversion c);
+
+}  // namespace bench
+
+#endif
