@@ -349,17 +349,26 @@ bool check_job(const std::string &name, int width, int height, flush where, cons
             before.emplace_back(p.row(y), p.row(y) + p.shape().row_bytes);
 
     const unsigned salt = unsigned(random.next());
-    const auto run = [&](const target_rows &t, picture &dst, unsigned background) {
+    const bool by_reference = bool(j.reference);
+    if (by_reference) {
+        expected.fill_pattern(salt);
+        j.reference(src, expected);
+    }
+    for (const target_rows &t : all_targets()) {
+        const bool defines = &t == &all_targets()[0] && !by_reference;
+        picture &dst = defines ? expected : got;
         snprintf(running, sizeof running,
                  "%s, %d x %d, %s rows, planes flush at their %s, content %d, strides %s -> %s, "
                  "SIMGP_TEST_SEED=%llu",
                  name.c_str(), width, height, t.name, where == flush::at_end ? "end" : "start",
                  int(what), describe(src).c_str(), describe(dst).c_str(),
                  (unsigned long long)seed());
-        dst.fill_pattern(background);
+        dst.fill_pattern(defines || j.holes ? salt : ~salt);
         for (plane &p : src.parts) p.forbid_padding();
-        forced rows(t);
-        j.run(src, dst);
+        {
+            forced rows(t);
+            j.run(src, dst);
+        }
         for (plane &p : src.parts) p.allow_padding();
 
         std::string fault = dst.stray_write();
@@ -368,12 +377,7 @@ bool check_job(const std::string &name, int width, int height, flush where, cons
             for (ptrdiff_t y = 0; y < p.shape().rows; y++, i++)
                 if (memcmp(before[i].data(), p.row(y), before[i].size()) != 0)
                     fault = "the source was written";
-        return fault;
-    };
-    for (const target_rows &t : all_targets()) {
-        const bool first = &t == &all_targets()[0];
-        std::string fault = run(t, first ? expected : got, first || j.holes ? salt : ~salt);
-        if (fault.empty() && !first) fault = difference(expected, got);
+        if (fault.empty() && !defines) fault = difference(expected, got);
         if (fault.empty()) continue;
         ADD_FAILURE() << fault << "\n  in: " << running;
         return false;
@@ -405,12 +409,12 @@ bool check_jobs(const std::string &name, const sweep &sizes,
     return true;
 }
 
-bool check_csc(const std::string &name, simgp_csc_fn *kernel, int from, int to,
-               const sweep &sizes) {
+bool check_csc(const std::string &name, simgp_csc_fn *kernel, int from, int to, const sweep &sizes,
+               const std::function<void(const picture &src, const picture &dst)> &reference) {
     return check_jobs(name, sizes, [&](int width, int height) {
         return job{shapes_of(from, width, height), shapes_of(to, width, height),
                    [=](const picture &src, const picture &dst) { call(kernel, src, dst); },
-                   to == SIMGP_FMT_T64X32};
+                   reference, to == SIMGP_FMT_T64X32};
     });
 }
 
@@ -422,7 +426,8 @@ bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sam
                    [=](const picture &src, const picture &dst) {
                        kernel(src.planes[0], width, height, src.strides[0], dst.strides[0],
                               dst.planes[0]);
-                   }};
+                   },
+                   nullptr};
     });
 }
 

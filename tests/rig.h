@@ -164,6 +164,8 @@ void for_each_target(F fn) {
 struct job {
     std::vector<plane_shape> src, dst;
     std::function<void(const picture &src, const picture &dst)> run;
+    // Writes what is right, independently of the library; null: the scalar rows are right.
+    std::function<void(const picture &src, const picture &dst)> reference;
     bool holes = false;  // dst has bytes that nothing writes, such as the unused slots of tiles
 };
 
@@ -177,17 +179,18 @@ struct sweep {
     std::vector<std::pair<int, int>> large = {{640, 6}, {1918, 5}, {259, 67}};
 };
 
-// Runs the jobs of all sizes with the scalar rows and with those of every other target, on the same
-// inputs, with planes flush at their end and at their start, packed and padded, top-down and
-// bottom-up. Reports the first of these: a visible byte that differs, a byte written elsewhere, a
-// source that changed. False after a failure.
+// Runs the jobs of all sizes with the rows of every target, on the same inputs, with planes flush
+// at their end and at their start, packed and padded, top-down and bottom-up. Reports the first of
+// these: a visible byte that differs from the reference or the scalar rows, a byte written
+// elsewhere, a source that changed. False after a failure.
 bool check_jobs(const std::string &name, const sweep &sizes,
                 const std::function<job(int width, int height)> &make);
 
 // check_jobs for a conversion kernel between two formats, and for a kernel of one plane (whose
 // destination has the size of the source).
-bool check_csc(const std::string &name, simgp_csc_fn *kernel, int from, int to,
-               const sweep &sizes = {});
+bool check_csc(
+    const std::string &name, simgp_csc_fn *kernel, int from, int to, const sweep &sizes = {},
+    const std::function<void(const picture &src, const picture &dst)> &reference = nullptr);
 bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sample_bytes,
                     int dst_sample_bytes, const sweep &sizes = {});
 

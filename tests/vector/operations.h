@@ -1,0 +1,97 @@
+// Every operation of the vector layer on bytes in memory. Included twice for a target, in the
+// namespace of its layer and in that of the same operations over plain lanes, so no include guard.
+
+struct operation {
+    const char *name;
+    int out_bytes;
+    // `in` points behind the last of 8 vectors of input; writes out_bytes bytes.
+    void (*run)(const uint8_t *in, uint8_t *out);
+};
+
+inline u8v u8(const uint8_t *in, int k) { return load(in - (k + 1) * bytes); }
+inline u16v u16(const uint8_t *in, int k) { return as_u16(u8(in, k)); }
+inline s16v s16(const uint8_t *in, int k) { return as_s16(u16(in, k)); }
+template <typename V>
+inline void put(uint8_t *out, V v) {
+    memcpy(out, &v, sizeof v);
+}
+
+// An operation whose result is a vector, of the inputs a, b, c, d.
+#define VECTOR(name, type, ...)                                                            \
+    {                                                                                      \
+        name, bytes, [](const uint8_t *in, uint8_t *out) {                                 \
+            [[maybe_unused]] const auto a = type(in, 0), b = type(in, 1), c = type(in, 2); \
+            put(out, __VA_ARGS__);                                                         \
+        }                                                                                  \
+    }
+// Any other operation.
+#define MEMORY(name, out_bytes, ...)                                          \
+    {                                                                         \
+        name, out_bytes, [](const uint8_t *in, uint8_t *out) { __VA_ARGS__; } \
+    }
+
+// clang-format off
+static const operation operations[] = {
+    VECTOR("as_u8", u16, as_u8(a)),
+    VECTOR("as_u16", s16, as_u16(a)),
+    MEMORY("load", bytes, store(out, load(in - bytes))),
+    MEMORY("load, store, anywhere", bytes + 1, { out[0] = 0; store(out + 1, load(in - bytes - 3)); }),
+    MEMORY("load_zip, first", bytes, put(out, load_zip(in - bytes / 2, in - 3 * bytes))),
+    MEMORY("load_zip, second", bytes, put(out, load_zip(in - 3 * bytes - 1, in - bytes / 2))),
+    MEMORY("load_split", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("set_u8", bytes, put(out, set_u8(in[-1]))),
+    MEMORY("set_u16", bytes, put(out, set_u16(uint16_t(in[-1] << 8 | in[-2])))),
+    MEMORY("set_u32", bytes, put(out, set_u32(uint32_t(in[-1]) << 24 | in[-2] << 16 | in[-3] << 8 | in[-4]))),
+    MEMORY("store_stream", 2 * bytes, store_stream(out + bytes, u8(in, 0)); store_stream(out, u8(in, 1)); stream_end()),
+
+    VECTOR("min_u8", u8, min_u8(a, b)),
+    MEMORY("first_zero", 1, *out = uint8_t(first_zero(u8(in, 0)))),
+    MEMORY("first_zero, none", 1, *out = uint8_t(first_zero(bit_or(u8(in, 0), set_u8(1))))),
+    MEMORY("first_zero, anywhere", 1,
+           uint8_t v[bytes]; store(v, bit_or(u8(in, 0), set_u8(1)));
+           v[in[-bytes - 1] % bytes] = v[in[-bytes - 2] % bytes] = 0; *out = uint8_t(first_zero(load(v)))),
+
+    VECTOR("bit_and u8", u8, bit_and(a, b)),
+    VECTOR("bit_or u8", u8, bit_or(a, b)),
+    VECTOR("bit_xor u8", u8, bit_xor(a, b)),
+    VECTOR("bit_and u16", u16, bit_and(a, b)),
+    VECTOR("bit_or u16", u16, bit_or(a, b)),
+    VECTOR("shl 1", u16, shl<1>(a)),
+    VECTOR("shl 11", u16, shl<11>(a)),
+    VECTOR("shr 1", u16, shr<1>(a)),
+    VECTOR("shr 13", u16, shr<13>(a)),
+
+    VECTOR("add", s16, add(a, b)),
+    VECTOR("add_sat", s16, add_sat(a, b)),
+    VECTOR("pair_dot luma even", u8, pair_dot<149, 0, 13440>(a)),
+    VECTOR("pair_dot luma odd", u8, pair_dot<0, 150, 13552>(a)),
+    VECTOR("pair_dot negative", u8, pair_dot<-50, -104, 3312>(a)),
+    VECTOR("pair_dot widest", u8, pair_dot<127, 128, 0>(a)),
+    VECTOR("pair_dot widest, negative", u8, pair_dot<-255, 0, -1>(a)),
+    VECTOR("half_product_high", u8, half_product_high<409, -22864>(a)),
+    VECTOR("half_product_high, widest", u8, half_product_high<511, -32768>(a)),
+    VECTOR("half_product_low", u8, half_product_low<409, -22864>(a)),
+    VECTOR("half_product_low, small", u8, half_product_low<1, 3>(a)),
+    VECTOR("low_minus_128_shl8", u8, low_minus_128_shl8(a)),
+    VECTOR("high_minus_128_shl8", u8, high_minus_128_shl8(a)),
+
+    VECTOR("even", u8, even(a)),
+    VECTOR("odd", u8, odd(a)),
+    VECTOR("join", u8, join(even(a), odd(b))),
+    VECTOR("narrow_join 7", s16, narrow_join<7>(a, b)),
+    VECTOR("narrow_join 1", s16, narrow_join<1>(a, b)),
+    VECTOR("pack565", s16, pack565(a, b, c)),
+
+    VECTOR("natural_to_by8", u8, natural_to_by8(a)),
+    VECTOR("natural_to_by4", u8, natural_to_by4(a)),
+    VECTOR("by8_to_natural", u8, by8_to_natural(a)),
+    VECTOR("by8_to_by4", u8, by8_to_by4(a)),
+    MEMORY("store_zip8", 2 * bytes, store_zip8(out, u8(in, 0), u8(in, 1))),
+    MEMORY("store_zip16", 2 * bytes, store_zip16(out, u16(in, 0), u16(in, 1))),
+    MEMORY("store_zip3", 3 * bytes, store_zip3(out, u8(in, 0), u8(in, 1), u8(in, 2))),
+    MEMORY("store_zip4", 4 * bytes, store_zip4(out, u8(in, 0), u8(in, 1), u8(in, 2), u8(in, 3))),
+};
+// clang-format on
+
+#undef VECTOR
+#undef MEMORY
