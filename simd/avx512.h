@@ -58,6 +58,10 @@ template <int N>
 inline u16v shr(u16v a) {
     return _mm512_srli_epi16(a, N);
 }
+template <int N>
+inline s16v sar(s16v a) {
+    return _mm512_srai_epi16(a, N);
+}
 
 inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }

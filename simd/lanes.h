@@ -125,6 +125,10 @@ template <int N>
 inline u16v shr(u16v a) {
     return make<u16v>([&](int i) { return a.lane[i] >> N; });
 }
+template <int N>
+inline s16v sar(s16v a) {
+    return make<s16v>([&](int i) { return a.lane[i] >> N; });
+}
 
 // Signed 16-bit sums, wrapping and saturating.
 inline s16v add(s16v a, s16v b) {

@@ -56,6 +56,10 @@ template <int N>
 inline u16v shr(u16v a) {
     return vshrq_n_u16(a, N);
 }
+template <int N>
+inline s16v sar(s16v a) {
+    return vshrq_n_s16(a, N);
+}
 
 inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }

@@ -16,6 +16,13 @@
 // saturates upward, b2 > 0 keeps it there; where it saturates downward, b2 is too small to lift it
 // above 0.
 //
+// Blue with 6 fractional bits takes one sum less, and serves where channels become bytes:
+//
+//   luma >> 1                                  -2816 ... 16181
+//   b6     129 Uc + 32 + 1624                 -14856 ... 18039
+//
+// The sum loses half a unit, which the final shift, B = clamp(sum >> 6), would have dropped.
+//
 // The coarse matrix (6 fractional bits) is computed at twice its scale and has the same form, with
 // 150 for 149 and 204 Vc in r.
 #ifndef SIMGP_VECTOR_MATRIX_H
@@ -23,13 +30,14 @@
 
 namespace simgp::SIMD_TARGET {
 
-// Three channels with 7 fractional bits, saturated.
+// Three channels with 7 fractional bits, and blue with 6; saturated. What a packer does not use is
+// never computed.
 struct rgb_s16 {
-    s16v r, g, b;
+    s16v r, g, b, b6;
 };
 // What chroma adds to luma.
 struct chroma_terms {
-    s16v r, g, b256, b2;
+    s16v r, g, b256, b2, b6;
 };
 
 // Which sample of a chroma pair comes first.
@@ -55,11 +63,13 @@ struct matrix_s7 {
         t.g = pair_dot < uv ? -50 : -104, uv ? -104 : -50, chroma_bias > (pairs);
         t.b256 = uv ? low_minus_128_shl8(pairs) : high_minus_128_shl8(pairs);
         t.b2 = pair_dot < uv ? 2 : 0, uv ? 0 : 2, chroma_bias > (pairs);
+        t.b6 = pair_dot < uv ? 129 : 0, uv ? 0 : 129, chroma_bias / 2 > (pairs);
         return t;
     }
 
     static rgb_s16 apply(s16v luma, const chroma_terms &c) {
-        return {add_sat(luma, c.r), add_sat(luma, c.g), add_sat(add_sat(luma, c.b256), c.b2)};
+        return {add_sat(luma, c.r), add_sat(luma, c.g), add_sat(add_sat(luma, c.b256), c.b2),
+                add_sat(sar<1>(luma), c.b6)};
     }
 };
 

@@ -49,7 +49,7 @@ struct rgb_u8 {
 };
 inline rgb_u8 narrow(const rgb_s16 &even, const rgb_s16 &odd) {
     return {narrow_join<7>(even.r, odd.r), narrow_join<7>(even.g, odd.g),
-            narrow_join<7>(even.b, odd.b)};
+            narrow_join<6>(even.b6, odd.b6)};
 }
 
 template <bool BGR>

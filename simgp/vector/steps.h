@@ -28,17 +28,24 @@ inline void partial_step(const samples &s, uint8_t *dst, ptrdiff_t x, int count)
 // Converts `width` >= 1 pixels. Reads their samples and writes the pixels, nothing else.
 //
 // A row of at least a vector takes whole steps. The last one ends at the last pixel and may do some
-// pixels again; its samples are loaded before the first store, so the row stays right where output
-// overlaps samples that are done with. Where steps begin at even pixels, the last pixel of an odd
-// row stands alone.
+// pixels again. Samples are loaded one step ahead of the stores, which hides the loads' latency and
+// keeps the row right where output lies over samples: whatever was stored by then lies before the
+// pixels that a load is for. Where steps begin at even pixels, the last pixel of an odd row stands
+// alone.
 template <class Step>
 inline void row_of_steps(const samples &s, uint8_t *dst, ptrdiff_t width) {
     const ptrdiff_t whole = Step::pixels_in_pairs ? width & ~ptrdiff_t(1) : width;
     if (whole < bytes) return partial_step<Step>(s, dst, 0, int(width));
-    const auto last = Step::load(s, whole - bytes);
     ptrdiff_t x = 0;
-    for (; x + bytes <= whole; x += bytes) Step::convert(dst + x * Step::size, Step::load(s, x));
-    if (x < whole) Step::convert(dst + (whole - bytes) * Step::size, last);
+    auto pixels = Step::load(s, 0);
+    for (;;) {
+        const ptrdiff_t next = x + 2 * bytes <= whole ? x + bytes : whole - bytes;
+        const auto ahead = Step::load(s, next);
+        Step::convert(dst + x * Step::size, pixels);
+        if (next == x) break;
+        x = next;
+        pixels = ahead;
+    }
     if (whole < width) partial_step<Step>(s, dst, whole, 1);
 }
 
