@@ -40,6 +40,10 @@ enum class rgb_packing : uint8_t {
 using yuv_to_rgb_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                             ptrdiff_t width);
 
+// The same for two rows with the same chroma, which may be one and the same row.
+using yuv_to_rgb_row_pair = void(const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
+                                 const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width);
+
 // Repeats the four bytes of value, lowest first, over `size` bytes, a multiple of 32.
 using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
 
@@ -48,9 +52,10 @@ using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
 using find_code_row = ptrdiff_t(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t code);
 
 struct rows {
-    // yuv2rgb: null where the library has no such conversion.
+    // yuv2rgb: null where no kernel needs the row.
     yuv_to_rgb_row *yuv_to_rgb[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
-    yuv_to_rgb_row *vu_to_rgb565_coarse;  // with the coefficients of 6 fractional bits
+    yuv_to_rgb_row_pair *yuv_to_rgb_pair[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
+    yuv_to_rgb_row_pair *vu_to_rgb565_coarse_pair;  // with the coefficients of 6 fractional bits
 
     fill_row *fill;            // mem
     find_code_row *find_code;  // keyframe
@@ -58,15 +63,21 @@ struct rows {
     yuv_to_rgb_row *&yuv_to_rgb_slot(yuv_layout layout, rgb_packing packing) {
         return yuv_to_rgb[size_t(layout)][size_t(packing)];
     }
+    yuv_to_rgb_row_pair *&yuv_to_rgb_pair_slot(yuv_layout layout, rgb_packing packing) {
+        return yuv_to_rgb_pair[size_t(layout)][size_t(packing)];
+    }
 };
 
 }  // namespace simgp
 
-// The rows from YUV to RGB that the library has: X(layout, packing). Scalar and vector tables are
-// filled from this one list.
+// The rows from YUV to RGB that kernels need: X(layout, packing). Scalar and vector tables are
+// filled from these lists. Formats whose chroma serves two rows take pairs of rows.
 // clang-format off
 #define SIMGP_YUV_TO_RGB_ROWS(X)                                                            \
     X(grey, rgb565)                                                                         \
+    X(half, rgb565) X(half, bgr565)                                                         \
+    X(full, rgb565) X(full, bgr565)
+#define SIMGP_YUV_TO_RGB_PAIRS(X)                                                           \
     X(half, rgb565) X(half, bgr565) X(half, rgb888) X(half, bgr888)                         \
     X(half, rgba8888) X(half, bgra8888) X(half, argb8888)                                   \
     X(full, rgb565) X(full, bgr565)                                                         \

@@ -35,29 +35,42 @@ inline plane_lines dst_lines(const csc_args &a, int plane) {
 struct yuv_planes {
     yuv_layout layout;
     int8_t u, v;
-    uint8_t shared_rows_log2;
+    bool serves_two_rows;
 };
-inline constexpr yuv_planes planes_yuv400{yuv_layout::grey, -1, -1, 0};
-inline constexpr yuv_planes planes_yuv420{yuv_layout::half, 1, 2, 1};
-inline constexpr yuv_planes planes_yv12{yuv_layout::half, 2, 1, 1};
-inline constexpr yuv_planes planes_yuv422n{yuv_layout::half, 1, 2, 0};
-inline constexpr yuv_planes planes_yuv422w{yuv_layout::full, 1, 2, 1};
-inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, 0};
-inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, 1};
-inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, 1};
+inline constexpr yuv_planes planes_yuv400{yuv_layout::grey, -1, -1, false};
+inline constexpr yuv_planes planes_yuv420{yuv_layout::half, 1, 2, true};
+inline constexpr yuv_planes planes_yv12{yuv_layout::half, 2, 1, true};
+inline constexpr yuv_planes planes_yuv422n{yuv_layout::half, 1, 2, false};
+inline constexpr yuv_planes planes_yuv422w{yuv_layout::full, 1, 2, true};
+inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, false};
+inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, true};
+inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, true};
 
-// Calls `row` for every row from top to bottom. Row y takes chroma line (y + lead) >>
-// shared_rows_log2.
-inline void walk_yuv_to_rgb(const csc_args &a, const yuv_planes &planes, yuv_to_rgb_row *row,
-                            int lead = 0) {
+// Calls `row` for every row from top to bottom, or `pair` for pairs of rows where chroma serves
+// two. Row y then takes chroma line (y + lead) >> 1.
+inline void walk_yuv_to_rgb(const csc_args &a, const yuv_planes &planes, yuv_to_rgb_row *row) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
     const plane_lines luma = src_lines(a, 0), u = src_lines(a, planes.u),
                       v = src_lines(a, planes.v);
     const plane_lines out = dst_lines(a, 0);
-    for (ptrdiff_t y = 0; y < height; y++) {
-        const ptrdiff_t chroma = (y + lead) >> planes.shared_rows_log2;
-        row(luma.line(y), u.line(chroma), v.line(chroma), out.line(y), width);
+    for (ptrdiff_t y = 0; y < height; y++)
+        row(luma.line(y), u.line(y), v.line(y), out.line(y), width);
+}
+inline void walk_yuv_to_rgb(const csc_args &a, const yuv_planes &planes, yuv_to_rgb_row_pair *pair,
+                            int lead) {
+    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
+    if (width < 1) return;
+    const plane_lines luma = src_lines(a, 0), u = src_lines(a, planes.u),
+                      v = src_lines(a, planes.v);
+    const plane_lines out = dst_lines(a, 0);
+    for (ptrdiff_t y = 0; y < height;) {
+        const ptrdiff_t chroma = (y + lead) >> 1;
+        // The row below, or the row again where it has its chroma line to itself.
+        const ptrdiff_t below = y + 1 < height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
+        pair(luma.line(y), luma.line(below), u.line(chroma), v.line(chroma), out.line(y),
+             out.line(below), width);
+        y = below + 1;
     }
 }
 

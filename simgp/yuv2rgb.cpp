@@ -110,6 +110,13 @@ void row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst, ptr
     }
 }
 
+template <yuv_layout Layout, class Matrix, rgb_packing Packing>
+void row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
+              uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
+    row<Layout, Matrix, Packing>(y0, u, v, dst0, width);
+    row<Layout, Matrix, Packing>(y1, u, v, dst1, width);
+}
+
 template <yuv_layout Layout, rgb_packing Packing>
 constexpr yuv_to_rgb_row *row_of =
     row<Layout, std::conditional_t<Layout == yuv_layout::grey, grey_matrix, bt601>, Packing>;
@@ -122,7 +129,12 @@ void fill_yuv2rgb(rows &t) {
         row_of<yuv_layout::layout, rgb_packing::packing>;
     SIMGP_YUV_TO_RGB_ROWS(FILL)
 #undef FILL
-    t.vu_to_rgb565_coarse = row<yuv_layout::vu, bt601_coarse, rgb_packing::rgb565>;
+#define FILL(layout, packing)                                          \
+    t.yuv_to_rgb_pair_slot(yuv_layout::layout, rgb_packing::packing) = \
+        row_pair<yuv_layout::layout, bt601, rgb_packing::packing>;
+    SIMGP_YUV_TO_RGB_PAIRS(FILL)
+#undef FILL
+    t.vu_to_rgb565_coarse_pair = row_pair<yuv_layout::vu, bt601_coarse, rgb_packing::rgb565>;
 }
 
 }  // namespace scalar
@@ -130,8 +142,12 @@ void fill_yuv2rgb(rows &t) {
 namespace {
 
 void convert(const csc_args &a, const yuv_planes &planes, rgb_packing packing, int lead = 0) {
-    walk_yuv_to_rgb(a, planes, live_rows().yuv_to_rgb[size_t(planes.layout)][size_t(packing)],
-                    lead);
+    const rows &live = live_rows();
+    const size_t from = size_t(planes.layout), to = size_t(packing);
+    if (planes.serves_two_rows)
+        walk_yuv_to_rgb(a, planes, live.yuv_to_rgb_pair[from][to], lead);
+    else
+        walk_yuv_to_rgb(a, planes, live.yuv_to_rgb[from][to]);
 }
 
 // Four kernels let row 0 of an odd-height picture have the first chroma line to itself, unless the
@@ -169,5 +185,5 @@ KERNEL(nv12, bgr565)
 KERNEL(nv12, rgb888)
 KERNEL(nv21, bgr565)
 KERNEL(nv21, rgb888)
-SIMGP_CSC_KERNEL(simgp_csc_nv21_to_rgb565, walk_yuv_to_rgb(args, planes_nv21, live_rows().vu_to_rgb565_coarse))
+SIMGP_CSC_KERNEL(simgp_csc_nv21_to_rgb565, walk_yuv_to_rgb(args, planes_nv21, live_rows().vu_to_rgb565_coarse_pair, 0))
 // clang-format on

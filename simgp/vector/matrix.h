@@ -40,6 +40,10 @@ struct chroma_terms {
     s16v r, g, b256, b2, b6;
 };
 
+struct chroma_terms_full {
+    chroma_terms even, odd;
+};
+
 // Which sample of a chroma pair comes first.
 enum class pair_order { uv, vu };
 

@@ -24,6 +24,11 @@ struct staged {
     samples all() const { return {y, u, v}; }
 };
 
+template <pixel_order Order>
+inline u8v load_luma(const uint8_t *y, ptrdiff_t x) {
+    return arrange<Order>(load(y + x));
+}
+
 struct yuv_half {
     u8v y, pairs;
 };
@@ -41,8 +46,7 @@ struct source<yuv_layout::half> {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        return {arrange<Order>(SIMD_TARGET::load(s.y + x)),
-                arrange<Order>(load_zip(s.u + x / 2, s.v + x / 2))};
+        return {load_luma<Order>(s.y, x), arrange<Order>(load_zip(s.u + x / 2, s.v + x / 2))};
     }
     static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         memcpy(to.y, s.y + x, size_t(count));
@@ -60,8 +64,7 @@ struct source<yuv_layout::full> {
     static yuv_full load(const samples &s, ptrdiff_t x) {
         const u8v u = arrange<Order>(SIMD_TARGET::load(s.u + x));
         const u8v v = arrange<Order>(SIMD_TARGET::load(s.v + x));
-        return {arrange<Order>(SIMD_TARGET::load(s.y + x)), join(even(u), even(v)),
-                join(odd(u), odd(v))};
+        return {load_luma<Order>(s.y, x), join(even(u), even(v)), join(odd(u), odd(v))};
     }
     static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         memcpy(to.y, s.y + x, size_t(count));
@@ -77,8 +80,7 @@ struct source_pairs {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        return {arrange<Order>(SIMD_TARGET::load(s.y + x)),
-                arrange<Order>(SIMD_TARGET::load(s.u + x))};
+        return {load_luma<Order>(s.y, x), arrange<Order>(SIMD_TARGET::load(s.u + x))};
     }
     static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         memcpy(to.y, s.y + x, size_t(count));

@@ -10,23 +10,76 @@
 
 namespace simgp::SIMD_TARGET {
 
+// Less than a vector goes through the stack.
+template <class Step>
+inline void part_through_stack(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
+    staged to;
+    uint8_t pixels[bytes * Step::size];
+    Step::stage(to, in, x, count);
+    Step::convert(pixels, 0, Step::load(to.all(), 0));
+    memcpy(out + x * Step::size, pixels, size_t(count) * Step::size);
+}
+
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
 struct yuv_step : source<Layout> {
     using from = source<Layout>;
     using to = packer<Packing>;
     static constexpr int size = to::size;
 
-    static auto load(const samples &s, ptrdiff_t x) { return from::template load<to::order>(s, x); }
-    static void convert(uint8_t *dst, const yuv_half &p) {
-        const chroma_terms c = Matrix::template chroma<from::pairs>(p.pairs);
-        to::store(dst, Matrix::apply(Matrix::luma_even(p.y), c),
-                  Matrix::apply(Matrix::luma_odd(p.y), c));
+    static auto load(const samples &in, ptrdiff_t x) {
+        return from::template load<to::order>(in, x);
     }
-    static void convert(uint8_t *dst, const yuv_full &p) {
-        const chroma_terms even = Matrix::template chroma<from::pairs>(p.pairs_even);
-        const chroma_terms odd = Matrix::template chroma<from::pairs>(p.pairs_odd);
-        to::store(dst, Matrix::apply(Matrix::luma_even(p.y), even),
-                  Matrix::apply(Matrix::luma_odd(p.y), odd));
+    static auto terms(const yuv_half &p) { return Matrix::template chroma<from::pairs>(p.pairs); }
+    static auto terms(const yuv_full &p) {
+        return chroma_terms_full{Matrix::template chroma<from::pairs>(p.pairs_even),
+                                 Matrix::template chroma<from::pairs>(p.pairs_odd)};
+    }
+    static void apply(uint8_t *out, ptrdiff_t x, u8v y, const chroma_terms &c) {
+        to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c),
+                  Matrix::apply(Matrix::luma_odd(y), c));
+    }
+    static void apply(uint8_t *out, ptrdiff_t x, u8v y, const chroma_terms_full &c) {
+        to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c.even),
+                  Matrix::apply(Matrix::luma_odd(y), c.odd));
+    }
+    template <class Pixels>
+    static void convert(uint8_t *out, ptrdiff_t x, const Pixels &p) {
+        apply(out, x, p.y, terms(p));
+    }
+    static void part(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
+        part_through_stack<yuv_step>(in, out, x, count);
+    }
+};
+
+// Two rows with the same chroma, whose terms are computed once.
+struct samples_pair {
+    samples first;
+    const uint8_t *second_y;
+};
+struct out_pair {
+    uint8_t *first, *second;
+};
+template <class Step>
+struct pair_step : Step {
+    template <class Pixels>
+    struct pixels_pair {
+        Pixels first;
+        u8v second_y;
+    };
+
+    static auto load(const samples_pair &in, ptrdiff_t x) {
+        return pixels_pair<decltype(Step::load(in.first, x))>{
+            Step::load(in.first, x), load_luma<Step::to::order>(in.second_y, x)};
+    }
+    template <class Pixels>
+    static void convert(const out_pair &out, ptrdiff_t x, const Pixels &p) {
+        const auto terms = Step::terms(p.first);
+        Step::apply(out.first, x, p.first.y, terms);
+        Step::apply(out.second, x, p.second_y, terms);
+    }
+    static void part(const samples_pair &in, const out_pair &out, ptrdiff_t x, int count) {
+        Step::part(in.first, out.first, x, count);
+        Step::part({in.second_y, in.first.u, in.first.v}, out.second, x, count);
     }
 };
 
@@ -37,23 +90,31 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
     static constexpr bool pixels_in_pairs = false;
     static constexpr int size = 2;
 
-    static u8v load(const samples &s, ptrdiff_t x) {
-        return natural_to_by8(SIMD_TARGET::load(s.y + x));
+    static u8v load(const samples &in, ptrdiff_t x) { return load_luma<pixel_order::by8>(in.y, x); }
+    static void stage(staged &to, const samples &in, ptrdiff_t x, int count) {
+        memcpy(to.y, in.y + x, size_t(count));
     }
-    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        memcpy(to.y, s.y + x, size_t(count));
-    }
-    static void convert(uint8_t *dst, u8v y) {
+    static void convert(uint8_t *out, ptrdiff_t x, u8v y) {
         const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
         const u16v w = as_u16(y);
-        store_zip8(dst, bit_or(bits(shl<3>(w), 0xE0), bits(shr<3>(w), 0x1F)),
+        store_zip8(out + x * size, bit_or(bits(shl<3>(w), 0xE0), bits(shr<3>(w), 0x1F)),
                    bit_or(bits(w, 0xF8), bits(shr<5>(w), 0x07)));
+    }
+    static void part(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
+        part_through_stack<yuv_step>(in, out, x, count);
     }
 };
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
 void yuv_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
-    row_of_steps<yuv_step<Layout, Matrix, Packing>>({y, u, v}, dst, width);
+    row_of_steps<yuv_step<Layout, Matrix, Packing>>(samples{y, u, v}, dst, width);
+}
+
+template <yuv_layout Layout, class Matrix, rgb_packing Packing>
+void yuv_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
+                  uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
+    row_of_steps<pair_step<yuv_step<Layout, Matrix, Packing>>>(samples_pair{{y0, u, v}, y1},
+                                                               out_pair{dst0, dst1}, width);
 }
 
 void fill_yuv2rgb(rows &t) {
@@ -62,7 +123,12 @@ void fill_yuv2rgb(rows &t) {
         yuv_row<yuv_layout::layout, bt601, rgb_packing::packing>;
     SIMGP_YUV_TO_RGB_ROWS(FILL)
 #undef FILL
-    t.vu_to_rgb565_coarse = yuv_row<yuv_layout::vu, bt601_coarse, rgb_packing::rgb565>;
+#define FILL(layout, packing)                                          \
+    t.yuv_to_rgb_pair_slot(yuv_layout::layout, rgb_packing::packing) = \
+        yuv_row_pair<yuv_layout::layout, bt601, rgb_packing::packing>;
+    SIMGP_YUV_TO_RGB_PAIRS(FILL)
+#undef FILL
+    t.vu_to_rgb565_coarse_pair = yuv_row_pair<yuv_layout::vu, bt601_coarse, rgb_packing::rgb565>;
 }
 
 }  // namespace simgp::SIMD_TARGET
