@@ -71,7 +71,10 @@ inline u8v load(const uint8_t *p) {
 inline void store(uint8_t *p, u8v v) { memcpy(p, &v, bytes); }
 // bytes / 2 bytes from p and as many from q, in turn.
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
-    return make<u8v>([&](int i) { return (i & 1 ? q : p)[i / 2]; });
+    return make<u8v>([&](int i) {
+        const uint8_t *from = i & 1 ? q : p;
+        return from[i / 2];
+    });
 }
 
 inline u8v set_u8(uint8_t x) {
