@@ -23,7 +23,7 @@ class SheetSink : public Sink {
     void put(const Picture &picture) override {
         if (frame_ % every_ == 0) {
             if (tiles_.size() == 64) {
-                for (size_t k = 0; k < 32; ++k) tiles_[k] = std::move(tiles_[2 * k]);
+                for (size_t k = 1; k < 32; ++k) tiles_[k] = std::move(tiles_[2 * k]);
                 tiles_.resize(32);
                 every_ *= 2;
             }

@@ -1,6 +1,7 @@
 // Y4M, uncompressed video: a line of text about the stream, then for each frame a line that begins
 // with FRAME and the tight planes.
 #include <charconv>
+#include <limits>
 
 #include "tools/sink.h"
 #include "tools/source.h"
@@ -42,7 +43,8 @@ class Y4mSource : public Source {
         if (!header.starts_with("YUV4MPEG2 "))
             fail(0, "the Y4M header does not begin with YUV4MPEG2");
         std::string colour = "420";
-        int64_t width = -1, height = -1;
+        constexpr int64_t missing = std::numeric_limits<int64_t>::min();
+        int64_t width = missing, height = missing;
         for (size_t at = 10; at < header.size();) {
             const size_t end = std::min(header.find(' ', at), header.size());
             const std::string tag = header.substr(at, end - at),
@@ -84,7 +86,8 @@ class Y4mSource : public Source {
                          "; mono, 420, 422 and 444 are supported");
             }
         }
-        if (width < 0 || height < 0) fail(0, "the Y4M header lacks ", width < 0 ? "W" : "H");
+        if (width == missing || height == missing)
+            fail(0, "the Y4M header lacks ", width == missing ? "W" : "H");
         check_size(width, height, name_ + ": byte 0: Y4M header");
         if (!shape_.format) shape_.format = format_of_tag(colour);
         shape_.width = int(width);
