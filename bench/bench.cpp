@@ -62,9 +62,10 @@ quartiles quartiles_of(std::vector<double> v) {
 struct line {
     std::string name, size, target_name, best_peer;
     double ns = 0, peer_ns = 0;
-    quartiles peer, scalar, limit, round;  // quotients of speeds; 0: not measured
+    quartiles peer, scalar, limit, twin;  // quotients of speeds; 0: not measured
     goal goals;
-    double round_goal = 0;
+    double twin_goal = 0;
+    std::string twin_name;
 
     // The goals that are not met, and whether there are any at all.
     std::string missed() const {
@@ -78,12 +79,12 @@ struct line {
         want("peer", goals.peer, peer);
         want("scalar", goals.scalar, scalar);
         want("limit", goals.limit, limit);
-        want("1080p", round_goal, round);
+        want(twin_name.c_str(), twin_goal, twin);
         return text;
     }
     bool has_goals() const {
         return (goals.peer && peer.middle) || (goals.scalar && scalar.middle) ||
-               (goals.limit && limit.middle) || (round_goal && round.middle);
+               (goals.limit && limit.middle) || (twin_goal && twin.middle);
     }
 };
 
@@ -93,8 +94,8 @@ class rotation {
     rotation(const match &m, const settings &s) : m_(m), s_(s), random_(1) {
         add(target::scalar, m.ours, m.units);
         for (target t : s.targets) add(t, m.ours, m.units);
-        if (m.round_size)
-            for (target t : s.targets) add(t, m.round_size, m.round_units);
+        if (m.twin.run)
+            for (target t : s.targets) add(t, m.twin.run, m.twin.units);
         for (const contender &p : m.peers) add(target::count, p.run, m.units);
         if (m.limit) add(target::count, m.limit, m.units);
         order_.resize(all_.size());
@@ -119,8 +120,8 @@ class rotation {
 
     std::vector<line> lines(const std::string &name, const std::string &size) const {
         std::vector<line> lines;
-        const size_t first_round = 1 + s_.targets.size();
-        const size_t first_peer = first_round + (m_.round_size ? s_.targets.size() : 0);
+        const size_t first_twin = 1 + s_.targets.size();
+        const size_t first_peer = first_twin + (m_.twin.run ? s_.targets.size() : 0);
         const size_t limit = first_peer + m_.peers.size();
         size_t best = first_peer;
         for (size_t p = first_peer; p < limit; p++)
@@ -137,10 +138,11 @@ class rotation {
                 l.peer_ns = median(best);
                 l.peer = quotient(best, 1 + t);
             }
-            if (m_.round_size) l.round = quotient(first_round + t, 1 + t);
+            if (m_.twin.run) l.twin = quotient(first_twin + t, 1 + t);
             if (m_.limit) l.limit = quotient(limit, 1 + t);
             l.goals = m_.goals;
-            l.round_goal = m_.round_goal;
+            l.twin_goal = m_.twin.goal;
+            l.twin_name = m_.twin.name;
             lines.push_back(l);
         }
         return lines;
@@ -152,7 +154,7 @@ class rotation {
         times["scalar_ns"] = median(0);
         for (size_t t = 0; t < s_.targets.size(); t++)
             times[std::string(simgp::target_name(s_.targets[t])) + "_ns"] = median(1 + t);
-        const size_t first_peer = 1 + s_.targets.size() * (m_.round_size ? 2 : 1);
+        const size_t first_peer = 1 + s_.targets.size() * (m_.twin.run ? 2 : 1);
         for (size_t p = 0; p < m_.peers.size(); p++)
             times[m_.peers[p].name + "_ns"] = median(first_peer + p);
         if (m_.limit) times["limit_ns"] = median(all_.size() - 1);
@@ -222,7 +224,7 @@ class table : public benchmark::BenchmarkReporter {
 
     bool ReportContext(const Context &) override {
         print("operation", "size", "rows", "ns", "x scalar", "best peer", "its ns", "x peer",
-              "quartiles", "x limit", "x 1080p", "goals");
+              "quartiles", "x limit", "x twin", "goals");
         print("-", "-", "-", "-", "-", "-", "-", "-", "-", "-", "-", "-");
         return true;
     }
@@ -237,7 +239,8 @@ class table : public benchmark::BenchmarkReporter {
                 l.peer.middle ? number(l.peer.low) + "-" + number(l.peer.high) : "";
             print(l.name, l.size, l.target_name, number(l.ns, 3), number(l.scalar.middle, 1),
                   l.best_peer, number(l.peer_ns, 3), number(l.peer.middle), spread,
-                  number(l.limit.middle), number(l.round.middle),
+                  number(l.limit.middle),
+                  l.twin.middle ? number(l.twin.middle) + " " + l.twin_name : "",
                   !missed.empty() ? "SHORT: " + missed
                   : l.has_goals() ? "met"
                                   : "");
@@ -256,7 +259,7 @@ class table : public benchmark::BenchmarkReporter {
 
     template <class... Cells>
     static void print(const Cells &...cells) {
-        static constexpr int widths[] = {-26, -9, -6, 6, 8, -15, 6, 6, -11, 7, 7, -24};
+        static constexpr int widths[] = {-26, -9, -6, 6, 8, -20, 6, 6, -11, 7, -11, -20};
         int column = 0;
         const auto one = [&](const std::string &cell) {
             const int w = widths[column++];
@@ -339,7 +342,10 @@ int run(int argc, char **argv) {
     limit_libyuv(libyuv_set);
 
     table out;
-    for (const comparison &c : yuv2rgb_comparisons()) {
+    std::vector<comparison> all;
+    for (const auto area : {yuv2rgb_comparisons})
+        for (comparison &c : area()) all.push_back(std::move(c));
+    for (const comparison &c : all) {
         const std::vector<std::string> &chosen = sizes.empty() ? c.sizes : sizes;
         for (const std::string &size : chosen) {
             const auto body = [&out, c, size, s](benchmark::State &state) {

@@ -39,10 +39,13 @@ struct match {
     std::function<void()> limit;   // memory traffic of the same bytes; may be empty
     goal goals;
 
-    // The same operation at a rounder size, for the cost of odd sizes; may be empty.
-    std::function<void()> round_size = {};
-    double round_units = 0;
-    double round_goal = 0;
+    // Other work of ours whose speed this one should keep, such as the same at a rounder size; run
+    // with the same target's rows.
+    struct {
+        std::string name;
+        std::function<void()> run;  // may be empty
+        double units = 0, goal = 0;
+    } twin = {};
 };
 
 // An operation. make(size) prepares a match, and ends the program if a peer does not compute the
@@ -63,6 +66,12 @@ std::function<void()> memory_traffic(std::shared_ptr<void> keep, const uint8_t *
 
 // Each area's comparisons (bench/<area>_bench.cpp).
 std::vector<comparison> yuv2rgb_comparisons();
+std::vector<comparison> packed2rgb_comparisons();
+std::vector<comparison> rgb2yuv_comparisons();
+std::vector<comparison> layout_comparisons();
+std::vector<comparison> copy_comparisons();
+std::vector<comparison> tile_comparisons();
+std::vector<comparison> dither_comparisons();
 
 }  // namespace bench
 

@@ -42,6 +42,7 @@ constexpr format_shape formats[] = {
     {SIMGP_FMT_NV12,     "nv12",     AV_PIX_FMT_NV12,     {{"Y", 0, 0}, {"UV", 1, 1}}},
     {SIMGP_FMT_NV21,     "nv21",     AV_PIX_FMT_NV21,     {{"Y", 0, 0}, {"VU", 1, 1}}},
     {SIMGP_FMT_YUV422W,  "yuv422w",  AV_PIX_FMT_YUV440P,  {{"Y", 0, 0}, {"U", 0, 1}, {"V", 0, 1}}},
+    {SIMGP_FMT_T64X32,   "t64x32",   AV_PIX_FMT_NONE,     {{"Y", 0, 0}, {"UV", 1, 1}}},
     {SIMGP_FMT_UYVY,     "uyvy",     AV_PIX_FMT_UYVY422,  {{"UYVY", 1, 0}}},
     {SIMGP_FMT_YUYV,     "yuyv",     AV_PIX_FMT_YUYV422,  {{"YUYV", 1, 0}}},
     {SIMGP_FMT_RGB565,   "rgb565",   AV_PIX_FMT_RGB565LE, {{"wW", 0, 0}}},
@@ -116,9 +117,13 @@ void for_bytes(const picture &p, const F &f) {
     }
 }
 
-AVPixelFormat swscale_format(int format) { return shape_of(format).swscale; }
-
 bool v_before_u(int format) { return format == SIMGP_FMT_YV12 || format == SIMGP_FMT_YV16; }
+
+simgp_img exchanged(simgp_img p) {
+    std::swap(p.plane[1], p.plane[2]);
+    std::swap(p.stride[1], p.stride[2]);
+    return p;
+}
 
 double microseconds(const std::function<void()> &f) {
     const auto start = std::chrono::steady_clock::now();
@@ -141,7 +146,13 @@ picture::picture(int format, int w, int h) : simgp_img{} {
         height[k] = (h + (1 << s.rows_log2) - 1) >> s.rows_log2;
         stride[k] = (groups * int(strlen(s.group)) + 63) & -64;
         offsets[k] = bytes;
-        bytes += size_t(stride[k]) * size_t(height[k]);
+        if (format == SIMGP_FMT_T64X32) {  // whole groups of four tiles
+            const size_t tile_rows = size_t(h / (k + 1) + 31) / 32;
+            bytes += 8192 * (size_t(w + 127) / 128 * (tile_rows / 2) +
+                             tile_rows % 2 * (size_t(w + 255) / 256));
+        } else {
+            bytes += size_t(stride[k]) * size_t(height[k]);
+        }
     }
     memory.reset(static_cast<uint8_t *>(aligned_alloc(4096, (bytes + 4095) & ~size_t(4095))), free);
     memset(memory.get(), 0xA5, bytes);
@@ -149,6 +160,12 @@ picture::picture(int format, int w, int h) : simgp_img{} {
 }
 
 void paint(const picture &p) {
+    if (p.format == SIMGP_FMT_T64X32) {
+        const picture linear(SIMGP_FMT_YUV420, p.width[0], p.height[0]);
+        paint(linear);
+        if (simgp_csc(&linear, &p) != SIMGP_OK) fail("no way to a tiled picture");
+        return;
+    }
     uint32_t state = 1;
     for_bytes(p, [&](char name, uint8_t *at, double x, double y) {
         const auto value = [&](char c) {
@@ -199,12 +216,20 @@ simgp_img lines(const simgp_img &p, int y, int count) {
     return part;
 }
 
+operation exchange_src_chroma(const operation &f) {
+    return [f](const simgp_img &s, const simgp_img &d) { f(exchanged(s), d); };
+}
+operation exchange_dst_chroma(const operation &f) {
+    return [f](const simgp_img &s, const simgp_img &d) { f(s, exchanged(d)); };
+}
+
 peer libyuv_peer(operation f) {
     return {"libyuv", [f](const simgp_img &, const simgp_img &) { return f; }};
 }
 
 peer libyuv_peer(operation first, int between, operation second) {
-    return {"libyuv, 2 steps", [=](const simgp_img &s, const simgp_img &) -> operation {
+    return {std::string("libyuv via ") + shape_of(between).name,
+            [=](const simgp_img &s, const simgp_img &) -> operation {
                 constexpr int band = 8;
                 const picture temporary(between, s.width[0], band);
                 return [=](const simgp_img &src, const simgp_img &dst) {
@@ -221,7 +246,7 @@ peer libyuv_peer(operation first, int between, operation second) {
 
 std::vector<peer> swscale_peer(int from, int to, int extra_flags) {
     av_log_set_level(AV_LOG_ERROR);
-    const AVPixelFormat a = swscale_format(from), b = swscale_format(to);
+    const AVPixelFormat a = shape_of(from).swscale, b = shape_of(to).swscale;
     if (a == b || !sws_isSupportedInput(a) || !sws_isSupportedOutput(b)) return {};
     const bool swap_src = v_before_u(from), swap_dst = v_before_u(to);
 
@@ -263,10 +288,14 @@ comparison compare(conversion c) {
         c.ours = [name = c.name](const simgp_img &s, const simgp_img &d) {
             if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
         };
-    if (c.swscale)
-        for (peer &p : swscale_peer(c.from, c.to)) c.peers.push_back(std::move(p));
+    for (peer &p : swscale_peer(c.from, c.to)) c.peers.push_back(std::move(p));
 
-    const auto make = [c](const std::string &size) {
+    const auto ours = [ours = c.ours](int from, int to, int w, int h) {
+        const picture src(from, w, h), dst(to, w, h);
+        paint(src);
+        return [=] { ours(src, dst); };
+    };
+    const auto make = [c, ours](const std::string &size) {
         int width = 0, height = 0;
         if (sscanf(size.c_str(), "%dx%d", &width, &height) != 2) fail("no size: " + size);
         const picture src(c.from, width, height), dst(c.to, width, height);
@@ -281,27 +310,32 @@ comparison compare(conversion c) {
             const operation convert = p.make(src, other);
             memset(other.memory.get(), 0xA5, other.bytes);
             convert(src, other);
-            expect_alike(c.name + " by " + p.name, dst, other, c.tolerance);
+            if (c.tolerance > 0) expect_alike(c.name + " by " + p.name, dst, other, c.tolerance);
             m.peers.push_back({p.name, [=] { convert(src, dst); }});
         }
-        m.limit = memory_traffic(src.memory, src.plane[0], src.bytes, dst.memory.get(), dst.bytes);
+        m.limit = memory_traffic(src.memory, src.plane[0], size_t(double(src.bytes) * c.part_read),
+                                 dst.memory.get(), dst.bytes);
 
         // Where a goal asks for the speed of memory, it is that of pictures beyond the cache, and
         // the peer's that of those inside.
         const bool in_cache = size == "320x240", usual = in_cache || size == "1920x1080";
-        if (usual) m.goals.scalar = c.goals.scalar;
-        if (c.goals.limit > 0 ? in_cache : usual) m.goals.peer = c.goals.peer;
-        if (size == "3840x2160") m.goals.limit = c.goals.limit;
-        if (size == "1918x1078") {
-            const picture round_src(c.from, 1920, 1080), round_dst(c.to, 1920, 1080);
-            paint(round_src);
-            m.round_size = [ours = c.ours, round_src, round_dst] { ours(round_src, round_dst); };
-            m.round_units = double(round_src.pixels());
-            m.round_goal = 0.9;
-        }
+        m.goals.scalar = usual ? c.goals.scalar : 0;
+        m.goals.peer = (c.goals.limit > 0 ? in_cache : usual) ? c.goals.peer : 0;
+        m.goals.limit = size == "3840x2160" ? c.goals.limit : 0;
+        if (size == "1918x1078")
+            m.twin = {"1080p", ours(c.from, c.to, 1920, 1080), 1920 * 1080, 0.9};
+        else if (c.twin_from >= 0)
+            m.twin = {shape_of(c.twin_from).name, ours(c.twin_from, c.to, width, height), m.units,
+                      usual ? 0.9 : 0};
         return m;
     };
     return {c.name, {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"}, make};
+}
+
+std::vector<comparison> compare_all(const std::vector<conversion> &all) {
+    std::vector<comparison> comparisons;
+    for (const conversion &c : all) comparisons.push_back(compare(c));
+    return comparisons;
 }
 
 }  // namespace bench

@@ -37,6 +37,10 @@ struct peer {
     operation_maker make;
 };
 
+// The operation with the planes of U and V exchanged in the source, or in the destination.
+operation exchange_src_chroma(const operation &f);
+operation exchange_dst_chroma(const operation &f);
+
 // A libyuv function over the first `From` planes of the source and `To` of the destination:
 // pointer, stride, pointer, stride, ..., what is given in `more`, width, height.
 template <int From, int To, class Function, class... More>
@@ -77,10 +81,12 @@ struct conversion {
     std::vector<peer> peers = {};  // besides swscale
     std::string name = {};         // of itself "nv12_to_rgb565"
     operation ours = {};           // of itself simgp_csc
-    double tolerance = 4;
-    bool swscale = true;
+    double tolerance = 4;          // for peers, see expect_alike; 0: they are not held against ours
+    double part_read = 1;          // of the source's bytes
+    int twin_from = -1;            // the conversion from this format is to be no faster than 0.9
 };
 comparison compare(conversion c);
+std::vector<comparison> compare_all(const std::vector<conversion> &all);
 
 }  // namespace bench
 
