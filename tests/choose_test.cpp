@@ -61,7 +61,7 @@ TEST(choice, every_target_has_its_own_rows) {
     const auto &all = rig::all_targets();
     for (size_t i = 0; i < all.size(); i++)
         for (size_t k = 0; k < i; k++)
-            EXPECT_NE(all[i].rows->vu_to_rgb565_coarse, all[k].rows->vu_to_rgb565_coarse)
+            EXPECT_NE(all[i].rows->vu_to_rgb565_coarse_pair, all[k].rows->vu_to_rgb565_coarse_pair)
                 << all[i].name << ", " << all[k].name;
 }
 
