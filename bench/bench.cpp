@@ -1,5 +1,5 @@
 // simgp-bench: the comparisons, measured in rotation.
-#include "bench/bench.h"
+#include "bench/report.h"
 
 #include <benchmark/benchmark.h>
 #include <libyuv.h>
@@ -47,45 +47,6 @@ struct settings {
     std::vector<target> targets;
     int rounds = 41;
     double batch_us = 100;
-};
-
-struct quartiles {
-    double low = 0, middle = 0, high = 0;
-};
-quartiles quartiles_of(std::vector<double> v) {
-    std::sort(v.begin(), v.end());
-    const auto at = [&](double part) { return v[size_t(part * double(v.size() - 1) + 0.5)]; };
-    return {at(0.25), at(0.5), at(0.75)};
-}
-
-// One line of the table: our rows of one target.
-struct line {
-    std::string name, size, target_name, best_peer;
-    double ns = 0, peer_ns = 0;
-    quartiles peer, scalar, limit, twin;  // quotients of speeds; 0: not measured
-    goal goals;
-    double twin_goal = 0;
-    std::string twin_name;
-
-    // The goals that are not met, and whether there are any at all.
-    std::string missed() const {
-        std::string text;
-        const auto want = [&](const char *what, double goal, const quartiles &got) {
-            if (goal == 0 || got.middle == 0 || got.middle >= goal) return;
-            char s[60];
-            snprintf(s, sizeof s, "%s%s %.2g", text.empty() ? "" : ", ", what, goal);
-            text += s;
-        };
-        want("peer", goals.peer, peer);
-        want("scalar", goals.scalar, scalar);
-        want("limit", goals.limit, limit);
-        want(twin_name.c_str(), twin_goal, twin);
-        return text;
-    }
-    bool has_goals() const {
-        return (goals.peer && peer.middle) || (goals.scalar && scalar.middle) ||
-               (goals.limit && limit.middle) || (twin_goal && twin.middle);
-    }
 };
 
 // Runs all contenders of a match in rotation; the lines have what came out.
@@ -215,62 +176,19 @@ class rotation {
     std::vector<size_t> order_;
 };
 
-// Prints the lines that the benchmarks leave behind.
+// Prints the lines that the benchmarks leave behind, and keeps them.
 class table : public benchmark::BenchmarkReporter {
   public:
-    std::vector<line> fresh;
-    int met = 0;
-    std::vector<std::string> short_of;
+    std::vector<line> fresh, all;
 
     bool ReportContext(const Context &) override {
-        print("operation", "size", "rows", "ns", "x scalar", "best peer", "its ns", "x peer",
-              "quartiles", "x limit", "x twin", "goals");
-        print("-", "-", "-", "-", "-", "-", "-", "-", "-", "-", "-", "-");
+        print_head();
         return true;
     }
-
     void ReportRuns(const std::vector<Run> &) override {
-        for (const line &l : fresh) {
-            const std::string missed = l.missed();
-            if (!missed.empty())
-                short_of.push_back(l.name + " " + l.size + " " + l.target_name + ": " + missed);
-            met += l.has_goals() && missed.empty();
-            const std::string spread =
-                l.peer.middle ? number(l.peer.low) + "-" + number(l.peer.high) : "";
-            print(l.name, l.size, l.target_name, number(l.ns, 3), number(l.scalar.middle, 1),
-                  l.best_peer, number(l.peer_ns, 3), number(l.peer.middle), spread,
-                  number(l.limit.middle),
-                  l.twin.middle ? number(l.twin.middle) + " " + l.twin_name : "",
-                  !missed.empty() ? "SHORT: " + missed
-                  : l.has_goals() ? "met"
-                                  : "");
-        }
-        fflush(stdout);
+        for (const line &l : fresh) print(l);
+        all.insert(all.end(), fresh.begin(), fresh.end());
         fresh.clear();
-    }
-
-  private:
-    static std::string number(double v, int digits = 2) {
-        if (v == 0) return "";
-        char s[40];
-        snprintf(s, sizeof s, "%.*f", digits, v);
-        return s;
-    }
-
-    template <class... Cells>
-    static void print(const Cells &...cells) {
-        static constexpr int widths[] = {-26, -9, -6, 6, 8, -20, 6, 6, -11, 7, -11, -20};
-        int column = 0;
-        const auto one = [&](const std::string &cell) {
-            const int w = widths[column++];
-            if (cell == "-")
-                printf("|%s",
-                       std::string(size_t(abs(w)) + 1, '-').append(w > 0 ? ":" : "-").c_str());
-            else
-                printf("| %*s ", w, cell.c_str());
-        };
-        (one(cells), ...);
-        printf("|\n");
     }
 };
 
@@ -316,7 +234,7 @@ int run(int argc, char **argv) {
         "  simgp-bench --filter 'nv12_to' --size 1920x1080 --target avx2\n"
         "  simgp-bench --json speed.json");
     settings s;
-    std::string filter = ".", json, libyuv_set = "all";
+    std::string filter = ".", json, markdown, libyuv_set = "all";
     std::vector<std::string> sizes, target_names;
     bool quick = false, list = false;
     app.add_option("--filter", filter, "only operations whose name matches this expression");
@@ -329,6 +247,7 @@ int run(int argc, char **argv) {
         ->check(CLI::PositiveNumber);
     app.add_option("--libyuv", libyuv_set, "instruction sets for libyuv: all, avx2, sse41");
     app.add_option("--json", json, "write all times to this file as well");
+    app.add_option("--markdown", markdown, "write tables with one row per operation to this file");
     app.add_flag("--quick", quick, "320x240 and 1920x1080 alone, few rounds");
     app.add_flag("--list", list, "list the operations and sizes");
     app.allow_extras();
@@ -374,9 +293,8 @@ int run(int argc, char **argv) {
     if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) return 1;
     if (benchmark::RunSpecifiedBenchmarks(&out) == 0) return 1;
     if (list) return 0;
-    printf("\n%d lines meet their goals, %d fall short", out.met, int(out.short_of.size()));
-    for (const std::string &text : out.short_of) printf("\n  %s", text.c_str());
-    printf("\n");
+    print_summary(out.all);
+    if (!markdown.empty()) write_markdown(markdown, out.all);
     return 0;
 }
 
