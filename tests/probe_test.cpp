@@ -1,0 +1,248 @@
+// simgp-probe on streams made by hand: what it lists, where it cuts, what it says about bad input.
+#include <gtest/gtest.h>
+
+#include <nlohmann/json.hpp>
+#include <vector>
+
+#include "scmn/bits.h"
+#include "tests/program.h"
+
+namespace {
+
+using nlohmann::json;
+const std::string probe = SIMGP_PROBE;
+
+struct picture {
+    uint64_t offset, size;
+    bool key;
+    bool operator==(const picture &) const = default;
+};
+void PrintTo(const picture &p, std::ostream *out) {
+    *out << p.offset << "+" << p.size << (p.key ? " key" : "");
+}
+
+// A stream that is written piece by piece and remembers its pictures.
+struct stream {
+    std::string bytes;
+    std::vector<picture> pictures;
+
+    // A picture: its headers, its first bytes, and payload that holds no start code.
+    void add(const std::string &start, bool key, size_t payload) {
+        pictures.push_back({bytes.size(), start.size() + payload, key});
+        bytes += start + std::string(payload, '\x55');
+    }
+};
+
+std::vector<picture> listed(const json &file) {
+    std::vector<picture> pictures;
+    for (const json &p : file["pictures"]) pictures.push_back({p["offset"], p["size"], p["key"]});
+    return pictures;
+}
+
+// A NAL unit from pairs of value and number of bits; ue() gives the pair of an Exp-Golomb code.
+using bit_field = std::pair<uint32_t, int>;
+bit_field ue(uint32_t value) { return {value + 1, 2 * (31 - scmn_bsr_clz_in_code(value + 1)) + 1}; }
+std::string nal(uint8_t header, std::vector<bit_field> fields, bool long_code = false) {
+    uint8_t buffer[64];
+    scmn_bsw_ctx bits;
+    scmn_bsw_init(&bits, buffer, sizeof buffer, nullptr);
+    fields.push_back({1, 1});  // stop bit
+    for (const auto &[value, count] : fields) scmn_bsw_write(&bits, value, count);
+    while (bits.free_bits != 8) scmn_bsw_write1(&bits, 0);
+    std::string unit =
+        std::string(long_code ? "\0\0\0\1" : "\0\0\1", long_code ? 4 : 3) + char(header);
+    int zeros = 0;
+    for (const uint8_t *p = buffer; p < bits.cur; p++) {
+        if (zeros >= 2 && *p <= 3) unit += '\3', zeros = 0;
+        unit += char(*p);
+        zeros = *p == 0 ? zeros + 1 : 0;
+    }
+    return unit;
+}
+
+// Pictures counted modulo 16, in frames or fields.
+std::string sequence_set(bool frames_only) {
+    return nal(0x67,
+               {{77, 8},
+                {0, 8},
+                {30, 8},
+                ue(0),
+                ue(0),
+                ue(2),
+                ue(1),
+                {0, 1},
+                ue(10),
+                ue(8),
+                {frames_only, 1},
+                {1, 1},
+                {0, 1},
+                {0, 1}},
+               true);
+}
+const std::string picture_set = nal(0x68, {ue(0), ue(0), {0, 1}, {0, 1}, ue(0)}, true);
+std::string slice(bool idr, uint32_t block, uint32_t frame, std::vector<bit_field> field = {}) {
+    std::vector<bit_field> fields = {ue(block), ue(7), ue(0), {frame % 16, 4}};
+    fields.insert(fields.end(), field.begin(), field.end());
+    if (idr) fields.push_back(ue(3));
+    fields.push_back({0x155555, 24});
+    return nal(idr ? 0x65 : 0x41, fields);
+}
+
+class probe_test : public testing::Test {
+  protected:
+    json ask(const std::string &arguments) {
+        const program::outcome got = program::run(place, probe + " --json " + arguments);
+        EXPECT_EQ(got.err, "");
+        EXPECT_EQ(got.status, 0);
+        return json::parse(got.out);
+    }
+    void expect_pictures(const stream &s, const std::string &codec) {
+        const std::string path = place.write("stream", s.bytes);
+        for (const std::string &arguments : {path, "- <" + path, "- < <(cat " + path + ")"}) {
+            const program::outcome got =
+                program::run(place, "bash -c '" + probe + " --json " + arguments + "'");
+            EXPECT_EQ(got.status, 0) << got.err;
+            const json file = json::parse(got.out)[0];
+            EXPECT_EQ(file["codec"], codec);
+            EXPECT_EQ(listed(file), s.pictures);
+            EXPECT_EQ(file["summary"]["pictures"], s.pictures.size());
+        }
+    }
+    // Bad input: status 1, one line that names what is wrong, no list.
+    void expect_fault(const std::string &arguments, const std::string &text) {
+        const program::outcome got = program::run(place, probe + " " + arguments);
+        EXPECT_EQ(got.status, 1) << arguments;
+        EXPECT_EQ(got.out.find("pictures,"), std::string::npos);
+        EXPECT_EQ(std::count(got.err.begin(), got.err.end(), '\n'), 1) << got.err;
+        EXPECT_NE(got.err.find(text), std::string::npos) << got.err;
+    }
+
+    program::folder place;
+};
+
+TEST_F(probe_test, h264_pictures_of_several_slices) {
+    stream s;
+    const std::string delimiter("\0\0\0\1\x09\x10", 6), sei("\0\0\1\x06\x05\x01\x00\x80", 8);
+    s.add(
+        delimiter + sequence_set(true) + picture_set + sei + slice(true, 0, 0) + slice(true, 40, 0),
+        true, 50);
+    s.add(delimiter + slice(false, 0, 1) + slice(false, 40, 1) + slice(false, 80, 1), false, 10);
+    // Without a delimiter, and without its first slice: the frame number tells.
+    s.add(slice(false, 40, 2), false, 10);
+    s.add(sei + slice(false, 0, 2), false, 10);  // the same number, but a header between
+    s.add(sequence_set(true) + picture_set + slice(true, 0, 0), true, 10);
+    expect_pictures(s, "H.264");
+
+    // Two fields are two pictures.
+    stream fields;
+    fields.add(sequence_set(false) + picture_set + slice(true, 0, 0, {{1, 1}, {0, 1}}), true, 10);
+    fields.add(slice(false, 0, 0, {{1, 1}, {1, 1}}), false, 10);
+    fields.add(slice(false, 0, 1, {{0, 1}}), false, 10);
+    expect_pictures(fields, "H.264");
+}
+
+TEST_F(probe_test, mpeg4_and_h263) {
+    const std::string headers("\0\0\1\xB0\1\0\0\1\xB5\x09\0\0\1\0\0\0\1\x20\x08\x84", 20);
+    const auto vop = [](int type) { return std::string("\0\0\1\xB6", 4) + char(type << 6 | 0x10); };
+    stream m;
+    m.add(headers + vop(0), true, 30);
+    m.add(vop(1), false, 9);
+    m.add(vop(2), false, 0);
+    m.add(std::string("\0\0\1\xB3\0\0\x07", 7) + vop(0), true, 7);
+    m.bytes += std::string("\0\0\1\xB1", 4);
+    m.pictures.back().size += 4;
+    expect_pictures(m, "MPEG-4 part 2");
+
+    stream h;
+    for (int i = 0; i < 5; i++)
+        h.add(std::string("\0\0\x80", 3) + char(i << 2 | 2) + char(i % 3 ? 0x0A : 0x08), i % 3 == 0,
+              40);
+    expect_pictures(h, "H.263");
+}
+
+// Start codes at every place around the seams of what is read at a time.
+TEST_F(probe_test, long_streams) {
+    stream s;
+    s.add(sequence_set(true) + picture_set + slice(true, 0, 0), true, 1000);
+    for (uint32_t i = 1; s.bytes.size() < (4 << 20); i++) {
+        const size_t seam = (s.bytes.size() / (1 << 20) + 1) << 20;
+        const bool near = seam - s.bytes.size() < 400;
+        s.add(slice(false, 0, i), false,
+              near ? i % 3 : std::min<size_t>(seam - s.bytes.size() - 300, 70000));
+    }
+    expect_pictures(s, "H.264");
+}
+
+TEST_F(probe_test, text_and_summary) {
+    stream s;
+    s.bytes = "junk";
+    for (int i = 0; i < 7; i++)
+        s.add(std::string("\0\0\1\xB6", 4) + (i % 3 ? "\x50" : "\x10"), i % 3 == 0, 15);
+    const std::string path = place.write("a.m4v", s.bytes);
+    const program::outcome got = program::run(place, probe + " " + path);
+    EXPECT_EQ(got.out, path +
+                           ": MPEG-4 part 2, from its start codes\n"
+                           "  picture        offset      size  key\n"
+                           "        0             4        20  key\n"
+                           "        1            24        20  -\n"
+                           "        2            44        20  -\n"
+                           "        3            64        20  key\n"
+                           "        4            84        20  -\n"
+                           "        5           104        20  -\n"
+                           "        6           124        20  key\n"
+                           "  7 pictures, 3 key, one every 3.0 (3 to 3); 140 bytes, the largest "
+                           "20; 4 bytes outside pictures\n");
+    EXPECT_EQ(got.err, "");
+    const json file = ask("--summary " + path)[0];
+    EXPECT_EQ(file["summary"]["key_spacing"]["mean"], 3.0);
+    EXPECT_EQ(file["summary"]["stream_bytes"], 144);
+    EXPECT_FALSE(file.contains("pictures"));
+    EXPECT_EQ(ask("--fourcc xvid " + path)[0]["recognised_by"], "FourCC");
+}
+
+TEST_F(probe_test, tags) {
+    const struct {
+        const char *tag;
+        int type;
+    } tags[] = {{"avc1", 104}, {"aac", 306}, {"0x55", 305}, {"85", 305}, {"WMV3", 107}};
+    for (const auto &[tag, type] : tags)
+        EXPECT_EQ(ask(std::string("--fourcc ") + tag)[0]["media_type"], type) << tag;
+    for (const char *tag : {"abcd", "toolong", "\"\"", "0x123456789", "99999999999999999999"})
+        expect_fault(std::string("--fourcc ") + tag, "--fourcc");
+}
+
+TEST_F(probe_test, bad_input) {
+    using namespace std::string_literals;
+    expect_fault(place / "missing", "No such file");
+    expect_fault(place.write("empty", ""), "empty");
+    expect_fault(place / "", "directory");
+    expect_fault(place.write("text", "no stream at all\n"), "no start codes");
+    expect_fault(place.write("mp4",
+                             "\0\0\0\x18"
+                             "ftypisom"s),
+                 "MP4");
+    expect_fault(place.write("ps", "\0\0\1\xBA\x44"s), "MPEG program stream");
+    expect_fault(place.write("lengths", "\0\0\0\2\x67\1\0\0\0\3\x65\1\2"s),
+                 "lengths in place of start codes");
+    const std::string sets = place.write("sets", sequence_set(true) + picture_set);
+    expect_fault(sets, "no H.264 picture");
+    expect_fault("--fourcc WMV1 " + sets, "no start codes");
+
+    // In JSON the fault stands in its file's object, and the other files are listed.
+    const std::string good =
+        place.write("good", sequence_set(true) + picture_set + slice(true, 0, 0));
+    const program::outcome got =
+        program::run(place, probe + " --json " + sets + " " + good + " /nowhere");
+    EXPECT_EQ(got.status, 1);
+    const json files = json::parse(got.out);
+    ASSERT_EQ(files.size(), 3u);
+    EXPECT_NE(std::string(files[0]["error"]).find("no H.264 picture"), std::string::npos);
+    EXPECT_EQ(files[1]["pictures"].size(), 1u);
+    EXPECT_TRUE(files[2].contains("error"));
+
+    EXPECT_EQ(program::run(place, probe).status, 2);
+    EXPECT_EQ(program::run(place, probe + " --nonsense").status, 2);
+    EXPECT_EQ(program::run(place, probe + " " + good + " >/dev/full").status, 1);
+}
+
+}  // namespace

@@ -1,0 +1,60 @@
+// Elementary video streams, cut into coded pictures.
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "tools/h264.h"
+#include "tools/input.h"
+
+namespace tools {
+
+/// A coded picture with the headers in front of it.
+struct CodedPicture {
+    uint64_t offset = 0, size = 0;  // bytes
+    bool key = false;
+};
+
+/// The media type (SCMN_MT_*) of a FourCC in words.
+const char *media_name(int32_t media_type);
+
+class CodedStream {
+  public:
+    /// A stream of `media_type`, which must be one with start codes, or where that is 0, of the
+    /// type that the first megabyte tells. Keeps a part of the stream in memory, whatever its size.
+    CodedStream(Input &input, int32_t media_type);
+
+    int32_t media_type() const { return media_type_; }
+    /// The next picture; false behind the last one.
+    bool next(CodedPicture &picture);
+
+  private:
+    // A start code, with some of what follows it.
+    struct Unit {
+        uint64_t offset;
+        const uint8_t *bytes;
+        size_t size;
+    };
+    enum class Role { header, picture, more };
+
+    int32_t recognise() const;
+    [[noreturn]] void reject() const;
+    bool read_more();
+    bool find(Unit &unit);
+    Role role(const Unit &unit);
+
+    Input &input_;
+    int32_t media_type_;
+    H264 h264_;
+
+    std::vector<uint8_t> window_;
+    uint64_t window_offset_ = 0;
+    size_t at_ = 0;  // where the search goes on
+    bool ended_ = false;
+
+    // The picture that is being collected.
+    bool started_ = false, has_picture_ = false;
+    CodedPicture current_;
+};
+
+}  // namespace tools
