@@ -42,9 +42,16 @@ struct yuv_step : source<Layout> {
         to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c.even),
                   Matrix::apply(Matrix::luma_odd(y), c.odd));
     }
-    template <class Pixels>
-    static void convert(uint8_t *out, ptrdiff_t x, const Pixels &p) {
+    static void convert(uint8_t *out, ptrdiff_t x, const yuv_half &p) {
         apply(out, x, p.y, terms(p));
+    }
+    // In this order, since the terms of even and odd pixels together would not fit 16 registers.
+    static void convert(uint8_t *out, ptrdiff_t x, const yuv_full &p) {
+        const auto even = Matrix::apply(Matrix::luma_even(p.y),
+                                        Matrix::template chroma<from::pairs>(p.pairs_even));
+        const auto odd =
+            Matrix::apply(Matrix::luma_odd(p.y), Matrix::template chroma<from::pairs>(p.pairs_odd));
+        to::store(out + x * size, even, odd);
     }
     static void part(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
         part_through_stack<yuv_step>(in, out, x, count);
