@@ -6,6 +6,7 @@
 // clang-format off
 #define SIMGP_AREAS(X) \
     X(simgp, yuv2rgb) \
+    X(simgp, dither)  \
     X(scmn, mem)      \
     X(scmn, keyframe)
 // clang-format on

@@ -67,6 +67,33 @@ inline s16v sar(s16v a) {
 inline s16v add(s16v a, s16v b) { return _mm256_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm256_adds_epi16(a, b); }
 
+inline u8v add_sat_u8(u8v a, u8v b) { return _mm256_adds_epu8(a, b); }
+inline u8v sub_sat_u8(u8v a, u8v b) { return _mm256_subs_epu8(a, b); }
+
+// All bits of a lane that is true.
+using mask16 = __m256i;
+inline mask16 greater(s16v a, s16v b) { return _mm256_cmpgt_epi16(a, b); }
+inline u8v select(mask16 m, u8v yes, u8v no) { return _mm256_blendv_epi8(no, yes, m); }
+
+// With two bits for a lane; the carry into the lower one counts.
+using chain_state = uint64_t;
+inline chain_state chain_begin(bool s) { return !s; }
+inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
+    constexpr uint32_t odd = 0xCCCCCCCC;
+    const uint32_t x = static_cast<uint32_t>(_mm256_movemask_epi8(a)) ^ odd;
+    const uint32_t y = static_cast<uint32_t>(_mm256_movemask_epi8(b)) ^ odd;
+    const uint64_t sum = static_cast<uint64_t>(x) + y + carry;
+    carry = sum >> 32;
+    // Bit 2i, inverted at even i, to all bits of lane i.
+    const __m256i s =
+        _mm256_shuffle_epi8(_mm256_set1_epi32(static_cast<int>(static_cast<uint32_t>(sum) ^ x ^ y)),
+                            _mm256_setr_epi8(0, 0, 0, 0, 0, 0, 0, 0, 1, 1, 1, 1, 1, 1, 1, 1,  //
+                                             2, 2, 2, 2, 2, 2, 2, 2, 3, 3, 3, 3, 3, 3, 3, 3));
+    const __m256i bit = _mm256_set1_epi64x(static_cast<int64_t>(0x4040101004040101));
+    const __m256i odd_bit = _mm256_set1_epi64x(0x4040000004040000);
+    return _mm256_cmpeq_epi8(_mm256_and_si256(s, bit), odd_bit);
+}
+
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {

@@ -66,6 +66,24 @@ inline s16v sar(s16v a) {
 inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }
 
+inline u8v add_sat_u8(u8v a, u8v b) { return _mm512_adds_epu8(a, b); }
+inline u8v sub_sat_u8(u8v a, u8v b) { return _mm512_subs_epu8(a, b); }
+
+using mask16 = __mmask32;
+inline mask16 greater(s16v a, s16v b) { return _mm512_cmpgt_epi16_mask(a, b); }
+inline u8v select(mask16 m, u8v yes, u8v no) { return _mm512_mask_blend_epi16(m, no, yes); }
+
+// With one bit for a lane.
+using chain_state = uint64_t;
+inline chain_state chain_begin(bool s) { return !s; }
+inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
+    constexpr uint32_t odd = 0xAAAAAAAA;
+    const uint32_t x = a ^ odd, y = b ^ odd;
+    const uint64_t sum = static_cast<uint64_t>(x) + y + carry;
+    carry = sum >> 32;
+    return static_cast<uint32_t>(sum) ^ x ^ y ^ ~odd;
+}
+
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {

@@ -141,6 +141,50 @@ inline s16v add_sat(s16v a, s16v b) {
     return make<s16v>([&](int i) { return clamp_to(-32768, 32767, a.lane[i] + b.lane[i]); });
 }
 
+// Sums and differences of bytes, saturating.
+inline u8v add_sat_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return clamp_to(0, 255, a.lane[i] + b.lane[i]); });
+}
+inline u8v sub_sat_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return clamp_to(0, 255, a.lane[i] - b.lane[i]); });
+}
+
+// Truths, one for each 16-bit lane. select takes both bytes of a lane from `yes` or from `no`.
+struct mask16 {
+    using type = bool;
+    static constexpr int count = bytes / 2;
+    bool lane[count];
+};
+inline mask16 greater(s16v a, s16v b) {
+    return make<mask16>([&](int i) { return a.lane[i] > b.lane[i]; });
+}
+inline u8v select(mask16 m, u8v yes, u8v no) {
+    return make<u8v>([&](int i) { return (m.lane[i / 2] ? yes : no).lane[i]; });
+}
+
+// A chain of decisions from lane to lane: s(i) = a(i) or (b(i) and not s(i - 1)), where a implies
+// b. chain_before gives s(i - 1) for lane i; the state, which chain_begin makes of s(-1), carries
+// the last decision to the next call.
+//
+// The machines settle all lanes with one addition. In terms of t(i) = s(i) xor (i is odd), lane i
+// hands t on where b and not a; elsewhere it sets t (a at even i, not b at odd i) or clears it.
+// That is the carry chain of an adder: lanes propagate, generate or kill, and t(i - 1) is the carry
+// into lane i. Of the two summands' bits at a lane, both must be set to generate, none to kill, one
+// to propagate: at even lanes these are the bits of a and b, at odd lanes those of not a and not b,
+// and which of them stands in which summand is the same. With odd = the bits of the odd lanes,
+//   x = a xor odd, y = b xor odd, carries = (x + y + carry in) xor x xor y
+// and s(i - 1) = carry into lane i xor (i is even). A lane may have several equal
+// bits; the carry into the lowest is the one.
+using chain_state = bool;
+inline chain_state chain_begin(bool s) { return s; }
+inline mask16 chain_before(mask16 a, mask16 b, chain_state &s) {
+    return make<mask16>([&](int i) {
+        const bool before = s;
+        s = a.lane[i] || (b.lane[i] && !before);
+        return before;
+    });
+}
+
 // A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the
 // same sign and at most 255 in size, and the sum of the two products fits 16 bits.
 template <int A, int B, int C>

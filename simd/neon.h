@@ -64,6 +64,37 @@ inline s16v sar(s16v a) {
 inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }
 
+inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
+inline u8v sub_sat_u8(u8v a, u8v b) { return vqsubq_u8(a, b); }
+
+// All bits of a lane that is true.
+using mask16 = uint16x8_t;
+inline mask16 greater(s16v a, s16v b) { return vcgtq_s16(a, b); }
+inline u8v select(mask16 m, u8v yes, u8v no) { return vbslq_u8(as_u8(m), yes, no); }
+
+// With eight bits for a lane, in the low 64-bit lane of a vector: nothing has to move to the
+// general registers and back. The last lane of the chain has seven bits, so that the carry out of
+// it is bit 63 of the sum.
+using chain_state = uint64x2_t;
+inline chain_state chain_begin(bool s) { return vdupq_n_u64(!s); }
+inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
+    const auto bits = [](mask16 m) {
+        const uint8x8_t n = vmovn_u16(m);
+        return vreinterpretq_u64_u8(vcombine_u8(n, n));
+    };
+    const uint64x2_t odd = vdupq_n_u64(0xFF00FF00FF00FF00);
+    const uint64x2_t last = vdupq_n_u64(0x8000000000000000);
+    const uint64x2_t x = vbicq_u64(veorq_u64(bits(a), odd), last);
+    const uint64x2_t y = vbicq_u64(veorq_u64(bits(b), odd), last);
+    const uint64x2_t sum = vaddq_u64(vaddq_u64(x, y), carry);
+    carry = vshrq_n_u64(sum, 63);
+    // Bit 0 of each byte xor (lane is even), to all bits of the lane.
+    const uint8x8_t carries = vget_low_u8(vreinterpretq_u8_u64(veorq_u64(sum, veorq_u64(x, y))));
+    const uint8x8_t s =
+        vtst_u8(veor_u8(carries, vreinterpret_u8_u16(vdup_n_u16(0x00FF))), vdup_n_u8(1));
+    return vreinterpretq_u16_s16(vmovl_s8(vreinterpret_s8_u8(s)));
+}
+
 inline u16v even(u8v v) { return vandq_u16(as_u16(v), vdupq_n_u16(255)); }
 inline u16v odd(u8v v) { return vshrq_n_u16(as_u16(v), 8); }
 inline u8v join(u16v even, u16v odd) { return as_u8(vsliq_n_u16(even, odd, 8)); }

@@ -61,6 +61,32 @@ inline s16v sar(s16v a) {
 inline s16v add(s16v a, s16v b) { return _mm_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm_adds_epi16(a, b); }
 
+inline u8v add_sat_u8(u8v a, u8v b) { return _mm_adds_epu8(a, b); }
+inline u8v sub_sat_u8(u8v a, u8v b) { return _mm_subs_epu8(a, b); }
+
+// All bits of a lane that is true.
+using mask16 = __m128i;
+inline mask16 greater(s16v a, s16v b) { return _mm_cmpgt_epi16(a, b); }
+inline u8v select(mask16 m, u8v yes, u8v no) { return _mm_blendv_epi8(no, yes, m); }
+
+// With two bits for a lane; the carry into the lower one counts.
+using chain_state = uint32_t;
+inline chain_state chain_begin(bool s) { return !s; }
+inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
+    constexpr uint32_t odd = 0xCCCC;
+    const uint32_t x = static_cast<uint32_t>(_mm_movemask_epi8(a)) ^ odd;
+    const uint32_t y = static_cast<uint32_t>(_mm_movemask_epi8(b)) ^ odd;
+    const uint32_t sum = x + y + carry;
+    carry = sum >> 16;
+    // Bit 2i, inverted at even i, to all bits of lane i.
+    const __m128i s = _mm_shuffle_epi8(_mm_cvtsi32_si128(static_cast<int>(sum ^ x ^ y)),
+                                       _mm_setr_epi8(0, 0, 0, 0, 0, 0, 0, 0,  //
+                                                     1, 1, 1, 1, 1, 1, 1, 1));
+    const __m128i bit = _mm_set1_epi64x(static_cast<int64_t>(0x4040101004040101));
+    const __m128i odd_bit = _mm_set1_epi64x(0x4040000004040000);
+    return _mm_cmpeq_epi8(_mm_and_si128(s, bit), odd_bit);
+}
+
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {

@@ -51,12 +51,18 @@ using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
 // count. Reads p[0 .. count + 1].
 using find_code_row = ptrdiff_t(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t code);
 
+// Dithers row `cur` of a plane, between its rows above and below, and makes `below` of the row that
+// lies there in the source. `width` >= 5 samples a row; `src` shares no memory with the others.
+using dither_row = void(const uint8_t *src, const uint8_t *above, uint8_t *cur, uint8_t *below,
+                        ptrdiff_t width);
+
 struct rows {
     // yuv2rgb: null where no kernel needs the row.
     yuv_to_rgb_row *yuv_to_rgb[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
     yuv_to_rgb_row_pair *yuv_to_rgb_pair[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
     yuv_to_rgb_row_pair *vu_to_rgb565_coarse_pair;  // with the coefficients of 6 fractional bits
 
+    dither_row *dither;        // dither
     fill_row *fill;            // mem
     find_code_row *find_code;  // keyframe
 

@@ -36,6 +36,7 @@
 #define SIMGP_SIMGP_H
 
 #include "simgp/csc.h"
+#include "simgp/dither.h"
 #include "simgp/img.h"
 #include "simgp/yuv2rgb.h"
 

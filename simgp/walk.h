@@ -46,32 +46,50 @@ inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, false};
 inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, true};
 inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, true};
 
+// Four kernels let row 0 of an odd-height picture have the first chroma line to itself, unless the
+// width is a multiple of 4: row y then takes line (y + 1) >> 1.
+inline int first_line_alone(const csc_args &a) {
+    return a.src_widths[0] & 3 ? a.src_heights[0] & 1 : 0;
+}
+
 // Calls `row` for every row from top to bottom, or `pair` for pairs of rows where chroma serves
-// two. Row y then takes chroma line (y + lead) >> 1.
-inline void walk_yuv_to_rgb(const csc_args &a, const yuv_planes &planes, yuv_to_rgb_row *row) {
+// two. Row y then takes chroma line (y + lead) >> 1. `luma` gives the lines of luma in this order.
+template <class Luma>
+void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes,
+                     yuv_to_rgb_row *row) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
-    const plane_lines luma = src_lines(a, 0), u = src_lines(a, planes.u),
-                      v = src_lines(a, planes.v);
+    const plane_lines u = src_lines(a, planes.u), v = src_lines(a, planes.v);
     const plane_lines out = dst_lines(a, 0);
     for (ptrdiff_t y = 0; y < height; y++)
         row(luma.line(y), u.line(y), v.line(y), out.line(y), width);
 }
-inline void walk_yuv_to_rgb(const csc_args &a, const yuv_planes &planes, yuv_to_rgb_row_pair *pair,
-                            int lead) {
+template <class Luma>
+void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes,
+                     yuv_to_rgb_row_pair *pair, int lead) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
-    const plane_lines luma = src_lines(a, 0), u = src_lines(a, planes.u),
-                      v = src_lines(a, planes.v);
+    const plane_lines u = src_lines(a, planes.u), v = src_lines(a, planes.v);
     const plane_lines out = dst_lines(a, 0);
     for (ptrdiff_t y = 0; y < height;) {
         const ptrdiff_t chroma = (y + lead) >> 1;
         // The row below, or the row again where it has its chroma line to itself.
         const ptrdiff_t below = y + 1 < height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
-        pair(luma.line(y), luma.line(below), u.line(chroma), v.line(chroma), out.line(y),
-             out.line(below), width);
+        const uint8_t *const first = luma.line(y), *const second = luma.line(below);
+        pair(first, second, u.line(chroma), v.line(chroma), out.line(y), out.line(below), width);
         y = below + 1;
     }
+}
+
+// The same with the rows of `live` that the formats need.
+template <class Luma>
+void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes, const rows &live,
+                     rgb_packing packing, int lead) {
+    const size_t from = size_t(planes.layout), to = size_t(packing);
+    if (planes.serves_two_rows)
+        walk_yuv_to_rgb(a, luma, planes, live.yuv_to_rgb_pair[from][to], lead);
+    else
+        walk_yuv_to_rgb(a, luma, planes, live.yuv_to_rgb[from][to]);
 }
 
 }  // namespace simgp

@@ -142,17 +142,8 @@ void fill_yuv2rgb(rows &t) {
 namespace {
 
 void convert(const csc_args &a, const yuv_planes &planes, rgb_packing packing, int lead = 0) {
-    const rows &live = live_rows();
-    const size_t from = size_t(planes.layout), to = size_t(packing);
-    if (planes.serves_two_rows)
-        walk_yuv_to_rgb(a, planes, live.yuv_to_rgb_pair[from][to], lead);
-    else
-        walk_yuv_to_rgb(a, planes, live.yuv_to_rgb[from][to]);
+    walk_yuv_to_rgb(a, src_lines(a, 0), planes, live_rows(), packing, lead);
 }
-
-// Four kernels let row 0 of an odd-height picture have the first chroma line to itself, unless the
-// width is a multiple of 4: row y then takes line (y + 1) >> 1.
-int first_line_alone(const csc_args &a) { return a.src_widths[0] & 3 ? a.src_heights[0] & 1 : 0; }
 
 }  // namespace
 }  // namespace simgp
@@ -185,5 +176,5 @@ KERNEL(nv12, bgr565)
 KERNEL(nv12, rgb888)
 KERNEL(nv21, bgr565)
 KERNEL(nv21, rgb888)
-SIMGP_CSC_KERNEL(simgp_csc_nv21_to_rgb565, walk_yuv_to_rgb(args, planes_nv21, live_rows().vu_to_rgb565_coarse_pair, 0))
+SIMGP_CSC_KERNEL(simgp_csc_nv21_to_rgb565, walk_yuv_to_rgb(args, src_lines(args, 0), planes_nv21, live_rows().vu_to_rgb565_coarse_pair, 0))
 // clang-format on

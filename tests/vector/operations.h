@@ -63,6 +63,16 @@ static const operation operations[] = {
 
     VECTOR("add", s16, add(a, b)),
     VECTOR("add_sat", s16, add_sat(a, b)),
+    VECTOR("add_sat_u8", u8, add_sat_u8(a, b)),
+    VECTOR("sub_sat_u8", u8, sub_sat_u8(a, b)),
+    VECTOR("greater, select", u8, select(greater(as_s16(as_u16(a)), as_s16(as_u16(b))), c, b)),
+    MEMORY("greater, equal lanes", bytes, put(out, select(greater(s16(in, 0), s16(in, 0)), u8(in, 1), u8(in, 2)))),
+    MEMORY("chain_before", 4 * bytes, chain_state state = chain_begin(in[-1] & 1);
+           for (int k = 0; k < 4; k++) {
+               const s16v v = s16(in, k);  // decided anew at one lane in four
+               const mask16 set = greater(v, as_s16(set_u16(24576))), keep = greater(v, as_s16(set_u16(57344)));
+               put(out + k * bytes, select(chain_before(set, keep, state), set_u8(255), set_u8(0)));
+           }),
     VECTOR("pair_dot luma even", u8, pair_dot<149, 0, 13440>(a)),
     VECTOR("pair_dot luma odd", u8, pair_dot<0, 150, 13552>(a)),
     VECTOR("pair_dot negative", u8, pair_dot<-50, -104, 3312>(a)),
