@@ -5,6 +5,7 @@
 
 // clang-format off
 #define SIMGP_AREAS(X) \
+    X(simgp, rgb2yuv) \
     X(simgp, yuv2rgb) \
     X(simgp, dither)  \
     X(scmn, mem)      \

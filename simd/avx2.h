@@ -205,6 +205,104 @@ inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     store(p + 3 * bytes, _mm256_unpackhi_epi16(ab_hi, cd_hi));
 }
 
+inline u8v join_high(u16v a, u16v b) {
+    return _mm256_or_si256(_mm256_srli_epi16(a, 8),
+                           _mm256_and_si256(b, _mm256_set1_epi16(static_cast<int16_t>(0xFF00))));
+}
+inline void store_high(uint8_t *p, u16v a) {
+    const __m256i v = _mm256_srli_epi16(a, 8);
+    _mm_storeu_si128(reinterpret_cast<__m128i *>(p),
+                     _mm_packus_epi16(_mm256_castsi256_si128(v), _mm256_extracti128_si256(v, 1)));
+}
+
+// Words of the even and of the odd pixels: channels 0 and 2 as a pair of bytes for the
+// multiply-add, and channel 1 alone.
+struct rgb_v {
+    __m256i ac_even, b_even, ac_odd, b_odd;
+};
+
+// The 16 bytes at p and those at q.
+inline __m256i load_blocks(const uint8_t *p, const uint8_t *q) {
+    const auto block = [](const uint8_t *at) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(at));
+    };
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(p)), block(q), 1);
+}
+
+inline rgb_v load_565(const uint8_t *p) {
+    const __m256i v0 = load_blocks(p, p + 32), v1 = load_blocks(p + 16, p + 48),
+                  low = _mm256_set1_epi32(0xFFFF);
+    const __m256i even = _mm256_packus_epi32(_mm256_and_si256(v0, low), _mm256_and_si256(v1, low));
+    const __m256i odd = _mm256_packus_epi32(_mm256_srli_epi32(v0, 16), _mm256_srli_epi32(v1, 16));
+    const auto ac = [](__m256i v) {
+        return _mm256_or_si256(_mm256_and_si256(_mm256_srli_epi16(v, 8), _mm256_set1_epi16(0xF8)),
+                               _mm256_slli_epi16(v, 11));
+    };
+    const auto b = [](__m256i v) {
+        return _mm256_and_si256(_mm256_srli_epi16(v, 3), _mm256_set1_epi16(0xFC));
+    };
+    return {ac(even), b(even), ac(odd), b(odd)};
+}
+
+// Puts the bytes of four pixels of Size bytes, the first of which is at place `first` of a block,
+// in order: words ac of pixels 0 and 2, of 1 and 3, words b likewise.
+template <int Size>
+inline __m256i channel_order(int first) {
+    const auto at = [=](int pixel, int channel) {
+        return static_cast<char>(first + Size * pixel + channel);
+    };
+    return _mm256_broadcastsi128_si256(
+        _mm_setr_epi8(at(0, 0), at(0, 2), at(2, 0), at(2, 2), at(1, 0), at(1, 2), at(3, 0),
+                      at(3, 2), at(0, 1), -1, at(2, 1), -1, at(1, 1), -1, at(3, 1), -1));
+}
+// Four times four pixels of each block of the result, transposed in units of two words. Every load
+// takes 16 bytes; of three-byte pixels the last begins early, to end with the pixels.
+template <int Size>
+inline rgb_v load_channels(const uint8_t *p) {
+    constexpr int last = 16 * Size - 16;
+    const auto four = [&](ptrdiff_t at, __m256i order) {
+        return _mm256_shuffle_epi8(load_blocks(p + at, p + at + 16 * Size), order);
+    };
+    const __m256i order = channel_order<Size>(0);
+    const __m256i v0 = four(0, order), v1 = four(4 * Size, order), v2 = four(8 * Size, order);
+    const __m256i v3 = four(last, channel_order<Size>(12 * Size - last));
+    const __m256i ac01 = _mm256_unpacklo_epi32(v0, v1), ac23 = _mm256_unpacklo_epi32(v2, v3);
+    const __m256i b01 = _mm256_unpackhi_epi32(v0, v1), b23 = _mm256_unpackhi_epi32(v2, v3);
+    return {_mm256_unpacklo_epi64(ac01, ac23), _mm256_unpacklo_epi64(b01, b23),
+            _mm256_unpackhi_epi64(ac01, ac23), _mm256_unpackhi_epi64(b01, b23)};
+}
+inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
+inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
+
+// The pair of products fits 16 bits; the sum with the third wraps.
+template <int A, int B, int C>
+inline __m256i dot(__m256i ac, __m256i b) {
+    static_assert(A >= -128 && A <= 127 && C >= -128 && C <= 127 && A + C >= -128 && A + C <= 127);
+    const __m256i pair =
+        _mm256_maddubs_epi16(ac, _mm256_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
+    return _mm256_add_epi16(pair, _mm256_mullo_epi16(b, _mm256_set1_epi16(B)));
+}
+template <int A, int B, int C, int D>
+inline u8v dot_high(rgb_v v) {
+    return _mm256_add_epi8(
+        join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
+}
+template <int A, int B, int C, int D>
+inline u16v even_dot(rgb_v v) {
+    return _mm256_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
+}
+
+inline __m256i pack565(__m256i ac, __m256i b) {
+    const __m256i hi =
+        _mm256_and_si256(_mm256_slli_epi16(ac, 8), _mm256_set1_epi16(static_cast<int16_t>(0xF800)));
+    const __m256i mid = _mm256_slli_epi16(_mm256_and_si256(b, _mm256_set1_epi16(0xFC)), 3);
+    return _mm256_or_si256(_mm256_or_si256(hi, mid), _mm256_srli_epi16(ac, 11));
+}
+inline void store_565(uint8_t *p, rgb_v v) {
+    store_zip16(p, natural_to_by8(pack565(v.ac_even, v.b_even)),
+                natural_to_by8(pack565(v.ac_odd, v.b_odd)));
+}
+
 }  // namespace simgp::avx2
 
 #endif

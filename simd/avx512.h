@@ -206,6 +206,109 @@ inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     store(p + 3 * bytes, _mm512_unpackhi_epi16(ab_hi, cd_hi));
 }
 
+inline u8v join_high(u16v a, u16v b) {
+    constexpr int select = 0xCA;  // first ? second : third, bit by bit
+    return _mm512_ternarylogic_epi32(_mm512_set1_epi16(255), _mm512_srli_epi16(a, 8), b, select);
+}
+inline void store_high(uint8_t *p, u16v a) {
+    _mm256_storeu_si256(reinterpret_cast<__m256i *>(p),
+                        _mm512_cvtepi16_epi8(_mm512_srli_epi16(a, 8)));
+}
+
+// Words of the even and of the odd pixels: channels 0 and 2 as a pair of bytes for the
+// multiply-add, and channel 1 alone.
+struct rgb_v {
+    __m512i ac_even, b_even, ac_odd, b_odd;
+};
+
+inline rgb_v load_565(const uint8_t *p) {
+    constexpr int and_or = 0xEA;  // (first & second) | third, bit by bit
+    const __m512i v0 = load(p), v1 = load(p + bytes), low = _mm512_set1_epi32(0xFFFF);
+    const __m512i even =
+        by8_to_natural(_mm512_packus_epi32(_mm512_and_si512(v0, low), _mm512_and_si512(v1, low)));
+    const __m512i odd =
+        by8_to_natural(_mm512_packus_epi32(_mm512_srli_epi32(v0, 16), _mm512_srli_epi32(v1, 16)));
+    const auto ac = [](__m512i v) {
+        return _mm512_ternarylogic_epi32(_mm512_srli_epi16(v, 8), _mm512_set1_epi16(0xF8),
+                                         _mm512_slli_epi16(v, 11), and_or);
+    };
+    const auto b = [](__m512i v) {
+        return _mm512_and_si512(_mm512_srli_epi16(v, 3), _mm512_set1_epi16(0xFC));
+    };
+    return {ac(even), b(even), ac(odd), b(odd)};
+}
+
+// Where the bytes of 16 pixels of Size bytes go, the first of which is at place First of a vector:
+// a block each for words ac of the even and of the odd pixels and for words b.
+template <int Size, int First>
+struct channel_order {
+    alignas(64) uint8_t lane[64];
+    constexpr channel_order() : lane() {
+        for (int i = 0; i < 16; i++) {
+            const int pixel = First + Size * i, word = 16 * (i & 1) + (i & ~1);
+            lane[word] = static_cast<uint8_t>(pixel);
+            lane[word + 1] = static_cast<uint8_t>(pixel + 2);
+            lane[word + 32] = static_cast<uint8_t>(pixel + 1);
+        }
+    }
+};
+template <int Size, int First>
+inline constexpr channel_order<Size, First> channels;
+
+// Four times 16 pixels, transposed in blocks. Every load takes 64 bytes; of three-byte pixels the
+// last begins early, to end with the pixels.
+template <int Size>
+inline rgb_v load_channels(const uint8_t *p) {
+    constexpr int last = 64 * Size - 64;
+    constexpr __mmask64 channels_only = 0x55555555FFFFFFFF;  // zeros the high bytes of words b
+    const auto sixteen = [&](ptrdiff_t at, const uint8_t *order) {
+        return _mm512_maskz_permutexvar_epi8(channels_only, load(order), load(p + at));
+    };
+    const uint8_t *order = channels<Size, 0>.lane;
+    const __m512i v0 = sixteen(0, order), v1 = sixteen(16 * Size, order),
+                  v2 = sixteen(32 * Size, order);
+    const __m512i v3 = sixteen(last, channels<Size, 48 * Size - last>.lane);
+    const __m512i ac01 = _mm512_shuffle_i32x4(v0, v1, 0x44),
+                  ac23 = _mm512_shuffle_i32x4(v2, v3, 0x44);
+    const __m512i b01 = _mm512_shuffle_i32x4(v0, v1, 0xEE),
+                  b23 = _mm512_shuffle_i32x4(v2, v3, 0xEE);
+    return {_mm512_shuffle_i32x4(ac01, ac23, 0x88), _mm512_shuffle_i32x4(b01, b23, 0x88),
+            _mm512_shuffle_i32x4(ac01, ac23, 0xDD), _mm512_shuffle_i32x4(b01, b23, 0xDD)};
+}
+inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
+inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
+
+// The pair of products fits 16 bits; the sum with the third wraps.
+template <int A, int B, int C>
+inline __m512i dot(__m512i ac, __m512i b) {
+    static_assert(A >= -128 && A <= 127 && C >= -128 && C <= 127 && A + C >= -128 && A + C <= 127);
+    const __m512i pair =
+        _mm512_maddubs_epi16(ac, _mm512_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
+    return _mm512_add_epi16(pair, _mm512_mullo_epi16(b, _mm512_set1_epi16(B)));
+}
+template <int A, int B, int C, int D>
+inline u8v dot_high(rgb_v v) {
+    return _mm512_add_epi8(
+        join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
+}
+template <int A, int B, int C, int D>
+inline u16v even_dot(rgb_v v) {
+    return _mm512_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
+}
+
+inline __m512i pack565(__m512i ac, __m512i b) {
+    constexpr int select = 0xCA;  // first ? second : third, bit by bit
+    const __m512i upper =
+        _mm512_ternarylogic_epi32(_mm512_set1_epi16(static_cast<int16_t>(0xF800)),
+                                  _mm512_slli_epi16(ac, 8), _mm512_slli_epi16(b, 3), select);
+    return _mm512_ternarylogic_epi32(_mm512_set1_epi16(static_cast<int16_t>(0xFFE0)), upper,
+                                     _mm512_srli_epi16(ac, 11), select);
+}
+inline void store_565(uint8_t *p, rgb_v v) {
+    store_zip16(p, natural_to_by8(pack565(v.ac_even, v.b_even)),
+                natural_to_by8(pack565(v.ac_odd, v.b_odd)));
+}
+
 }  // namespace simgp::avx512
 
 #endif

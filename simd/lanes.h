@@ -298,6 +298,57 @@ inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     }
 }
 
+// High bytes of 16-bit lanes: those of a and b in turn; those of a alone, bytes / 2, to memory.
+inline u8v join_high(u16v a, u16v b) { return join(shr<8>(a), shr<8>(b)); }
+inline void store_high(uint8_t *p, u16v a) {
+    for (int i = 0; i < bytes / 2; i++) p[i] = static_cast<uint8_t>(a.lane[i] >> 8);
+}
+
+// `bytes` pixels of three channels, in the order of memory; how they are held is the header's own
+// business. Words of 5, 6 and 5 bits are widened by shifting alone, and the first channel is the
+// one in the highest bits. Of four bytes the last is dropped.
+struct rgb_v {
+    u8v c[3];
+};
+inline rgb_v load_565(const uint8_t *p) {
+    const auto word = [&](int i) { return p[2 * i] | p[2 * i + 1] << 8; };
+    return {make<u8v>([&](int i) { return word(i) >> 8 & 0xF8; }),
+            make<u8v>([&](int i) { return word(i) >> 3 & 0xFC; }),
+            make<u8v>([&](int i) { return word(i) << 3 & 0xF8; })};
+}
+template <int Size>
+inline rgb_v load_channels(const uint8_t *p) {
+    const auto channel = [&](int k) { return make<u8v>([&](int i) { return p[Size * i + k]; }); };
+    return {channel(0), channel(1), channel(2)};
+}
+inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
+inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
+
+// ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, with a sum of at
+// most 256; A, C <= 127.
+template <int A, int B, int C, int D>
+inline u8v dot_high(rgb_v v) {
+    return make<u8v>([&](int i) {
+        return ((A * v.c[0].lane[i] + B * v.c[1].lane[i] + C * v.c[2].lane[i]) >> 8) + D;
+    });
+}
+// A c0 + B c1 + C c2 + D of the even pixels, kept to 16 bits. A and C lie in -128 ... 127, and so
+// does their sum where they have the same sign.
+template <int A, int B, int C, int D>
+inline u16v even_dot(rgb_v v) {
+    return make<u16v>([&](int i) {
+        return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
+    });
+}
+// The words of 5, 6 and 5 bits, the low bits of each channel dropped; 2 bytes bytes.
+inline void store_565(uint8_t *p, rgb_v v) {
+    for (int i = 0; i < bytes; i++) {
+        const int word = v.c[0].lane[i] >> 3 << 11 | v.c[1].lane[i] >> 2 << 5 | v.c[2].lane[i] >> 3;
+        p[2 * i] = static_cast<uint8_t>(word);
+        p[2 * i + 1] = static_cast<uint8_t>(word >> 8);
+    }
+}
+
 }  // namespace simgp::SIMD_LANES_NAMESPACE
 
 #endif

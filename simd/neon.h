@@ -163,6 +163,54 @@ inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     vst4q_u8(p, uint8x16x4_t{{a, b, c, d}});
 }
 
+inline u8v join_high(u16v a, u16v b) { return as_u8(vsriq_n_u16(b, a, 8)); }
+inline void store_high(uint8_t *p, u16v a) { vst1_u8(p, vshrn_n_u16(a, 8)); }
+
+// A vector for each channel.
+using rgb_v = uint8x16x3_t;
+inline rgb_v load_565(const uint8_t *p) {
+    const uint8x16x2_t v = vld2q_u8(p);
+    const u8v low = v.val[0], high = v.val[1];
+    const u8v mid = vsriq_n_u8(vshlq_n_u8(high, 5), low, 3);
+    return {
+        {vandq_u8(high, vdupq_n_u8(0xF8)), vandq_u8(mid, vdupq_n_u8(0xFC)), vshlq_n_u8(low, 3)}};
+}
+inline rgb_v load_888(const uint8_t *p) { return vld3q_u8(p); }
+inline rgb_v load_8888(const uint8_t *p) {
+    const uint8x16x4_t v = vld4q_u8(p);
+    return {{v.val[0], v.val[1], v.val[2]}};
+}
+
+template <int K>
+inline u16v add_product(u16v sum, uint8x8_t x) {
+    if constexpr (K > 0) return vmlal_u8(sum, x, vdup_n_u8(K));
+    if constexpr (K < 0) return vmlsl_u8(sum, x, vdup_n_u8(-K));
+    return sum;
+}
+template <int A, int B, int C, int D>
+inline u8v dot_high(rgb_v v) {
+    const auto half = [](uint8x8_t c0, uint8x8_t c1, uint8x8_t c2) {
+        const u16v sum = vmull_u8(c0, vdup_n_u8(A));
+        return vshrn_n_u16(add_product<C>(add_product<B>(sum, c1), c2), 8);
+    };
+    const uint8x16_t dot =
+        vcombine_u8(half(vget_low_u8(v.val[0]), vget_low_u8(v.val[1]), vget_low_u8(v.val[2])),
+                    half(vget_high_u8(v.val[0]), vget_high_u8(v.val[1]), vget_high_u8(v.val[2])));
+    return vaddq_u8(dot, vdupq_n_u8(D));
+}
+template <int A, int B, int C, int D>
+inline u16v even_dot(rgb_v v) {
+    const auto evens = [](u8v c) { return vmovn_u16(as_u16(c)); };
+    u16v sum = vdupq_n_u16(static_cast<uint16_t>(D));
+    sum = add_product<A>(sum, evens(v.val[0]));
+    sum = add_product<B>(sum, evens(v.val[1]));
+    return add_product<C>(sum, evens(v.val[2]));
+}
+inline void store_565(uint8_t *p, rgb_v v) {
+    const u8v low = vsriq_n_u8(vshlq_n_u8(v.val[1], 3), v.val[2], 3);
+    vst2q_u8(p, uint8x16x2_t{{low, vsriq_n_u8(v.val[0], v.val[1], 5)}});
+}
+
 }  // namespace simgp::neon
 
 #endif

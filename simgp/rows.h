@@ -18,7 +18,8 @@ enum class yuv_layout : uint8_t {
     uv,    // y; u: pairs U V, one for two pixels
     vu,    // y; u: pairs V U, one for two pixels
     uyvy,  // y: bytes U Y V Y for two pixels
-    yuyv,  // y: bytes Y U Y V for two pixels
+    yuyv,  // y: bytes Y U Y V for two pixels; of a half group at the end, U is taken, and V of
+           // the group before, or 128 where there is none
     count
 };
 
@@ -43,6 +44,15 @@ using yuv_to_rgb_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v
 // The same for two rows with the same chroma, which may be one and the same row.
 using yuv_to_rgb_row_pair = void(const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
                                  const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width);
+
+// Converts `width` >= 1 pixels of a row: a luma sample for each, and for the layouts half, uv and
+// vu the chroma of every second pixel, the first, third and so on, width / 2 in all. u takes the
+// pairs of uv and vu; pointers that the layout does not use may be null. Nothing may overlap.
+using rgb_to_yuv_row = void(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
+                            ptrdiff_t width);
+
+// Repacks `width` >= 1 pixels of a row, which may not overlap.
+using rgb_to_rgb_row = void(const uint8_t *src, uint8_t *dst, ptrdiff_t width);
 
 // Repeats the four bytes of value, lowest first, over `size` bytes, a multiple of 32.
 using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
@@ -72,6 +82,14 @@ struct rows {
     yuv_to_rgb_row_pair *&yuv_to_rgb_pair_slot(yuv_layout layout, rgb_packing packing) {
         return yuv_to_rgb_pair[size_t(layout)][size_t(packing)];
     }
+
+    // rgb2yuv: null where the library has no such conversion.
+    rgb_to_yuv_row *rgb_to_yuv[size_t(rgb_packing::count)][size_t(yuv_layout::count)];
+    rgb_to_rgb_row *rgb_to_rgb565[size_t(rgb_packing::count)];
+
+    rgb_to_yuv_row *&rgb_to_yuv_slot(rgb_packing packing, yuv_layout layout) {
+        return rgb_to_yuv[size_t(packing)][size_t(layout)];
+    }
 };
 
 }  // namespace simgp
@@ -82,13 +100,23 @@ struct rows {
 #define SIMGP_YUV_TO_RGB_ROWS(X)                                                            \
     X(grey, rgb565)                                                                         \
     X(half, rgb565) X(half, bgr565)                                                         \
-    X(full, rgb565) X(full, bgr565)
+    X(full, rgb565) X(full, bgr565)                                                         \
+    X(uyvy, rgb565) X(uyvy, bgr565) X(uyvy, rgb888) X(uyvy, bgr888)                         \
+    X(uyvy, rgba8888) X(uyvy, bgra8888) X(uyvy, argb8888)                                   \
+    X(yuyv, rgb565) X(yuyv, rgb888)
 #define SIMGP_YUV_TO_RGB_PAIRS(X)                                                           \
     X(half, rgb565) X(half, bgr565) X(half, rgb888) X(half, bgr888)                         \
     X(half, rgba8888) X(half, bgra8888) X(half, argb8888)                                   \
     X(full, rgb565) X(full, bgr565)                                                         \
     X(uv, rgb565) X(uv, bgr565) X(uv, rgb888)                                               \
     X(vu, bgr565) X(vu, rgb888)
+
+// The rows from RGB to YUV, X(packing, layout), and to RGB565, X(packing).
+#define SIMGP_RGB_TO_YUV_ROWS(X)                                                            \
+    X(rgb888, grey) X(rgb888, half) X(rgb888, uv) X(rgb888, vu)                             \
+    X(bgr888, grey) X(bgr888, half)                                                         \
+    X(rgb565, grey) X(rgb565, half) X(rgb565, uv) X(rgb565, vu)
+#define SIMGP_RGB_TO_RGB565_ROWS(X) X(rgb888) X(rgba8888)
 // clang-format on
 
 #endif

@@ -38,6 +38,8 @@
 #include "simgp/csc.h"
 #include "simgp/dither.h"
 #include "simgp/img.h"
+#include "simgp/packed2rgb.h"
+#include "simgp/rgb2yuv.h"
 #include "simgp/yuv2rgb.h"
 
 #endif

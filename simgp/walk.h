@@ -27,6 +27,7 @@ inline plane_lines src_lines(const csc_args &a, int plane) {
     return {a.src_planes[plane], a.src_strides[plane]};
 }
 inline plane_lines dst_lines(const csc_args &a, int plane) {
+    if (plane < 0) return {nullptr, 0};
     return {a.dst_planes[plane], a.dst_strides[plane]};
 }
 
@@ -45,6 +46,8 @@ inline constexpr yuv_planes planes_yuv422w{yuv_layout::full, 1, 2, true};
 inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, false};
 inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, true};
 inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, true};
+inline constexpr yuv_planes planes_uyvy{yuv_layout::uyvy, -1, -1, false};
+inline constexpr yuv_planes planes_yuyv{yuv_layout::yuyv, -1, -1, false};
 
 // Four kernels let row 0 of an odd-height picture have the first chroma line to itself, unless the
 // width is a multiple of 4: row y then takes line (y + 1) >> 1.

@@ -37,13 +37,21 @@ struct grey_matrix {
     static constexpr int blue(int y, int, int) { return y; }
 };
 
-// Sources: the samples of pixel x.
+// Sources: the samples of pixel x of a row of `width` pixels.
 struct samples {
     const uint8_t *y, *u, *v;
+    ptrdiff_t width;
 };
 struct yuv {
     int y, u, v;
 };
+// Packed 4:2:2: byte y0 of a group is its first luma, the second lies two bytes on; then U and V.
+// Of a group with a single pixel V lies outside the row: the group before lends its own.
+yuv read_packed(const samples &s, ptrdiff_t x, int y0, int u, int v) {
+    const uint8_t *group = s.y + (x >> 1) * 4;
+    const bool whole = (x | 1) < s.width;
+    return {group[y0 + 2 * (x & 1)], group[u], whole ? group[v] : x ? group[v - 4] : 128};
+}
 template <yuv_layout Layout>
 yuv read(const samples &s, ptrdiff_t x) {
     const ptrdiff_t pair = x >> 1;
@@ -58,6 +66,10 @@ yuv read(const samples &s, ptrdiff_t x) {
             return {s.y[x], s.u[2 * pair], s.u[2 * pair + 1]};
         case yuv_layout::vu:
             return {s.y[x], s.u[2 * pair + 1], s.u[2 * pair]};
+        case yuv_layout::uyvy:
+            return read_packed(s, x, 1, 0, 2);
+        case yuv_layout::yuyv:
+            return read_packed(s, x, 0, 1, 3);
         default:
             __builtin_unreachable();
     }
@@ -102,7 +114,7 @@ void write(uint8_t *dst, ptrdiff_t x, int r, int g, int b) {
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
 void row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
-    const samples s{y, u, v};
+    const samples s{y, u, v, width};
     for (ptrdiff_t x = 0; x < width; x++) {
         const yuv p = read<Layout>(s, x);
         write<Packing>(dst, x, Matrix::red(p.y, p.u, p.v), Matrix::green(p.y, p.u, p.v),

@@ -87,6 +87,34 @@ struct source_pairs {
         memcpy(to.u, s.u + x, size_t(count + 1) / 2 * 2);
     }
 };
+
+// Packed 4:2:2: every other byte is luma, the others are pairs U V.
+template <bool LUMA_FIRST>
+struct source_packed {
+    static constexpr pair_order pairs = pair_order::uv;
+    static constexpr bool pixels_in_pairs = true;
+
+    template <pixel_order Order>
+    static yuv_half load(const samples &s, ptrdiff_t x) {
+        const pair_u8 p = load_split(s.y + 2 * x);
+        return {arrange_by8<Order>(LUMA_FIRST ? p.even : p.odd),
+                arrange_by8<Order>(LUMA_FIRST ? p.odd : p.even)};
+    }
+    // A last group of one pixel gets the V of the group before.
+    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        memcpy(to.y, s.y + 2 * x, 2 * size_t(count));
+        if (count & 1) {
+            constexpr int v = LUMA_FIRST ? 3 : 2;
+            const ptrdiff_t single = x + count - 1;
+            to.y[2 * (count - 1) + v] = single ? s.y[2 * single + v - 4] : 128;
+        }
+    }
+};
+template <>
+struct source<yuv_layout::uyvy> : source_packed<false> {};
+template <>
+struct source<yuv_layout::yuyv> : source_packed<true> {};
+
 template <>
 struct source<yuv_layout::uv> : source_pairs<pair_order::uv> {};
 template <>

@@ -1,0 +1,141 @@
+// RGB to YUV rows: unpacker x matrix x writer; and RGB to RGB565 rows.
+//
+// The matrix fits 16-bit lanes. Luma's sum, 66 R + 129 G + 25 B, is at most 56100, unsigned. Those
+// of chroma lie in -28560 ... 28560, signed; an offset of 32768 turns the final + 128 after the
+// shift into a part of the sum, and the high byte of a lane is the sample.
+#ifndef SIMGP_VECTOR_RGB2YUV_H
+#define SIMGP_VECTOR_RGB2YUV_H
+
+#include <string.h>
+
+#include "simgp/rows.h"
+#include "simgp/vector/steps.h"
+
+namespace simgp::SIMD_TARGET {
+
+template <rgb_packing>
+struct unpacker;
+
+template <>
+struct unpacker<rgb_packing::rgb565> {
+    static constexpr int size = 2;
+    static constexpr bool blue_first = false;
+    static rgb_v load(const uint8_t *p) { return load_565(p); }
+};
+template <bool BGR>
+struct unpacker_888 {
+    static constexpr int size = 3;
+    static constexpr bool blue_first = BGR;
+    static rgb_v load(const uint8_t *p) { return load_888(p); }
+};
+template <>
+struct unpacker<rgb_packing::rgb888> : unpacker_888<false> {};
+template <>
+struct unpacker<rgb_packing::bgr888> : unpacker_888<true> {};
+template <>
+struct unpacker<rgb_packing::rgba8888> {
+    static constexpr int size = 4;
+    static rgb_v load(const uint8_t *p) { return load_8888(p); }
+};
+
+// BT.601, limited range, of pixels whose first channel is red, or blue.
+template <bool BLUE_FIRST>
+struct rgb_matrix {
+    static constexpr int chroma_offset = 128 + 32768;
+
+    static u8v luma(rgb_v p) {
+        return BLUE_FIRST ? dot_high<25, 129, 66, 16>(p) : dot_high<66, 129, 25, 16>(p);
+    }
+    static u16v u(rgb_v p) {
+        return BLUE_FIRST ? even_dot<112, -74, -38, chroma_offset>(p)
+                          : even_dot<-38, -74, 112, chroma_offset>(p);
+    }
+    static u16v v(rgb_v p) {
+        return BLUE_FIRST ? even_dot<-18, -94, 112, chroma_offset>(p)
+                          : even_dot<112, -94, -18, chroma_offset>(p);
+    }
+};
+
+// The planes that a row writes; one that is not there is null.
+struct yuv_row_out {
+    uint8_t *y, *u, *v;
+};
+
+// Chroma goes to plane u in samples or pairs of `chroma_size` bytes, and to plane v where there are
+// samples.
+template <rgb_packing Packing, yuv_layout Layout>
+struct rgb_to_yuv_step {
+    using from = unpacker<Packing>;
+    using matrix = rgb_matrix<from::blue_first>;
+    static constexpr bool pixels_in_pairs = Layout != yuv_layout::grey;
+    static constexpr bool planar = Layout == yuv_layout::half;
+    static constexpr int chroma_size = planar ? 1 : 2;
+
+    static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + from::size * x; }
+    static void convert(const yuv_row_out &out, ptrdiff_t x, const uint8_t *pixels) {
+        const rgb_v p = from::load(pixels);
+        store(out.y + x, matrix::luma(p));
+        if constexpr (Layout == yuv_layout::grey) return;
+        const u16v u = matrix::u(p), v = matrix::v(p);
+        uint8_t *at = out.u + chroma_size * (x / 2);
+        if constexpr (planar) {
+            store_high(at, u);
+            store_high(out.v + x / 2, v);
+        } else {
+            store(at, Layout == yuv_layout::uv ? join_high(u, v) : join_high(v, u));
+        }
+    }
+    static void part(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x, int count) {
+        uint8_t pixels[bytes * from::size] = {}, y[bytes], u[bytes], v[bytes];
+        memcpy(pixels, in + from::size * x, size_t(count) * from::size);
+        convert({y, u, v}, 0, pixels);
+        memcpy(out.y + x, y, size_t(count));
+        if (const size_t chroma = size_t(count / 2); pixels_in_pairs && chroma) {
+            memcpy(out.u + chroma_size * (x / 2), u, chroma * chroma_size);
+            if (planar) memcpy(out.v + x / 2, v, chroma);
+        }
+    }
+};
+
+template <rgb_packing Packing>
+struct rgb_to_rgb565_step {
+    using from = unpacker<Packing>;
+    static constexpr bool pixels_in_pairs = false;
+
+    static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + from::size * x; }
+    static void convert(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
+        store_565(out + 2 * x, from::load(pixels));
+    }
+    static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
+        uint8_t pixels[bytes * from::size] = {}, words[2 * bytes];
+        memcpy(pixels, in + from::size * x, size_t(count) * from::size);
+        convert(words, 0, pixels);
+        memcpy(out + 2 * x, words, 2 * size_t(count));
+    }
+};
+
+template <rgb_packing Packing, yuv_layout Layout>
+void rgb_to_yuv(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    row_of_steps<rgb_to_yuv_step<Packing, Layout>>(src, yuv_row_out{y, u, v}, width);
+}
+
+template <rgb_packing Packing>
+void rgb_to_rgb565(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
+    row_of_steps<rgb_to_rgb565_step<Packing>>(src, dst, width);
+}
+
+void fill_rgb2yuv(rows &t) {
+#define FILL(packing, layout)                                     \
+    t.rgb_to_yuv_slot(rgb_packing::packing, yuv_layout::layout) = \
+        rgb_to_yuv<rgb_packing::packing, yuv_layout::layout>;
+    SIMGP_RGB_TO_YUV_ROWS(FILL)
+#undef FILL
+#define FILL(packing) \
+    t.rgb_to_rgb565[size_t(rgb_packing::packing)] = rgb_to_rgb565<rgb_packing::packing>;
+    SIMGP_RGB_TO_RGB565_ROWS(FILL)
+#undef FILL
+}
+
+}  // namespace simgp::SIMD_TARGET
+
+#endif
