@@ -168,14 +168,19 @@ placement any_placement(flush where, rng &random) {
     return p;
 }
 
+static ptrdiff_t step_of(const plane_shape &s, const placement &place) {
+    const ptrdiff_t least = s.row_bytes + place.padding;
+    return (least + s.stride_unit - 1) / s.stride_unit * s.stride_unit;
+}
+
 static size_t extent(const plane_shape &s, ptrdiff_t step) {
     return s.rows ? size_t((s.rows - 1) * step + s.row_bytes) : 0;
 }
 
 plane::plane(const plane_shape &shape, const placement &place)
     : shape_(shape),
-      stride_((shape.row_bytes + place.padding) * (place.bottom_up ? -1 : 1)),
-      memory_(extent(shape, shape.row_bytes + place.padding), place.where, place.gap),
+      stride_(step_of(shape, place) * (place.bottom_up ? -1 : 1)),
+      memory_(extent(shape, step_of(shape, place)), place.where, place.gap),
       first_(memory_.data()) {
     if (place.bottom_up && shape.rows) first_ -= (shape.rows - 1) * stride_;
 }

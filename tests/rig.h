@@ -55,6 +55,7 @@ struct plane_shape {
     int32_t width, height;  // the descriptor's words
     int sample_bytes;
     ptrdiff_t row_bytes, rows;
+    int stride_unit = 1;  // strides are multiples of this
 };
 // width x height samples.
 plane_shape samples(int32_t width, int32_t height, int sample_bytes = 1);

@@ -1,0 +1,89 @@
+// Packed YUV to RGB: every kernel against its scalar rows, and against the planar kernels.
+#include "simgp/simgp.h"
+#include "tests/rig.h"
+
+namespace {
+
+// Each beside the planar kernel with the same output.
+struct kernel {
+    const char *name;
+    simgp_csc_fn *run, *planar;
+    int from, to;
+};
+
+#define KERNEL(name, from, to, planar) \
+    { #name, simgp_csc_##name, simgp_csc_##planar, SIMGP_FMT_##from, SIMGP_FMT_##to }
+const kernel kernels[] = {
+    KERNEL(yuyv_to_rgb565, YUYV, RGB565, yuv420_to_rgb565),
+    KERNEL(yuyv_to_rgb888, YUYV, RGB888, yuv420_to_rgb888),
+    KERNEL(uyvy_to_rgb565, UYVY, RGB565, yuv420_to_rgb565),
+    KERNEL(uyvy_to_bgr565, UYVY, BGR565, yuv420_to_bgr565),
+    KERNEL(uyvy_to_rgb888, UYVY, RGB888, yuv420_to_rgb888),
+    KERNEL(uyvy_to_bgr888, UYVY, BGR888, yuv420_to_bgr888),
+    KERNEL(uyvy_to_rgba8888, UYVY, RGBA8888, yuv420_to_rgba8888),
+    KERNEL(uyvy_to_bgra8888, UYVY, BGRA8888, yuv420_to_bgra8888),
+    KERNEL(uyvy_to_argb8888, UYVY, ARGB8888, yuv420_to_argb8888),
+};
+
+TEST(packed2rgb, vector_rows_equal_scalar_rows) {
+    for (const kernel &k : kernels) rig::check_csc(k.name, k.run, k.from, k.to);
+}
+
+// One row, unpacked by hand, must give what the planar kernel gives. Of an odd width the last
+// chroma pair is the last U with the V before it, or 128.
+TEST(packed2rgb, packed_rows_equal_planar_rows) {
+    rig::rng random(rig::seed());
+    for (const kernel &k : kernels)
+        for (int width = 1; width <= 150; width += 1 + random.below(3)) {
+            SCOPED_TRACE(testing::Message() << k.name << ", width " << width);
+            rig::picture src(rig::shapes_of(k.from, width, 1));
+            src.fill(rig::content::random, random);
+            rig::picture planar(rig::shapes_of(SIMGP_FMT_YUV420, width, 1));
+            const int first_luma = k.from == SIMGP_FMT_UYVY, first_chroma = !first_luma;
+            for (int x = 0; x < width; x++) planar.row(0, 0)[x] = src.row(0, 0)[2 * x + first_luma];
+            for (int i = 0; i < (width + 1) / 2; i++) {
+                const uint8_t *u = src.row(0, 0) + 4 * i + first_chroma;
+                planar.row(1, 0)[i] = *u;
+                planar.row(2, 0)[i] = 2 * i + 1 < width ? u[2] : i ? u[-2] : 128;
+            }
+            const auto shapes = rig::shapes_of(k.to, width, 1);
+            rig::picture expected(shapes), got(shapes);
+            rig::call(k.planar, planar, expected);
+            rig::for_each_target([&](const rig::target_rows &) {
+                got.fill_pattern(0);
+                rig::call(k.run, src, got);
+                EXPECT_EQ(rig::difference(expected, got), "");
+            });
+        }
+}
+
+std::vector<uint8_t> convert(simgp_csc_fn *kernel, int to, std::vector<uint8_t> group) {
+    std::vector<uint8_t> out(8, 0x55);
+    uint8_t *const src[] = {group.data()}, *const dst[] = {out.data()};
+    const int32_t width[] = {2}, height[] = {1}, stride[] = {8};
+    kernel(src, width, height, stride, stride, dst);
+    out.resize(size_t(rig::shapes_of(to, 2, 1)[0].row_bytes));
+    return out;
+}
+
+TEST(packed2rgb, known_colours) {
+    using bytes = std::vector<uint8_t>;
+    rig::for_each_target([](const rig::target_rows &) {
+        const bytes black_white = {128, 16, 128, 235};
+        EXPECT_EQ(convert(simgp_csc_uyvy_to_rgba8888, SIMGP_FMT_RGBA8888, black_white),
+                  (bytes{0, 0, 0, 255, 255, 255, 255, 255}));
+        EXPECT_EQ(convert(simgp_csc_uyvy_to_bgra8888, SIMGP_FMT_BGRA8888, black_white),
+                  (bytes{0, 0, 0, 255, 255, 255, 255, 255}));
+        EXPECT_EQ(convert(simgp_csc_uyvy_to_argb8888, SIMGP_FMT_ARGB8888, black_white),
+                  (bytes{255, 0, 0, 0, 255, 255, 255, 255}));
+        const bytes red = {81, 90, 81, 240};
+        EXPECT_EQ(convert(simgp_csc_yuyv_to_rgb565, SIMGP_FMT_RGB565, red),
+                  (bytes{0x00, 0xF8, 0x00, 0xF8}));
+        EXPECT_EQ(convert(simgp_csc_yuyv_to_rgb888, SIMGP_FMT_RGB888, red),
+                  (bytes{255, 0, 0, 255, 0, 0}));
+        EXPECT_EQ(convert(simgp_csc_uyvy_to_bgr565, SIMGP_FMT_BGR565, {90, 81, 240, 81}),
+                  (bytes{0x1F, 0x00, 0x1F, 0x00}));
+    });
+}
+
+}  // namespace
