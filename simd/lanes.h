@@ -324,16 +324,16 @@ inline rgb_v load_channels(const uint8_t *p) {
 inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
 inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
 
-// ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, with a sum of at
-// most 256; A, C <= 127.
+// ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, their sum is at
+// most 256, and A + C <= 127.
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
     return make<u8v>([&](int i) {
         return ((A * v.c[0].lane[i] + B * v.c[1].lane[i] + C * v.c[2].lane[i]) >> 8) + D;
     });
 }
-// A c0 + B c1 + C c2 + D of the even pixels, kept to 16 bits. A and C lie in -128 ... 127, and so
-// does their sum where they have the same sign.
+// A c0 + B c1 + C c2 + D of the even pixels, kept to 16 bits. A, C and their sum lie in
+// -128 ... 127, B in -255 ... 255.
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
     return make<u16v>([&](int i) {
