@@ -1,4 +1,4 @@
-// RGB to YUV and to RGB565: every kernel against its scalar rows, every colour against the formula.
+// RGB to YUV and to RGB565: every kernel at every size and every colour against the formula.
 #include <string.h>
 
 #include "simgp/simgp.h"
@@ -33,16 +33,6 @@ std::vector<rig::plane_shape> exact_shapes(int format, int width, int height) {
     return shapes;
 }
 
-TEST(rgb2yuv, vector_rows_equal_scalar_rows) {
-    for (const kernel &k : kernels)
-        rig::check_jobs(k.name, {}, [&](int width, int height) {
-            return rig::job{exact_shapes(k.from, width, height), exact_shapes(k.to, width, height),
-                            [&](const rig::picture &src, const rig::picture &dst) {
-                                rig::call(k.run, src, dst);
-                            }};
-        });
-}
-
 struct colour {
     int r, g, b;
 };
@@ -56,76 +46,105 @@ yuv formula(const colour &c) {
             floor_256(112 * c.r - 94 * c.g - 18 * c.b + 128) + 128};
 }
 
-// Two rows of pixels in four source formats, and what must come out of them.
-struct test_card {
-    explicit test_card(int32_t width)
-        : rgb888(rig::shapes_of(SIMGP_FMT_RGB888, width, 2)),
-          bgr888(rig::shapes_of(SIMGP_FMT_BGR888, width, 2)),
-          rgba8888(rig::shapes_of(SIMGP_FMT_RGBA8888, width, 2)),
-          rgb565(rig::shapes_of(SIMGP_FMT_RGB565, width, 2)),
-          yuv420(rig::shapes_of(SIMGP_FMT_YUV420, width, 2)) {}
-
-    // The RGB565 picture holds what the 16-bit word can hold of c.
-    void set(ptrdiff_t x, ptrdiff_t y, const colour &c) {
-        const uint8_t r = uint8_t(c.r), g = uint8_t(c.g), b = uint8_t(c.b);
-        const uint8_t rgba[] = {r, g, b, uint8_t(7 * x)}, bgr[] = {b, g, r};
-        memcpy(rgb888.row(0, y) + 3 * x, rgba, 3);
-        memcpy(bgr888.row(0, y) + 3 * x, bgr, 3);
-        memcpy(rgba8888.row(0, y) + 4 * x, rgba, 4);
-        const int word = r / 8 * 2048 + g / 4 * 32 + b / 8;
-        rgb565.row(0, y)[2 * x] = uint8_t(word % 256);
-        rgb565.row(0, y)[2 * x + 1] = uint8_t(word / 256);
-        const yuv e = formula(c);
-        yuv420.row(0, y)[x] = uint8_t(e.y);
-        if (y == 0 && x % 2 == 0) {
-            yuv420.row(1, 0)[x / 2] = uint8_t(e.u);
-            yuv420.row(2, 0)[x / 2] = uint8_t(e.v);
-        }
+// Pixel x of a row.
+colour read(int format, const uint8_t *row, int x) {
+    const int word = row[2 * x] + 256 * row[2 * x + 1];
+    switch (format) {
+        case SIMGP_FMT_RGB565:
+            return {word / 2048 * 8, word / 32 % 64 * 4, word % 32 * 8};
+        case SIMGP_FMT_RGB888:
+            return {row[3 * x], row[3 * x + 1], row[3 * x + 2]};
+        case SIMGP_FMT_BGR888:
+            return {row[3 * x + 2], row[3 * x + 1], row[3 * x]};
+        default:
+            return {row[4 * x], row[4 * x + 1], row[4 * x + 2]};
     }
+}
 
-    rig::picture rgb888, bgr888, rgba8888, rgb565, yuv420;
-};
+// What every kernel must write: chroma comes from the top left pixel of each block.
+void reference(int from, int to, const rig::picture &src, const rig::picture &dst) {
+    const int width = src.widths[0], height = src.heights[0];
+    for (int y = 0; y < height; y++)
+        for (int x = 0; x < width; x++) {
+            const colour c = read(from, src.row(0, y), x);
+            if (to == SIMGP_FMT_RGB565) {
+                const int word = c.r / 8 * 2048 + c.g / 4 * 32 + c.b / 8;
+                dst.row(0, y)[2 * x] = uint8_t(word % 256);
+                dst.row(0, y)[2 * x + 1] = uint8_t(word / 256);
+                continue;
+            }
+            const yuv e = formula(c);
+            dst.row(0, y)[x] = uint8_t(e.y);
+            if (y % 2 || x % 2 || y + 1 == height || x + 1 == width) continue;
+            const bool planar = to == SIMGP_FMT_YUV420 || to == SIMGP_FMT_YV12;
+            const bool v_first = to == SIMGP_FMT_YV12 || to == SIMGP_FMT_NV21;
+            uint8_t *const first = planar ? dst.row(1, y / 2) + x / 2 : dst.row(1, y / 2) + x;
+            uint8_t *const second = planar ? dst.row(2, y / 2) + x / 2 : first + 1;
+            *(v_first ? second : first) = uint8_t(e.u);
+            *(v_first ? first : second) = uint8_t(e.v);
+        }
+}
 
-void expect(const rig::picture &expected, simgp_csc_fn *kernel, const rig::picture &src) {
-    std::vector<rig::plane_shape> shapes;
-    for (const rig::plane &p : expected.parts) shapes.push_back(p.shape());
-    rig::picture got(shapes);
+TEST(rgb2yuv, every_size) {
+    for (const kernel &k : kernels)
+        rig::check_jobs(k.name, {}, [&](int width, int height) {
+            return rig::job{exact_shapes(k.from, width, height), exact_shapes(k.to, width, height),
+                            [&](const rig::picture &src, const rig::picture &dst) {
+                                rig::call(k.run, src, dst);
+                            },
+                            [&](const rig::picture &src, const rig::picture &dst) {
+                                reference(k.from, k.to, src, dst);
+                            }};
+        });
+}
+
+void check(const kernel &k, const rig::picture &src) {
+    const auto shapes = rig::shapes_of(k.to, src.widths[0], src.heights[0]);
+    rig::picture expected(shapes), got(shapes);
+    reference(k.from, k.to, src, expected);
     rig::for_each_target([&](const rig::target_rows &) {
-        got.fill_pattern(0);
-        rig::call(kernel, src, got);
-        EXPECT_EQ(rig::difference(expected, got), "");
+        for (const rig::plane &p : got.parts)  // not the result of the target before
+            for (ptrdiff_t y = 0; y < p.shape().rows; y++)
+                memset(p.row(y), 0, size_t(p.shape().row_bytes));
+        rig::call(k.run, src, got);
+        EXPECT_EQ(rig::difference(expected, got), "") << k.name;
     });
 }
 
-// Each colour stands once in an even column, where it gives chroma, and once in an odd one; both
-// rows are the same.
+// Of a given red, each colour stands once where it gives chroma, and in an odd column and row.
 TEST(rgb2yuv, every_24_bit_colour) {
-    test_card card(2 * 65536);
-    for (int r = 0; r < 256 && !HasFailure(); r += rig::quick() ? 51 : 1) {
-        for (int i = 0; i < 65536; i++) {
-            card.set(2 * i, 0, {r, i >> 8, i & 255});
-            card.set(2 * i + 1, 0, {r, 255 - (i >> 8), 255 - (i & 255)});
+    constexpr int size = 512;
+    for (const kernel &k : kernels) {
+        if (k.from == SIMGP_FMT_RGB565 || (k.to != SIMGP_FMT_YUV420 && k.to != SIMGP_FMT_RGB565))
+            continue;
+        rig::picture src(rig::shapes_of(k.from, size, size));
+        const int bytes = src.parts[0].shape().sample_bytes;
+        for (int r = 0; r < 256 && !HasFailure(); r += rig::quick() ? 51 : 1) {
+            for (int y = 0; y < size; y++)
+                for (int x = 0; x < size; x++) {
+                    const uint8_t red = uint8_t(r), green = uint8_t(y / 2),
+                                  blue = uint8_t(x % 2 ? 255 - x / 2 : x / 2);
+                    const bool reversed = k.from == SIMGP_FMT_BGR888;
+                    uint8_t *const p = src.row(0, y) + bytes * x;
+                    p[0] = reversed ? blue : red;
+                    p[1] = green;
+                    p[2] = reversed ? red : blue;
+                    if (bytes == 4) p[3] = uint8_t(7 * x + y);
+                }
+            check(k, src);
         }
-        for (rig::picture *p :
-             {&card.rgb888, &card.bgr888, &card.rgba8888, &card.rgb565, &card.yuv420})
-            memcpy(p->row(0, 1), p->row(0, 0), size_t(p->parts[0].shape().row_bytes));
-        expect(card.yuv420, simgp_csc_rgb888_to_yuv420, card.rgb888);
-        expect(card.yuv420, simgp_csc_bgr888_to_yuv420, card.bgr888);
-        expect(card.rgb565, simgp_csc_rgb888_to_rgb565, card.rgb888);
-        expect(card.rgb565, simgp_csc_rgba8888_to_rgb565, card.rgba8888);
     }
 }
 
 TEST(rgb2yuv, every_16_bit_colour) {
-    test_card card(2 * 65536);
-    for (int word = 0; word < 65536; word++) {
-        const colour c{word / 2048 * 8, word / 32 % 64 * 4, word % 32 * 8}, white{248, 252, 248};
-        card.set(2 * word, 0, c);
-        card.set(2 * word + 1, 0, white);
-        card.set(word, 1, c);
-        card.set(65536 + word, 1, white);
-    }
-    expect(card.yuv420, simgp_csc_rgb565_to_yuv420, card.rgb565);
+    rig::picture src(rig::shapes_of(SIMGP_FMT_RGB565, 512, 512));
+    for (int y = 0; y < 512; y++)
+        for (int x = 0; x < 512; x++) {
+            src.row(0, y)[2 * x] = uint8_t(x / 2);
+            src.row(0, y)[2 * x + 1] = uint8_t(y / 2);
+        }
+    check({"rgb565_to_yuv420", simgp_csc_rgb565_to_yuv420, SIMGP_FMT_RGB565, SIMGP_FMT_YUV420},
+          src);
 }
 
 TEST(rgb2yuv, known_colours) {
@@ -141,53 +160,17 @@ TEST(rgb2yuv, known_colours) {
         EXPECT_TRUE(f.y == e.y && f.u == e.u && f.v == e.v) << c.r << ' ' << c.g << ' ' << c.b;
     }
     const struct {
-        colour c;
+        uint8_t rgba[4];
         int word;
-    } words[] = {{{255, 255, 255}, 0xFFFF}, {{8, 4, 8}, 0x0821}, {{7, 3, 7}, 0x0000}};
-    for (const auto &[c, word] : words) {
-        test_card card(1);
-        card.set(0, 0, c);
-        card.set(0, 1, c);
-        EXPECT_EQ(card.rgb565.row(0, 0)[0] | card.rgb565.row(0, 0)[1] << 8, word);
-        expect(card.rgb565, simgp_csc_rgba8888_to_rgb565, card.rgba8888);
-    }
-}
-
-// The samples of a planar picture, checked above, in the other layouts.
-TEST(rgb2yuv, layouts_hold_the_same_samples) {
-    const int width = 139, height = 7;
-    const struct {
-        int from;
-        simgp_csc_fn *yuv420, *yv12, *nv12, *nv21;
-    } sources[] = {
-        {SIMGP_FMT_RGB888, simgp_csc_rgb888_to_yuv420, simgp_csc_rgb888_to_yv12,
-         simgp_csc_rgb888_to_nv12, simgp_csc_rgb888_to_nv21},
-        {SIMGP_FMT_RGB565, simgp_csc_rgb565_to_yuv420, simgp_csc_rgb565_to_yv12,
-         simgp_csc_rgb565_to_nv12, simgp_csc_rgb565_to_nv21},
-        {SIMGP_FMT_BGR888, simgp_csc_bgr888_to_yuv420, simgp_csc_bgr888_to_yv12, nullptr, nullptr}};
-    rig::rng random(rig::seed());
-    for (const auto &s : sources) {
-        const auto make = [&](int format) {
-            return rig::picture(exact_shapes(format, width, height));
-        };
-        rig::picture src = make(s.from), planar = make(SIMGP_FMT_YUV420);
-        src.fill(rig::content::random, random);
-        rig::call(s.yuv420, src, planar);
-
-        rig::picture yv12 = make(SIMGP_FMT_YV12), nv12 = make(SIMGP_FMT_NV12),
-                     nv21 = make(SIMGP_FMT_NV21);
-        for (rig::picture *p : {&yv12, &nv12, &nv21})
-            for (int y = 0; y < height; y++) memcpy(p->row(0, y), planar.row(0, y), width);
-        for (int y = 0; y < height / 2; y++)
-            for (int x = 0; x < width / 2; x++) {
-                const uint8_t u = planar.row(1, y)[x], v = planar.row(2, y)[x];
-                yv12.row(1, y)[x] = nv12.row(1, y)[2 * x + 1] = nv21.row(1, y)[2 * x] = v;
-                yv12.row(2, y)[x] = nv12.row(1, y)[2 * x] = nv21.row(1, y)[2 * x + 1] = u;
-            }
-        expect(yv12, s.yv12, src);
-        if (s.nv12) expect(nv12, s.nv12, src);
-        if (s.nv21) expect(nv21, s.nv21, src);
-    }
+    } words[] = {{{255, 255, 255, 0}, 0xFFFF}, {{8, 4, 8, 255}, 0x0821}, {{7, 3, 7, 1}, 0x0000}};
+    for (const auto &w : words)
+        rig::for_each_target([&](const rig::target_rows &) {
+            rig::picture src(rig::shapes_of(SIMGP_FMT_RGBA8888, 1, 1)),
+                dst(rig::shapes_of(SIMGP_FMT_RGB565, 1, 1));
+            memcpy(src.row(0, 0), w.rgba, 4);
+            rig::call(simgp_csc_rgba8888_to_rgb565, src, dst);
+            EXPECT_EQ(dst.row(0, 0)[0] | dst.row(0, 0)[1] << 8, w.word);
+        });
 }
 
 // Lines of words and of four-byte pixels advance by whole pixels, rounded toward minus infinity.
