@@ -6,16 +6,9 @@
 
 using namespace simgp;
 
-namespace {
-
-void convert(const csc_args &a, const yuv_planes &planes, rgb_packing packing) {
-    walk_yuv_to_rgb(a, planes, live_rows().yuv_to_rgb[size_t(planes.layout)][size_t(packing)]);
-}
-
-}  // namespace
-
-#define KERNEL(from, to) \
-    SIMGP_CSC_KERNEL(simgp_csc_##from##_to_##to, convert(args, planes_##from, rgb_packing::to))
+// clang-format off
+#define KERNEL(from, to) SIMGP_CSC_KERNEL(simgp_csc_##from##_to_##to, walk_yuv_to_rgb(args, src_lines(args, 0), planes_##from, live_rows(), rgb_packing::to, 0))
+// clang-format on
 
 KERNEL(yuyv, rgb565)
 KERNEL(yuyv, rgb888)
