@@ -315,7 +315,8 @@ TEST(yuv2rgb, every_colour_on_every_target) {
 TEST(yuv2rgb, empty_pictures_write_nothing) {
     const std::pair<int, int> sizes[] = {{0, 4}, {-1, 4}, {4, 0}, {4, -3}, {0, 0}, {-8, -8}};
     for (const kernel &k : kernels)
-        for (const auto &[width, height] : sizes)
+        for (const auto &size : sizes) {
+            const int width = size.first, height = size.second;  // Clang 14 captures no bindings
             rig::for_each_target([&](const rig::target_rows &) {
                 // Planes without a byte, right before the inaccessible page.
                 rig::picture src(rig::shapes_of(k.from, 0, 0)), dst(rig::shapes_of(k.to, 0, 0));
@@ -324,6 +325,7 @@ TEST(yuv2rgb, empty_pictures_write_nothing) {
                 rig::call(k.run, src, dst);
                 EXPECT_EQ(dst.stray_write(), "") << k.name << ", " << width << " x " << height;
             });
+        }
 }
 
 // The luma of a line may lie in the same line of the output, W bytes from its start or more.
