@@ -34,11 +34,11 @@ uint64_t number_from(const char *variable, uint64_t otherwise) {
     return text && *text ? strtoull(text, nullptr, 0) : otherwise;
 }
 
-// What runs now, for a program that ends at an inaccessible page.
-char running[512];
+// What the drivers run now, for a program that ends at an inaccessible page.
+char running[512] = "";
 
 void report_fault(int number) {
-    const char *text[] = {"\nfault in: ", running, "\n"};
+    const char *text[] = {"\nfault in: ", *running ? running : "no driver of the rig", "\n"};
     for (const char *t : text)
         if (write(STDERR_FILENO, t, strlen(t)) < 0) break;
     signal(number, SIG_DFL);  // the instruction is tried again and ends the program
@@ -385,8 +385,10 @@ bool check_job(const std::string &name, int width, int height, flush where, cons
         if (fault.empty() && !defines) fault = difference(expected, got);
         if (fault.empty()) continue;
         ADD_FAILURE() << fault << "\n  in: " << running;
+        *running = 0;
         return false;
     }
+    *running = 0;
     return true;
 }
 
