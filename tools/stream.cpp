@@ -90,7 +90,9 @@ CodedStream::CodedStream(Input &input, int32_t media_type)
                     " has no start codes; only H.264, MPEG-4 and H.263 streams can be cut");
     read_more();
     if (window_.empty()) throw Fault(input.name(), ": empty");
-    if (!media_type_) media_type_ = recognise();
+    if (media_type_) return;
+    reject_containers();  // a container holds start codes too
+    media_type_ = recognise();
     if (!media_type_) reject();
 }
 
@@ -113,8 +115,7 @@ int32_t CodedStream::recognise() const {
     return 0;
 }
 
-// Says what the bytes look like instead.
-void CodedStream::reject() const {
+void CodedStream::reject_containers() const {
     const auto at = [&](size_t place, std::string_view text) {
         return window_.size() >= place + text.size() &&
                memcmp(window_.data() + place, text.data(), text.size()) == 0;
@@ -133,6 +134,10 @@ void CodedStream::reject() const {
         throw Fault(input_.name(), ": ", container,
                     " file, not an elementary stream; `ffmpeg -i FILE -c copy -an OUT.h264` (or "
                     ".m4v, .h263) takes the video out");
+}
+
+// Says what the bytes look like instead.
+void CodedStream::reject() const {
     // Lengths of NAL units, each leading to the next.
     size_t place = 0;
     int units = 0;

@@ -38,6 +38,7 @@ class CodedStream {
     enum class Role { header, picture, more };
 
     int32_t recognise() const;
+    void reject_containers() const;
     [[noreturn]] void reject() const;
     bool read_more();
     bool find(Unit &unit);
