@@ -5,6 +5,7 @@
 
 #include "scmn/bits.h"
 #include "simd/choose.h"
+#include "simgp/planes.h"
 
 namespace simgp::scalar {
 
@@ -42,16 +43,8 @@ void scmn_mfree_fast_align32(void *p) { scmn_mfree_align32(p); }
 
 void scmn_blk_mcpy(void *dst, const void *src, int32_t dst_stride, int32_t src_stride,
                    int32_t width, int32_t height) {
-    if (width <= 0 || height <= 0) return;
-    uint8_t *to = static_cast<uint8_t *>(dst);
-    const uint8_t *from = static_cast<const uint8_t *>(src);
-    // Rows without gaps are one.
-    if (dst_stride == width && src_stride == width) {
-        memcpy(to, from, size_t(width) * size_t(height));
-        return;
-    }
-    for (int32_t y = 0; y < height; y++)
-        memcpy(to + ptrdiff_t(y) * dst_stride, from + ptrdiff_t(y) * src_stride, size_t(width));
+    simgp::copy_rows(static_cast<const uint8_t *>(src), src_stride, static_cast<uint8_t *>(dst),
+                     dst_stride, width, height);
 }
 
 // `whole` bytes of the pattern, then a tail of its low byte. Neither needs to be positive.

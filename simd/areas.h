@@ -8,6 +8,8 @@
     X(simgp, rgb2yuv) \
     X(simgp, yuv2rgb) \
     X(simgp, dither)  \
+    X(simgp, layout)  \
+    X(simgp, tile)    \
     X(scmn, mem)      \
     X(scmn, keyframe)
 // clang-format on

@@ -164,6 +164,14 @@ inline pair_u8 load_split(const uint8_t *p) {
     const __m256i a = load(p), b = load(p + bytes);
     return {_mm256_packus_epi16(even(a), even(b)), _mm256_packus_epi16(odd(a), odd(b))};
 }
+inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
+    v = _mm256_shuffle_epi8(
+        v, _mm256_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15,  //
+                            0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
+    v = _mm256_permute4x64_epi64(v, 0xD8);
+    _mm_storeu_si128(reinterpret_cast<__m128i *>(p), _mm256_castsi256_si128(v));
+    _mm_storeu_si128(reinterpret_cast<__m128i *>(q), _mm256_extracti128_si256(v, 1));
+}
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm256_unpacklo_epi8(even, odd));

@@ -162,6 +162,18 @@ inline pair_u8 load_split(const uint8_t *p) {
     const __m512i a = load(p), b = load(p + bytes);
     return {_mm512_packus_epi16(even(a), even(b)), _mm512_packus_epi16(odd(a), odd(b))};
 }
+struct split_index {
+    alignas(64) uint8_t lane[64];
+    constexpr split_index() : lane() {
+        for (int i = 0; i < 64; i++) lane[i] = static_cast<uint8_t>(2 * (i % 32) + i / 32);
+    }
+};
+inline constexpr split_index even_then_odd;
+inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
+    v = _mm512_permutexvar_epi8(load(even_then_odd.lane), v);
+    _mm256_storeu_si256(reinterpret_cast<__m256i *>(p), _mm512_castsi512_si256(v));
+    _mm256_storeu_si256(reinterpret_cast<__m256i *>(q), _mm512_extracti64x4_epi64(v, 1));
+}
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm512_unpacklo_epi8(even, odd));

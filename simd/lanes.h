@@ -267,6 +267,10 @@ inline pair_u8 load_split(const uint8_t *p) {
     return {natural_to_by8(make<u8v>([&](int i) { return p[2 * i]; })),
             natural_to_by8(make<u8v>([&](int i) { return p[2 * i + 1]; }))};
 }
+// The even bytes of v at p, the odd ones at q.
+inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
+    for (int i = 0; i < bytes; i++) (i & 1 ? q : p)[i / 2] = v.lane[i];
+}
 
 // Stores of 2, 3 and 4 vectors: the bytes of two vectors in by8 order, in turn; the words of the
 // even and the odd pixels in by8 order, in turn; the bytes of three vectors in natural order, in

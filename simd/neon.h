@@ -151,6 +151,11 @@ inline pair_u8 load_split(const uint8_t *p) {
     const uint8x16x2_t v = vld2q_u8(p);
     return {v.val[0], v.val[1]};
 }
+inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
+    const uint8x8x2_t split = vuzp_u8(vget_low_u8(v), vget_high_u8(v));
+    vst1_u8(p, split.val[0]);
+    vst1_u8(q, split.val[1]);
+}
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) { vst2q_u8(p, uint8x16x2_t{{even, odd}}); }
 inline void store_zip16(uint8_t *p, u16v even, u16v odd) {

@@ -150,6 +150,11 @@ inline pair_u8 load_split(const uint8_t *p) {
     const __m128i a = load(p), b = load(p + bytes);
     return {_mm_packus_epi16(even(a), even(b)), _mm_packus_epi16(odd(a), odd(b))};
 }
+inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
+    v = _mm_shuffle_epi8(v, _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
+    _mm_storel_epi64(reinterpret_cast<__m128i *>(p), v);
+    _mm_storeh_pd(reinterpret_cast<double *>(q), _mm_castsi128_pd(v));
+}
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm_unpacklo_epi8(even, odd));

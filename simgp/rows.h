@@ -54,6 +54,25 @@ using rgb_to_yuv_row = void(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t 
 // Repacks `width` >= 1 pixels of a row, which may not overlap.
 using rgb_to_rgb_row = void(const uint8_t *src, uint8_t *dst, ptrdiff_t width);
 
+// Interleaves and takes apart `pairs` >= 1 byte pairs: byte 2i is byte i of a, the next
+// byte i of b.
+using pack_row = void(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs);
+using unpack_row = void(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs);
+
+// Moves the first `rows` rows, 1 to 32, of a tile, 64 bytes each and 64 bytes apart, from or to
+// linear rows. Tiled chroma is taken apart into, or interleaved from, rows of 32 bytes.
+using detile_rows = void(const uint8_t *tile, uint8_t *dst, ptrdiff_t stride, ptrdiff_t rows);
+using entile_rows = void(const uint8_t *src, ptrdiff_t stride, uint8_t *tile, ptrdiff_t rows);
+using detile_unpack_rows = void(const uint8_t *tile, uint8_t *a, ptrdiff_t stride_a, uint8_t *b,
+                                ptrdiff_t stride_b, ptrdiff_t rows);
+using entile_pack_rows = void(const uint8_t *a, ptrdiff_t stride_a, const uint8_t *b,
+                              ptrdiff_t stride_b, uint8_t *tile, ptrdiff_t rows);
+
+// Converts `rows` rows of 64 pixels: row r from row r of the luma tile and row r / 2 of the chroma
+// tile, byte pairs U V.
+using tile_to_rgb_rows = void(const uint8_t *luma, const uint8_t *chroma, uint8_t *dst,
+                              ptrdiff_t stride, ptrdiff_t rows);
+
 // Repeats the four bytes of value, lowest first, over `size` bytes, a multiple of 32.
 using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
 
@@ -72,7 +91,17 @@ struct rows {
     yuv_to_rgb_row_pair *yuv_to_rgb_pair[size_t(yuv_layout::count)][size_t(rgb_packing::count)];
     yuv_to_rgb_row_pair *vu_to_rgb565_coarse_pair;  // with the coefficients of 6 fractional bits
 
-    dither_row *dither;        // dither
+    dither_row *dither;  // dither
+    pack_row *pack;      // layout
+    unpack_row *unpack;  // layout
+
+    // tile
+    detile_rows *detile;
+    entile_rows *entile;
+    detile_unpack_rows *detile_unpack;
+    entile_pack_rows *entile_pack;
+    tile_to_rgb_rows *tile_to_rgb565, *tile_to_bgra8888;
+
     fill_row *fill;            // mem
     find_code_row *find_code;  // keyframe
 
@@ -108,7 +137,7 @@ struct rows {
     X(half, rgb565) X(half, bgr565) X(half, rgb888) X(half, bgr888)                         \
     X(half, rgba8888) X(half, bgra8888) X(half, argb8888)                                   \
     X(full, rgb565) X(full, bgr565)                                                         \
-    X(uv, rgb565) X(uv, bgr565) X(uv, rgb888)                                               \
+    X(uv, rgb565) X(uv, bgr565) X(uv, rgb888) X(uv, bgra8888)                               \
     X(vu, bgr565) X(vu, rgb888)
 
 // The rows from RGB to YUV, X(packing, layout), and to RGB565, X(packing).

@@ -35,11 +35,14 @@
 #ifndef SIMGP_SIMGP_H
 #define SIMGP_SIMGP_H
 
+#include "simgp/copy.h"
 #include "simgp/csc.h"
 #include "simgp/dither.h"
 #include "simgp/img.h"
+#include "simgp/layout.h"
 #include "simgp/packed2rgb.h"
 #include "simgp/rgb2yuv.h"
+#include "simgp/tile.h"
 #include "simgp/yuv2rgb.h"
 
 #endif

@@ -59,6 +59,23 @@ const pair pairs[] = {
     PAIR(RGB565, NV12, rgb565_to_nv12),
     PAIR(RGB565, NV21, rgb565_to_nv21),
     PAIR(RGBA8888, RGB565, rgba8888_to_rgb565),
+    PAIR(YUV420, YUV422N, yuv420_to_yuv422n),
+    PAIR(YUV420, YV12, yuv420_to_yv12),
+    PAIR(YUV420, NV12, yuv420_to_nv12),
+    PAIR(YUV420, NV21, yuv420_to_nv21),
+    PAIR(YUV420, T64X32, yuv420_to_t64x32),
+    PAIR(YUV422N, YUV420, yuv422n_to_yuv420),
+    PAIR(YUV422N, YV12, yuv422n_to_yv12),
+    PAIR(YV16, YV12, yv16_to_yv12),
+    PAIR(YV16, YUV420, yv16_to_yuv420),
+    PAIR(NV12, YUV420, nv12_to_yuv420),
+    PAIR(NV12, YV12, nv12_to_yv12),
+    PAIR(NV21, YUV420, nv21_to_yuv420),
+    PAIR(NV21, YV12, nv21_to_yv12),
+    PAIR(T64X32, RGB565, t64x32_to_rgb565),
+    PAIR(T64X32, BGRA8888, t64x32_to_bgra8888),
+    PAIR(T64X32, NV12, t64x32_to_nv12),
+    PAIR(T64X32, YUV420, t64x32_to_yuv420),
 };
 // clang-format on
 

@@ -39,6 +39,8 @@ static const operation operations[] = {
     MEMORY("load_zip, first", bytes, put(out, load_zip(in - bytes / 2, in - 3 * bytes))),
     MEMORY("load_zip, second", bytes, put(out, load_zip(in - 3 * bytes - 1, in - bytes / 2))),
     MEMORY("load_split", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("store_split", bytes, store_split(out, out + bytes / 2, u8(in, 0))),
+    MEMORY("store_split, anywhere", bytes + 1, { out[bytes / 2] = 0; store_split(out + bytes / 2 + 1, out, u8(in, 0)); }),
     MEMORY("set_u8", bytes, put(out, set_u8(in[-1]))),
     MEMORY("set_u16", bytes, put(out, set_u16(uint16_t(in[-1] << 8 | in[-2])))),
     MEMORY("set_u32", bytes, put(out, set_u32(uint32_t(in[-1]) << 24 | in[-2] << 16 | in[-3] << 8 | in[-4]))),
