@@ -29,6 +29,11 @@ void print_cells(const Cells &...cells) {
     printf("|\n");
 }
 
+// Goals are held against figures as they are printed, with two digits.
+bool falls_short(double goal, const quartiles &got) {
+    return goal != 0 && got.middle != 0 && got.middle + 0.005 < goal;
+}
+
 // Distinct values of a member, in the order of first appearance.
 std::vector<std::string> distinct(const std::vector<line> &lines, std::string line::*member) {
     std::vector<std::string> values;
@@ -49,7 +54,7 @@ quartiles quartiles_of(std::vector<double> v) {
 std::string line::missed() const {
     std::string text;
     const auto want = [&](const std::string &what, double goal, const quartiles &got) {
-        if (goal == 0 || got.middle == 0 || got.middle >= goal) return;
+        if (!falls_short(goal, got)) return;
         text += format("%s%s %.2g", text.empty() ? "" : ", ", what.c_str(), goal);
     };
     want("peer", goals.peer, peer);
@@ -112,7 +117,7 @@ void write_markdown(const std::string &path, const std::vector<line> &lines) {
         for (const std::string &name : operations) {
             std::string peer, peer_goal, peers, scalar, limit, twin;
             const auto cell = [](double goal, const quartiles &got, int digits) {
-                return format(goal && got.middle && got.middle < goal ? "**%s**" : "%s",
+                return format(falls_short(goal, got) ? "**%s**" : "%s",
                               got.middle ? number(got.middle, digits).c_str() : "-");
             };
             for (const std::string &size : sizes) {
