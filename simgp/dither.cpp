@@ -4,8 +4,8 @@
 
 #include <string.h>
 
-#include "scmn/mem.h"
 #include "simd/choose.h"
+#include "simgp/copy.h"
 #include "simgp/walk.h"
 
 namespace simgp {
@@ -170,11 +170,10 @@ constexpr pair pairs[] = {
 
 // YUV420 to YUV420.
 void dither_planes(const simgp_img &src, const simgp_img &dst) {
-    simgp_dit_8b(src.plane[0], src.width[0], src.height[0], src.stride[0], dst.stride[0],
-                 dst.plane[0]);
-    for (int k = 1; k < 3; k++)
-        scmn_blk_mcpy(dst.plane[k], src.plane[k], dst.stride[k], src.stride[k], src.width[k],
-                      src.height[k]);
+    for (int k = 0; k < 3; k++) {
+        simgp_plane_fn *const copy = k == 0 ? simgp_dit_8b : simgp_cpy_8b;
+        copy(src.plane[k], src.width[k], src.height[k], src.stride[k], dst.stride[k], dst.plane[k]);
+    }
 }
 
 }  // namespace
@@ -185,7 +184,7 @@ using namespace simgp;
 void simgp_dit_8b(const void *src, int32_t width, int32_t height, int32_t src_stride,
                   int32_t dst_stride, void *dst) {
     if (!is_dithered(width, height))
-        return scmn_blk_mcpy(dst, src, dst_stride, src_stride, width, height);
+        return simgp_cpy_8b(src, width, height, src_stride, dst_stride, dst);
     const plane_lines from{static_cast<uint8_t *>(const_cast<void *>(src)), src_stride};
     const plane_lines to{static_cast<uint8_t *>(dst), dst_stride};
     for (ptrdiff_t y = 0; y < height; y++) finish_row(from, to, width, height, y);
