@@ -36,6 +36,8 @@ Output::Output(const std::string &path) : name_(path), path_(path) {
     struct stat about;
     if (path == "-") {
         name_ = "standard output";
+        if (isatty(STDOUT_FILENO))
+            throw Fault("standard output is a terminal; picture data is not written to it");
         file_ = stdout;
     } else if (stat(path.c_str(), &about) == 0 && !S_ISREG(about.st_mode)) {
         file_ = std::fopen(path.c_str(), "wb");
