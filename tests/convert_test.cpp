@@ -1,0 +1,415 @@
+// simgp-convert as its users meet it: the program is run on files and pipes in a folder of its own.
+#include <gtest/gtest.h>
+#include <sys/wait.h>
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <set>
+#include <sstream>
+#include <string>
+
+#include "tools/picture.h"
+#include "tools/rgb.h"
+#include "tools/source.h"
+
+namespace {
+
+namespace fs = std::filesystem;
+using tools::Format;
+using tools::Kind;
+using tools::Picture;
+
+std::string read_file(const fs::path &path) {
+    std::ifstream file(path, std::ios::binary);
+    std::ostringstream text;
+    text << file.rdbuf();
+    return text.str();
+}
+
+void write_file(const fs::path &path, const std::string &text) {
+    std::ofstream(path, std::ios::binary) << text;
+}
+
+class Convert : public testing::Test {
+  protected:
+    void SetUp() override {
+        std::string name = fs::temp_directory_path() / "simgp-convert-test.XXXXXX";
+        ASSERT_NE(mkdtemp(name.data()), nullptr);
+        folder_ = name;
+        fs::create_directory(work());
+    }
+    void TearDown() override { fs::remove_all(folder_); }
+
+    fs::path work() const { return folder_ / "work"; }
+    fs::path at(const std::string &name) const { return work() / name; }
+
+    /// Runs a shell command line in the folder, the program's name written as $C.
+    int shell(const std::string &line) {
+        const std::string command = "cd '" + work().string() + "' && C=" + SIMGP_CONVERT +
+                                    " && { " + line + "; } >../out 2>../err";
+        const int status = std::system(("bash -c " + quoted(command)).c_str());
+        out_ = read_file(folder_ / "out");
+        err_ = read_file(folder_ / "err");
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+    int run(const std::string &arguments) { return shell("$C " + arguments); }
+    void good(const std::string &arguments) {
+        ASSERT_EQ(run(arguments), 0) << arguments << "\n" << err_;
+    }
+
+    std::set<std::string> files() const {
+        std::set<std::string> names;
+        for (const auto &entry : fs::directory_iterator(work()))
+            names.insert(entry.path().filename());
+        return names;
+    }
+
+    static std::string quoted(const std::string &text) {
+        std::string result = "'";
+        for (char c : text) result += c == '\'' ? std::string("'\\''") : std::string(1, c);
+        return result + "'";
+    }
+
+    /// The picture of a PNG in the folder.
+    Picture png(const std::string &name) const {
+        auto source = tools::open_source({at(name), "", ""});
+        Picture picture;
+        source->next(picture);
+        return picture;
+    }
+
+    fs::path folder_;
+    std::string out_, err_;
+};
+
+std::vector<const Format *> formats(bool rgb) {
+    std::vector<const Format *> list;
+    for (const Format &format : tools::formats())
+        if (format.is_rgb() == rgb) list.push_back(&format);
+    return list;
+}
+
+/// The largest difference between two RGB pictures of the same size, and where it is.
+int difference(const Picture &a, const Picture &b, std::string *where = nullptr) {
+    EXPECT_EQ(a.width(), b.width());
+    EXPECT_EQ(a.height(), b.height());
+    if (a.width() != b.width() || a.height() != b.height()) return 256;
+    int worst = -1;
+    for (int y = 0; y < a.height(); ++y)
+        for (int x = 0; x < a.width(); ++x)
+            for (int c = 0; c < 3; ++c) {
+                const int apart = std::abs(*a.sample(c, x, y) - *b.sample(c, x, y));
+                if (apart <= worst) continue;
+                worst = apart;
+                if (where)
+                    *where = "x " + std::to_string(x) + ", y " + std::to_string(y) + ", channel " +
+                             std::to_string(c);
+            }
+    return worst;
+}
+
+constexpr std::array<std::array<int, 3>, 8> bar_colours = {{{255, 255, 255},
+                                                            {255, 255, 0},
+                                                            {0, 255, 255},
+                                                            {0, 255, 0},
+                                                            {255, 0, 255},
+                                                            {255, 0, 0},
+                                                            {0, 0, 255},
+                                                            {0, 0, 0}}};
+
+/// The bars stand where they should, left to right, in their colours.
+void expect_bars(const Picture &picture, int tolerance, bool grey, const std::string &what) {
+    for (int bar = 0; bar < 8; ++bar) {
+        const int x = (2 * bar + 1) * picture.width() / 16;
+        for (int c = 0; c < 3; ++c) {
+            if (grey && bar != 0 && bar != 7) continue;
+            EXPECT_NEAR(*picture.sample(c, x, 0), bar_colours[bar][c], tolerance)
+                << what << ": bar " << bar << ", channel " << c;
+        }
+    }
+}
+
+// Every format goes out to a raw file and comes back from it with the right colours, at sizes that
+// are odd and not multiples of a tile: a wrong plane order, offset, stride or channel shows.
+// Grey shows its luma as it is, so that black is 16 there and white 235.
+TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
+    for (const Format *format : formats(false))
+        for (const char *size : {"128x64", "97x51"}) {
+            const std::string name(format->name), file = name + size + "." + name;
+            good(std::string("testcard:") + size + "@3 --format " + name + " -o " + file);
+            good(file + " --size " + size + " -q -n 1 -o " + file + ".png");
+            expect_bars(png(file + ".png"), name == "yuv400" ? 20 : 9, name == "yuv400", file);
+            // Nothing to convert: the same bytes again, all three frames of them.
+            good(file + " --size " + size + " -o again." + name);
+            EXPECT_EQ(read_file(at(file)), read_file(at("again." + name))) << file;
+        }
+    EXPECT_EQ(fs::file_size(at("yuv420128x64.yuv420")), 3u * 128 * 64 * 3 / 2);
+    EXPECT_EQ(fs::file_size(at("uyvy97x51.uyvy")), 3u * 97 * 2 * 51);
+    EXPECT_EQ(fs::file_size(at("nv2197x51.nv21")), 3u * (97 * 51 + 49 * 2 * 26));
+    // 97 x 51: one pair of tile rows of one group; chroma of 25 rows: one single tile row.
+    EXPECT_EQ(fs::file_size(at("t64x3297x51.t64x32")), 3u * (8192 + 8192));
+}
+
+TEST_F(Convert, EveryRgbFormatHasTheBarsAndWidensToFullWhite) {
+    for (const Format *format : formats(true)) {
+        const std::string name(format->name);
+        good("testcard:97x51 -q --to " + name + " -o " + name + ".png");
+        const Picture picture = png(name + ".png");
+        expect_bars(picture, format->kind == Kind::rgb16 ? 8 : 2, false, name);
+        for (int c = 0; c < 3; ++c) EXPECT_EQ(*picture.sample(c, 1, 0), 255) << name;
+        // The same pixels as PPM, after the header, and as raw bytes of the format.
+        good("testcard:97x51 -q --to " + name + " -o " + name + ".ppm");
+        const std::string header = "P6\n97 51\n255\n", ppm = read_file(at(name + ".ppm"));
+        ASSERT_EQ(ppm.size(), header.size() + 97 * 51 * 3);
+        EXPECT_EQ(ppm.substr(0, header.size()), header);
+        EXPECT_EQ(std::memcmp(ppm.data() + header.size(), picture.row(0, 0), 97 * 3), 0) << name;
+    }
+    good("testcard:16x8 -o one.argb8888");
+    EXPECT_EQ(read_file(at("one.argb8888")).substr(0, 4), "\xff\xff\xff\xff");
+    EXPECT_EQ(read_file(at("one.argb8888")).substr(40, 4), std::string("\xff\xff\x00\x00", 4));
+}
+
+// What the two matrices allow: a PNG goes to every YUV format and comes back. The picture has soft
+// colours, of which subsampling takes little, and an odd size, so that the last column and line
+// need chroma of their own.
+TEST_F(Convert, PicturesGoIntoEveryYuvFormatAndComeBack) {
+    constexpr int width = 75, height = 67;
+    std::string ppm;
+    Picture soft({&tools::format_named("rgb888"), width, height});
+    for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+            *soft.sample(0, x, y) = uint8_t(60 + x * 2);
+            *soft.sample(1, x, y) = uint8_t(200 - y);
+            *soft.sample(2, x, y) = uint8_t(90 + x / 2 + y / 2);
+        }
+    for (int y = 0; y < height; ++y)
+        ppm.append(reinterpret_cast<char *>(soft.row(0, y)), width * 3);
+    write_file(at("soft.rgb888"), ppm);
+    good("soft.rgb888 --size 75x67 -o soft.png");
+    ASSERT_EQ(difference(png("soft.png"), soft), 0);
+    for (const Format *format : formats(false)) {
+        const std::string name(format->name);
+        good("soft.png -o soft." + name);
+        good("soft." + name + " --size 75x67 -q -o back.png");
+        if (name == "yuv400") continue;
+        // Rounding of both matrices, and the slope of the picture within a chroma block; formats
+        // that reach the screen in 16 bits only lose up to 8 more.
+        const bool in_16_bits = name == "yuv444" || name == "yuv422w";
+        std::string where;
+        const int apart = difference(png("back.png"), soft, &where);
+        EXPECT_LE(apart, in_16_bits ? 14 : 7) << name << " at " << where;
+    }
+}
+
+TEST_F(Convert, Y4mOfEveryLayoutComesFromFilesAndPipes) {
+    for (const char *format : {"yuv400", "yuv420", "yuv422n", "yuv444"}) {
+        const std::string name(format);
+        good("testcard:33x17@4 --format " + name + " -o " + name + ".y4m");
+        ASSERT_EQ(shell("cat " + name + ".y4m | $C - -o - --as y4m > pipe.y4m"), 0) << err_;
+        EXPECT_EQ(read_file(at(name + ".y4m")), read_file(at("pipe.y4m"))) << name;
+    }
+    // Parameters of frames, comments, the tags for rate and aspect: read, and kept where they
+    // matter.
+    const std::string video = read_file(at("yuv420.y4m"));
+    const size_t header = video.find('\n') + 1;
+    write_file(at("tags.y4m"),
+               "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420mpeg2 XCOMMENT=none\nFRAME Ip\n" +
+                   video.substr(header + 6));
+    good("tags.y4m -o kept.y4m");
+    const std::string kept = read_file(at("kept.y4m"));
+    EXPECT_EQ(kept.substr(0, kept.find('\n')), "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420jpeg");
+    EXPECT_EQ(kept.substr(kept.find('\n') + 1), video.substr(header));
+}
+
+TEST_F(Convert, SeveralFramesBecomeNumberedFilesOrASheet) {
+    good("testcard:64x48@12 -o a%%-%03d.png");
+    std::set<std::string> expected;
+    for (int k = 0; k < 12; ++k)
+        expected.insert("a%-0" + std::string(k < 10 ? "0" : "") + std::to_string(k) + ".png");
+    EXPECT_EQ(files(), expected);
+    EXPECT_GT(difference(png("a%-000.png"), png("a%-011.png")), 100) << "the card does not move";
+
+    good("testcard:64x48@12 -n 6 -o sheet.png --sheet --columns 3");
+    const Picture sheet = png("sheet.png");
+    EXPECT_EQ(sheet.width(), 3 * (64 + 8) + 8);
+    // The first picture stands in its frame unchanged, below its label.
+    const Picture first = png("a%-000.png");
+    const int top = (sheet.height() - 8) / 2 - 48;
+    for (int y = 0; y < 48; ++y)
+        ASSERT_EQ(std::memcmp(sheet.sample(0, 8, top + y), first.row(0, y), 64 * 3), 0)
+            << "line " << y;
+
+    good("testcard:64x48@200 -o long.ppm --sheet");
+    EXPECT_LT(read_file(at("long.ppm")).size(), 64 * (64 + 8) * (48 + 19) * 3u + 50000);
+}
+
+TEST_F(Convert, DitheringIsTheLibrarysOwn) {
+    good("testcard:64x48 -o plain.rgb565");
+    good("testcard:64x48 -o dithered.rgb565 --dither");
+    EXPECT_NE(read_file(at("plain.rgb565")), read_file(at("dithered.rgb565")));
+    auto card = tools::open_source({"testcard:64x48", "", ""});
+    Picture frame, screen({&tools::format_named("rgb565"), 64, 48});
+    card->next(frame);
+    const simgp_img src = frame.descriptor(), dst = screen.descriptor();
+    ASSERT_EQ(simgp_csc_dither(&src, &dst), SIMGP_OK);
+    EXPECT_EQ(read_file(at("dithered.rgb565")),
+              std::string(reinterpret_cast<char *>(screen.row(0, 0)), 64 * 48 * 2));
+    // Where the library does not dither from a format, the road goes over one from which it does.
+    good("testcard:64x48 --format nv12 -o over.bgr565 --dither -v");
+    EXPECT_NE(err_.find("nv12 -> yuv420 -> bgr565 (dithered)"), std::string::npos) << err_;
+    // Without --to, a format that can be dithered is chosen; luma alone can be, too.
+    good("testcard:64x48 -o seen.png --dither -v");
+    EXPECT_NE(err_.find("yuv420 -> rgb565 (dithered)"), std::string::npos) << err_;
+    good("testcard:64x48 -o luma.y4m --dither -v");
+    EXPECT_NE(err_.find("yuv420 -> yuv420 (dithered)"), std::string::npos) << err_;
+}
+
+// Each fault: one line that names what and where, the exit status, and no file that was not there.
+TEST_F(Convert, BadInputEndsInOneClearLineAndNoFile) {
+    good("testcard:64x48@3 -o good.y4m");
+    good("testcard:64x48@3 -o good.nv21 --format nv21");
+    good("testcard:64x48 -o good.png");
+    const std::string y4m = read_file(at("good.y4m")), png = read_file(at("good.png"));
+    const std::string nv21 = read_file(at("good.nv21"));
+    const size_t frame = 64 * 48 * 3 / 2;
+    write_file(at("cut.y4m"), y4m.substr(0, y4m.size() - 100));
+    write_file(at("cut.nv21"), nv21.substr(0, frame + 1));
+    write_file(at("cut.png"), png.substr(0, png.size() / 2));
+    write_file(at("huge.png"),
+               png.substr(0, 16) + std::string("\x7f\xff\xff\xff", 4) + png.substr(20));
+    write_file(at("empty"), "");
+    write_file(at("text"), "This is no picture at all.");
+    const size_t second = y4m.find("FRAME", y4m.find("FRAME") + 5);
+    write_file(at("lost.y4m"), y4m.substr(0, second) + "x" + y4m.substr(second));
+    auto header = [&](const std::string &name, const std::string &tags) {
+        write_file(at(name), "YUV4MPEG2 " + tags + "\nFRAME\n" + std::string(100, 'x'));
+    };
+    header("deep.y4m", "W4 H4 C420p10");
+    header("tag.y4m", "W4 H4 Z7");
+    header("colour.y4m", "W4 H4 C411");
+    header("wide.y4m", "W99999999999999999999 H4");
+    header("big.y4m", "W65535 H65535");
+    header("zero.y4m", "W0 H4");
+    header("negative.y4m", "W4 H-4");
+    header("nowidth.y4m", "H4");
+    write_file(at("none.y4m"), "YUV4MPEG2 W4 H4\n");
+    write_file(at("endless.y4m"), "YUV4MPEG2 W4 H4 X" + std::string(5000, 'x'));
+    const std::set<std::string> before = files();
+
+    const struct {
+        const char *arguments, *message;
+        int status;
+    } cases[] = {
+        {"cut.y4m -o o.y4m",
+         "cut.y4m: frame 2, byte 13783: the input ends within the frame: 4508 of its 4608", 1},
+        {"cut.nv21 -s 64x48 -o o.raw",
+         "cut.nv21: frame 1, byte 4609: the input ends within the frame: 1 of", 1},
+        {"cut.png -o o.ppm", "cut.png: PNG of", 1},
+        {"huge.png -o o.ppm", "huge.png: ", 1},
+        {"empty -o o.png", "empty: byte 0: the input is empty", 1},
+        {"- -o o.png </dev/null", "standard input: byte 0: the input is empty", 1},
+        {"text -o o.png", "text: neither Y4M nor PNG", 1},
+        {"lost.y4m -o o.raw", "lost.y4m: frame 1, byte 4655: no FRAME line", 1},
+        {"deep.y4m -o o.png", "deep.y4m: byte 16: colour space C420p10 has more than 8 bits", 1},
+        {"tag.y4m -o o.png", "tag.y4m: byte 16: unknown tag 'Z7'", 1},
+        {"colour.y4m -o o.png", "colour.y4m: byte 16: unknown colour space tag C411", 1},
+        {"wide.y4m -o o.png", "wide.y4m: byte 10: impossible size 99999999999999999999", 1},
+        {"big.y4m -o o.png", "big.y4m: byte 0: Y4M header: impossible size 65535x65535", 1},
+        {"zero.y4m -o o.png", "impossible size 0x4", 1},
+        {"negative.y4m -o o.png", "impossible size 4x-4", 1},
+        {"nowidth.y4m -o o.png", "nowidth.y4m: byte 0: the Y4M header lacks W", 1},
+        {"none.y4m -o o.png", "none.y4m: holds no frame", 1},
+        {"none.y4m -o o.png --sheet", "none.y4m: holds no frame", 1},
+        {"endless.y4m -o o.png", "endless.y4m: byte 0: the Y4M header has no end", 1},
+        {"missing.y4m -o o.png", "missing.y4m: No such file", 1},
+        {"good.nv21 -s 0x48 -o o.png", "--size: impossible size 0x48", 1},
+        {"good.nv21 -s 65536x1 -o o.png", "--size: impossible size 65536x1", 1},
+        {"good.nv21 -s 4294967297x4294967297 -o o.png",
+         "--size: impossible size 4294967297x4294967297", 1},
+        {"good.nv21 -s 64by48 -o o.png", "--size: '64by48' is not a size", 1},
+        {"text -s 64x48 -o o.png", "text: raw frames need --format", 1},
+        {"good.nv21 -f nv22 -s 64x48 -o o.png", "unknown format 'nv22'", 1},
+        {"good.y4m -f nv12 -o o.png", "good.y4m: holds yuv420, not nv12", 1},
+        {"good.png -t nv12 -o o.png", "png files hold RGB pictures, not nv12", 1},
+        {"good.png -t nv12 -o o.y4m", "Y4M files hold", 1},
+        {"good.png -o o.bgra8888 --dither",
+         "no conversion leads from rgb888 to bgra8888 with dithering", 1},
+        {"good.nv21 -f bgra8888 -s 64x36 -o o.nv12", "no conversion leads from bgra8888 to nv12",
+         1},
+        {"good.y4m -o o.png", "o.png: holds one picture, but more frames follow", 1},
+        {"good.y4m -o o-%d-%d.png", "o-%d-%d.png: one number such as", 1},
+        {"good.y4m -o o.y4m --sheet", "o.y4m: a contact sheet is a still picture", 1},
+        {"good.y4m -o nowhere/o.raw", "nowhere/o.raw: No such file", 1},
+        {"testcard:64x48@0 -o o.png", "testcard:64x48@0: '0' is not a number of frames", 1},
+        {"good.y4m -o o.png --frames 0", "--frames", 2},
+        {"good.y4m", "--output is required", 2},
+        {"--nonsense", "--nonsense", 2},
+    };
+    for (const auto &c : cases) {
+        SCOPED_TRACE(c.arguments);
+        EXPECT_EQ(run(c.arguments), c.status);
+        EXPECT_NE(err_.find(c.message), std::string::npos) << err_;
+        EXPECT_EQ(err_.rfind("simgp-convert: ", 0), 0u) << err_;
+        EXPECT_EQ(std::count(err_.begin(), err_.end(), '\n'), 1) << err_;
+        EXPECT_EQ(out_, "");
+        EXPECT_EQ(files(), before);
+    }
+}
+
+TEST_F(Convert, AFailureKeepsWhatWasThere) {
+    good("testcard:64x48@3 -o good.y4m");
+    const std::string y4m = read_file(at("good.y4m"));
+    write_file(at("cut.y4m"), y4m.substr(0, y4m.size() - 1));
+    write_file(at("old.raw"), "precious");
+    EXPECT_EQ(run("cut.y4m -o old.raw"), 1);
+    EXPECT_EQ(read_file(at("old.raw")), "precious");
+    // Complete pictures stay, and the message says so.
+    EXPECT_EQ(run("cut.y4m -o p%d.png"), 1);
+    EXPECT_NE(err_.find("(2 complete pictures stay)"), std::string::npos) << err_;
+    EXPECT_EQ(files(),
+              (std::set<std::string>{"cut.y4m", "good.y4m", "old.raw", "p0.png", "p1.png"}));
+    // A file may be converted onto itself.
+    good("good.y4m -o good.y4m --to yuv422n");
+    EXPECT_EQ(read_file(at("good.y4m")).find("C422\n") != std::string::npos, true);
+}
+
+TEST_F(Convert, BrokenPipesFullDisksAndInterruptionsEndCleanly) {
+    EXPECT_EQ(shell("$C testcard:320x240@100 -o - | head -c 10 >/dev/null; exit ${PIPESTATUS[0]}"),
+              1);
+    EXPECT_NE(err_.find("standard output: Broken pipe"), std::string::npos) << err_;
+    if (fs::exists("/dev/full")) {
+        EXPECT_EQ(run("testcard:320x240@2 -o /dev/full"), 1);
+        EXPECT_NE(err_.find("/dev/full: No space left"), std::string::npos) << err_;
+    }
+    EXPECT_NE(shell("$C testcard:640x480@1000000 -o long.raw & sleep 0.3; ls -A; kill %1; wait %1"),
+              0);
+    EXPECT_NE(out_.find(".long.raw."), std::string::npos) << "it was over too soon";
+    EXPECT_EQ(files(), std::set<std::string>{});
+}
+
+TEST_F(Convert, TheDemonstrationLeavesItsPictures) {
+    good("--demo pictures testcard:320x240@3");
+    std::set<std::string> names;
+    for (const auto &entry : fs::directory_iterator(at("pictures"))) {
+        names.insert(entry.path().filename());
+        EXPECT_NE(out_.find(entry.path().filename()), std::string::npos);
+        EXPECT_GT(png("pictures/" + entry.path().filename().string()).width(), 800);
+    }
+    EXPECT_EQ(names, (std::set<std::string>{"every-rgb-format.png", "every-yuv-to-rgb.png",
+                                            "tiles-and-dithering.png"}));
+}
+
+TEST_F(Convert, TheListNamesTheLibrarysConversions) {
+    good("--list");
+    for (const char *line :
+         {"  yuv400    -> rgb565*\n", "  t64x32    -> yuv420 nv12 rgb565 bgra8888\n",
+          "  rgba8888  -> rgb565\n"})
+        EXPECT_NE(out_.find(line), std::string::npos) << line << out_;
+    EXPECT_EQ(out_.find("\n  bgr565 "), std::string::npos) << "bgr565 converts to nothing";
+}
+
+}  // namespace
