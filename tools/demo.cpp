@@ -148,11 +148,6 @@ void demo(const std::string &directory, const SourceOptions &options) {
     save(folder + "every-yuv-to-rgb.png", every_pair(), 6);
     std::printf("%severy-yuv-to-rgb.png: the test card through every YUV to RGB conversion\n",
                 folder.c_str());
-    // Until the library has both.
-    const Format &planar = format_coded(SIMGP_FMT_YUV420);
-    if (!offered(planar, format_coded(SIMGP_FMT_T64X32), Via::csc) ||
-        !offered(planar, format_coded(SIMGP_FMT_RGB565), Via::dither))
-        return;
     save(folder + "tiles-and-dithering.png", tiles_and_dithering(frames.front()), 3);
     std::printf(
         "%stiles-and-dithering.png: from a tiled frame to the screen; dithered beside plain "

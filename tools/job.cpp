@@ -126,7 +126,7 @@ void run(const Job &job) {
 }
 
 std::string list_conversions() {
-    std::string page = "Conversions of the library, * with dithering as well:\n";
+    std::string page = "Conversions of the library (* can be dithered):\n";
     for (const Format &from : formats()) {
         std::string line;
         for (const Format &to : formats()) {

@@ -15,12 +15,7 @@ constexpr size_t count = 19;  // formats
 size_t index(const Format &format) { return size_t(&format - formats().data()); }
 
 int32_t call(Via via, const simgp_img &src, const simgp_img &dst) {
-#if __has_include("simgp/dither.h")
-    if (via == Via::dither) return simgp_csc_dither(&src, &dst);
-#else
-    if (via == Via::dither) return SIMGP_ERR_UNSUPPORTED;
-#endif
-    return simgp_csc(&src, &dst);
+    return via == Via::dither ? simgp_csc_dither(&src, &dst) : simgp_csc(&src, &dst);
 }
 
 /// Layouts that the library reads but never writes. That pictures can be brought into them all the
