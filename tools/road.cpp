@@ -44,22 +44,26 @@ int step_cost(const Format &from, const Format &to, Via via) {
     return cost;
 }
 
+/// True if a tiled picture has room for the chroma of an odd last line: unless the chroma line would
+/// begin a tile row of its own, it lies in the last one.
+bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
+
 /// Converts one picture. Where the source has an odd size, it is taken as if its last column and
 /// line stood there twice, so that each chroma sample of the destination gets a value; conversions
-/// to RGB and from packed and tiled pictures have their own rules for that, which are kept.
+/// from YUV to RGB have their own rules for that, which are kept.
 void convert(Via via, Picture &src, Picture &dst) {
     const Format &from = src.format(), &to = dst.format();
     if (via == Via::samples) return move_samples(src, dst);
-    const bool tiled = from.kind == Kind::tiled, to_yuv = !to.is_rgb();
-    const bool even_width = to_yuv && from.kind != Kind::packed;
-    const bool even_height = even_width && !tiled && to.kind != Kind::tiled;
-    if (even_width && !tiled) src.pad();
+    const bool even_width = !to.is_rgb(), tiled = from.kind == Kind::tiled;
+    const bool even_height =
+        even_width && ((!tiled && to.kind != Kind::tiled) || tiles_hold_last_chroma(src.height()));
+    if (even_width) src.pad();
     const simgp_img in = src.descriptor(even_width, even_height), out = dst.descriptor();
     const int32_t result = call(via, in, out);
     if (result != SIMGP_OK)
         throw Fault("the library refuses ", from.name, " -> ", to.name, ": result ", result);
-    if (tiled && to_yuv && dst.height() % 2) {
-        // A tiled picture of odd height holds no chroma for its last line.
+    if (tiled && even_width && !even_height) {
+        // The chroma of the last line is nowhere: that of the line above has to do.
         for (int k = 1; k < dst.planes(); ++k) {
             const int last = dst.rows(k) - 1;
             if (last > 0)

@@ -70,29 +70,34 @@ Tile make_tile(const Picture &picture, const std::string &label, int max_width, 
 
 Picture lay_out(const std::vector<Tile> &tiles, int columns) {
     if (tiles.empty()) throw Fault("no picture for the sheet");
+    const int count = int(tiles.size());
     int cell_width = 0, cell_height = 0;
     for (const Tile &tile : tiles) {
-        const int label_width = text_width(tile.label, 1);
-        cell_width = std::max({cell_width, tile.picture.width(), label_width});
+        cell_width = std::max({cell_width, tile.picture.width(), text_width(tile.label, 1)});
         cell_height = std::max(cell_height, tile.picture.height());
     }
-    const int count = int(tiles.size());
     if (columns <= 0)
         columns = int(std::lround(std::sqrt(double(count) * cell_height / cell_width)));
     columns = std::clamp(columns, 1, count);
     const int scale = cell_width >= 200 ? 2 : 1;
-    // A label that does not fit at the larger scale is written at the smaller one.
     const int label_height = text_height * scale + 4;
-    const int lines = (count + columns - 1) / columns;
+
+    std::vector<int> top{gap};  // of each line of tiles, and of what would follow the last
+    for (int first = 0; first < count; first += columns) {
+        int height = 0;
+        for (int k = first; k < std::min(first + columns, count); ++k)
+            height = std::max(height, tiles[k].picture.height());
+        top.push_back(top.back() + label_height + height + gap);
+    }
     const int width = columns * (cell_width + gap) + gap;
-    const int height = lines * (cell_height + label_height + gap) + gap;
-    check_size(width, height, "contact sheet");
-    Picture sheet({&format_coded(SIMGP_FMT_RGB888), width, height});
-    for (int y = 0; y < height; ++y) std::memset(sheet.row(0, y), paper, sheet.row_bytes(0));
+    check_size(width, top.back(), "contact sheet");
+    Picture sheet({&format_coded(SIMGP_FMT_RGB888), width, top.back()});
+    for (int y = 0; y < sheet.height(); ++y)
+        std::memset(sheet.row(0, y), paper, sheet.row_bytes(0));
     for (int k = 0; k < count; ++k) {
         const Tile &tile = tiles[k];
-        const int x = gap + k % columns * (cell_width + gap);
-        const int y = gap + k / columns * (cell_height + label_height + gap);
+        const int x = gap + k % columns * (cell_width + gap), y = top[k / columns];
+        // A label that does not fit at the larger scale is written at the smaller one.
         draw_text(sheet, x, y, tile.label, text_width(tile.label, scale) <= cell_width ? scale : 1);
         for (int line = 0; line < tile.picture.height(); ++line)
             std::memcpy(sheet.sample(0, x, y + label_height + line), tile.picture.row(0, line),
