@@ -62,7 +62,9 @@ class rotation {
         order_.resize(all_.size());
         std::iota(order_.begin(), order_.end(), size_t(0));
         for (entry &e : all_) {
-            e.calls = std::max(1, int(s.batch_us * 1e3 / std::max(1.0, batch(e) * e.units)));
+            const double call_ns = std::max(1.0, batch(e) * e.units);
+            e.calls = std::max(1, int(s.batch_us * 1e3 / call_ns));
+            e.warm_ns = call_ns < 5e6 ? 200e3 : 0;
         }
     }
 
@@ -127,12 +129,13 @@ class rotation {
         target rows;  // count: not ours
         std::function<void()> run;
         double units;
-        int calls;
-        std::vector<double> ns;  // per unit, by round
+        int calls = 1;
+        double warm_ns = 200e3;
+        std::vector<double> ns = {};  // per unit, by round
     };
 
     void add(target rows, const std::function<void()> &run, double units) {
-        all_.push_back({rows, run, units, 1, {}});
+        all_.push_back({rows, run, units});
     }
 
     // Time of this thread: what others run on the machine meanwhile does not count, but for what it
@@ -145,7 +148,8 @@ class rotation {
 
     // A batch; nanoseconds per unit. Processors switch the upper lanes of their vector units off
     // when these have not been used for half a millisecond, and run at a quarter of their speed
-    // for up to 150 microseconds when they switch them on: so each contender warms up unmeasured.
+    // for up to 150 microseconds when they switch them on: so each contender warms up unmeasured,
+    // unless a call takes so long that it does not matter.
     static double batch(const entry &e) {
         const auto run = [&e](int calls) {
             const double start = cpu_ns();
@@ -153,7 +157,7 @@ class rotation {
             return cpu_ns() - start;
         };
         if (e.rows != target::count) simgp::force_rows(&simgp::rows_of(e.rows));
-        for (double warm = 0; warm < 200e3;) warm += run(1);
+        for (double warm = 0; warm < e.warm_ns;) warm += run(1);
         const double ns = run(e.calls);
         simgp::force_rows(nullptr);
         return ns / e.calls / e.units;
