@@ -57,8 +57,10 @@ struct packer_888 {
     static constexpr pixel_order order = pixel_order::natural;
     static constexpr int size = 3;
     static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
-        const rgb_u8 p = narrow(even, odd);
-        store_zip3(dst, BGR ? p.b : p.r, p.g, BGR ? p.r : p.b);
+        if constexpr (BGR)
+            store_narrow_zip3<6, 7, 7>(dst, even.b6, odd.b6, even.g, odd.g, even.r, odd.r);
+        else
+            store_narrow_zip3<7, 7, 6>(dst, even.r, odd.r, even.g, odd.g, even.b6, odd.b6);
     }
 };
 template <>

@@ -41,6 +41,8 @@ static const operation operations[] = {
     MEMORY("load_split", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("store_split", bytes, store_split(out, out + bytes / 2, u8(in, 0))),
     MEMORY("store_split, anywhere", bytes + 1, { out[bytes / 2] = 0; store_split(out + bytes / 2 + 1, out, u8(in, 0)); }),
+    MEMORY("load_split_natural", 2 * bytes, const pair_u8 v = load_split_natural(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("load_split_by4", 2 * bytes, const pair_u8 v = load_split_by4(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("set_u8", bytes, put(out, set_u8(in[-1]))),
     MEMORY("set_u16", bytes, put(out, set_u16(uint16_t(in[-1] << 8 | in[-2])))),
     MEMORY("set_u32", bytes, put(out, set_u32(uint32_t(in[-1]) << 24 | in[-2] << 16 | in[-3] << 8 | in[-4]))),
@@ -112,6 +114,7 @@ static const operation operations[] = {
     MEMORY("store_zip8", 2 * bytes, store_zip8(out, u8(in, 0), u8(in, 1))),
     MEMORY("store_zip16", 2 * bytes, store_zip16(out, u16(in, 0), u16(in, 1))),
     MEMORY("store_zip3", 3 * bytes, store_zip3(out, u8(in, 0), u8(in, 1), u8(in, 2))),
+    MEMORY("store_narrow_zip3", 3 * bytes, store_narrow_zip3<7, 6, 5>(out, s16(in, 0), s16(in, 1), s16(in, 2), s16(in, 3), s16(in, 4), s16(in, 5))),
     MEMORY("store_zip4", 4 * bytes, store_zip4(out, u8(in, 0), u8(in, 1), u8(in, 2), u8(in, 3))),
 };
 // clang-format on
