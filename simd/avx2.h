@@ -153,9 +153,6 @@ inline u8v natural_to_by4(u8v v) {
     return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 2, 4, 6, 1, 3, 5, 7));
 }
 inline u8v by8_to_natural(u8v v) { return _mm256_permute4x64_epi64(v, 0xD8); }
-inline u8v by8_to_by4(u8v v) {
-    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 2, 6, 1, 5, 3, 7));
-}
 
 struct pair_u8 {
     u8v even, odd;

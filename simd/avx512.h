@@ -150,10 +150,6 @@ inline u8v natural_to_by4(u8v v) {
 inline u8v by8_to_natural(u8v v) {
     return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), v);
 }
-inline u8v by8_to_by4(u8v v) {
-    return _mm512_permutexvar_epi32(
-        _mm512_setr_epi32(0, 8, 2, 10, 1, 9, 3, 11, 4, 12, 6, 14, 5, 13, 7, 15), v);
-}
 
 struct pair_u8 {
     u8v even, odd;

@@ -257,7 +257,6 @@ inline u8v by8_to_natural(u8v v) {
         return v.lane[granule % blocks * 16 + granule / blocks * 8 + i % 8];
     });
 }
-inline u8v by8_to_by4(u8v v) { return natural_to_by4(by8_to_natural(v)); }
 
 // 2 bytes bytes, split: byte 2i and 2i + 1 of memory are byte i of even and odd. load_split gives
 // by8 order, the others that of their names.

@@ -142,7 +142,6 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
 inline u8v natural_to_by8(u8v v) { return v; }
 inline u8v natural_to_by4(u8v v) { return v; }
 inline u8v by8_to_natural(u8v v) { return v; }
-inline u8v by8_to_by4(u8v v) { return v; }
 
 struct pair_u8 {
     u8v even, odd;

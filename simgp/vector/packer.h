@@ -12,18 +12,12 @@ namespace simgp::SIMD_TARGET {
 
 enum class pixel_order { natural, by8, by4 };
 
-// Brings samples from natural order, or from by8, into the order of a packer.
+// Brings samples from natural order into the order of a packer.
 template <pixel_order Order>
 inline u8v arrange(u8v v) {
     return Order == pixel_order::by8   ? natural_to_by8(v)
            : Order == pixel_order::by4 ? natural_to_by4(v)
                                        : v;
-}
-template <pixel_order Order>
-inline u8v arrange_by8(u8v v) {
-    return Order == pixel_order::by8   ? v
-           : Order == pixel_order::by4 ? by8_to_by4(v)
-                                       : by8_to_natural(v);
 }
 
 template <rgb_packing>

@@ -99,7 +99,6 @@ static const operation operations[] = {
     VECTOR("natural_to_by8", u8, natural_to_by8(a)),
     VECTOR("natural_to_by4", u8, natural_to_by4(a)),
     VECTOR("by8_to_natural", u8, by8_to_natural(a)),
-    VECTOR("by8_to_by4", u8, by8_to_by4(a)),
     VECTOR("join_high", u16, join_high(a, b)),
     MEMORY("store_high", bytes / 2, store_high(out, u16(in, 0))),
     MEMORY("load_565, dot_high", bytes, put(out, dot_high<66, 129, 25, 16>(load_565(in - 2 * bytes)))),
