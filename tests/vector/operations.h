@@ -64,6 +64,8 @@ static const operation operations[] = {
     VECTOR("shl 11", u16, shl<11>(a)),
     VECTOR("shr 1", u16, shr<1>(a)),
     VECTOR("shr 13", u16, shr<13>(a)),
+    VECTOR("sar 1", s16, sar<1>(a)),
+    VECTOR("sar 15", s16, sar<15>(a)),
 
     VECTOR("add", s16, add(a, b)),
     VECTOR("add_sat", s16, add_sat(a, b)),
