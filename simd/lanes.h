@@ -277,7 +277,10 @@ inline pair_u8 load_split_by4(const uint8_t *p) {
 }
 // The even bytes of v at p, the odd ones at q.
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
-    for (int i = 0; i < bytes; i++) (i & 1 ? q : p)[i / 2] = v.lane[i];
+    for (int i = 0; i < bytes / 2; i++) {
+        p[i] = v.lane[2 * i];
+        q[i] = v.lane[2 * i + 1];
+    }
 }
 
 // Stores of 2, 3 and 4 vectors: the bytes of two vectors in by8 order, in turn; the words of the

@@ -154,7 +154,7 @@ inline pair_u8 load_split(const uint8_t *p) {
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     v = _mm_shuffle_epi8(v, _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
     _mm_storel_epi64(reinterpret_cast<__m128i *>(p), v);
-    _mm_storeh_pd(reinterpret_cast<double *>(q), _mm_castsi128_pd(v));
+    _mm_storel_epi64(reinterpret_cast<__m128i *>(q), _mm_srli_si128(v, 8));
 }
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
