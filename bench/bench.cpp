@@ -268,7 +268,7 @@ int run(int argc, char **argv) {
     std::vector<comparison> all;
     for (const auto area :
          {yuv2rgb_comparisons, packed2rgb_comparisons, rgb2yuv_comparisons, layout_comparisons,
-          copy_comparisons, tile_comparisons, dither_comparisons})
+          copy_comparisons, tile_comparisons, dither_comparisons, scmn_comparisons})
         for (comparison &c : area()) all.push_back(std::move(c));
     for (const comparison &c : all) {
         const std::vector<std::string> &chosen = sizes.empty() ? c.sizes : sizes;

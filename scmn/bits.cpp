@@ -202,37 +202,28 @@ static inline void put(scmn_bsw_ctx *ctx, uint32_t v, int32_t n) {
     }
 }
 
+// The low n bytes of x, 1 to 4, highest first; for 2 and more in two stores that may overlap.
+static inline void store_bytes(uint8_t *p, uint32_t x, int32_t n) {
+    if (n == 1) {
+        *p = static_cast<uint8_t>(x);
+        return;
+    }
+    const uint32_t memory = big_endian(x << (32 - 8 * n)), last = big_endian(x << 16);
+    memcpy(p, &memory, 2);
+    memcpy(p + n - 2, &last, 2);
+}
+
 int32_t scmn_bsw_write1(scmn_bsw_ctx *ctx, uint32_t bit) {
     if (bytes_left(ctx->cur, ctx->last) <= 0) return -1;
     put(ctx, bit << 31, 1);
     return 0;
 }
 
-int32_t scmn_bsw_write(scmn_bsw_ctx *ctx, uint32_t value, int32_t n) {
-    const intptr_t left = bytes_left(ctx->cur, ctx->last);
-    if (left <= 0) return -1;
+// Byte by byte, with a look at the end before each.
+[[gnu::noinline]] static int32_t write_slowly(scmn_bsw_ctx *ctx, uint32_t value, int32_t n) {
+    if (bytes_left(ctx->cur, ctx->last) <= 0) return -1;
     if (n <= 0) return 0;
     if (n > 32) n = 32;
-
-    // Without a callback and away from the end: all bits at once, behind those of the current byte.
-    const int32_t used = 8 - ctx->free_bits;
-    const int32_t total = used + n;  // 1 to 39
-    if (!ctx->on_byte && left >= 5) {
-        uint8_t *cur = ctx->cur;
-        const uint64_t bits = static_cast<uint64_t>(*cur) << n | low_bits(value, n);
-        const int32_t rest = total % 8;
-        for (int32_t shift = total - 8; shift >= 0; shift -= 8)
-            *cur++ = static_cast<uint8_t>(bits >> shift);
-        // The rest pushes up what its byte held before; in the first byte that has happened above.
-        if (cur == ctx->cur)
-            *cur = static_cast<uint8_t>(bits);
-        else if (rest)
-            *cur = static_cast<uint8_t>(*cur << rest | (bits & ((1u << rest) - 1)));
-        ctx->cur = cur;
-        ctx->free_bits = 8 - rest;
-        return 0;
-    }
-
     uint32_t v = value << (32 - n);
     while (n > 0) {
         if (bytes_left(ctx->cur, ctx->last) <= 0) return -1;
@@ -241,5 +232,27 @@ int32_t scmn_bsw_write(scmn_bsw_ctx *ctx, uint32_t value, int32_t n) {
         v = shl(v, k);
         n -= k;
     }
+    return 0;
+}
+
+int32_t scmn_bsw_write(scmn_bsw_ctx *ctx, uint32_t value, int32_t n) {
+    // Away from the end and without a callback: all bits at once, behind those of the current byte.
+    uint8_t *cur = ctx->cur;
+    if (n < 1 || n > 32 || ctx->on_byte || bytes_left(cur, ctx->last) < 5)
+        return write_slowly(ctx, value, n);
+    const int32_t total = 8 - ctx->free_bits + n;  // 1 to 39
+    const uint64_t bits = static_cast<uint64_t>(*cur) << n | (value & 0xFFFFFFFFu >> (32 - n));
+    if (total < 8) {
+        *cur = static_cast<uint8_t>(bits);
+        ctx->free_bits -= n;
+        return 0;
+    }
+    const int32_t whole = total / 8, rest = total % 8;  // 1 to 4, 0 to 7
+    store_bytes(cur, static_cast<uint32_t>(bits >> rest), whole);
+    cur += whole;
+    // The rest pushes up what its byte held before.
+    *cur = static_cast<uint8_t>(*cur << rest | (bits & ((1u << rest) - 1)));
+    ctx->cur = cur;
+    ctx->free_bits = 8 - rest;
     return 0;
 }

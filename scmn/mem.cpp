@@ -47,14 +47,12 @@ void scmn_blk_mcpy(void *dst, const void *src, int32_t dst_stride, int32_t src_s
                      dst_stride, width, height);
 }
 
-// `whole` bytes of the pattern, then a tail of its low byte. Neither needs to be positive.
-static void fill(void *dst, uint32_t value, ptrdiff_t whole, ptrdiff_t tail) {
+// `whole` bytes of the pattern, and a tail of its low byte. Neither needs to be positive. The row comes
+// last, so that nothing has to be kept for afterwards.
+static inline void fill(void *dst, uint32_t value, ptrdiff_t whole, ptrdiff_t tail) {
     uint8_t *p = static_cast<uint8_t *>(dst);
-    if (whole > 0) {
-        simgp::live_rows().fill(p, value, size_t(whole));
-        p += whole;
-    }
-    if (tail > 0) memset(p, uint8_t(value), size_t(tail));
+    if (tail > 0) memset(p + whole, uint8_t(value), size_t(tail));
+    if (whole > 0) simgp::live_rows().fill(p, value, size_t(whole));
 }
 
 static ptrdiff_t whole_blocks(ptrdiff_t count, ptrdiff_t block) {

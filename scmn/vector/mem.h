@@ -19,37 +19,40 @@ namespace simgp::SIMD_TARGET {
 inline constexpr size_t stream_from = size_t(32) << 20;
 
 // From this size on, the string store of x86 processors that call it fast beats vector stores: it
-// takes whole lines without reading them first.
-inline constexpr size_t string_from = 2048;
+// takes whole lines without reading them first. Within the first-level cache, stores of whole lines
+// are as fast.
+inline constexpr size_t string_from = bytes == 64 ? 32768 : 2048;
 
-// `pattern` over `size` bytes at dst, a multiple of `bytes`.
+// The pattern from dst, the start of a cache line, over `size` bytes but for less than a vector at
+// their end. Returns the number of bytes written.
 template <bool String>
-void fill_aligned(uint8_t *dst, uint32_t pattern, size_t size) {
-#if defined(__x86_64__) || defined(__i386__)
-    if (String && size >= string_from && size < stream_from) {
-        size_t words = size / 4;
-        __asm__ volatile("rep stosl" : "+D"(dst), "+c"(words) : "a"(pattern) : "memory");
-        return;
-    }
-#endif
+size_t fill_lines(uint8_t *dst, uint32_t pattern, size_t size) {
     const u8v v = set_u32(pattern);
     size_t x = 0;
     if (size >= stream_from) {
-        for (; x < size; x += bytes) store_stream(dst + x, v);
+        for (; x + bytes <= size; x += bytes) store_stream(dst + x, v);
         stream_end();
-        return;
+        return x;
     }
+#if defined(__x86_64__) || defined(__i386__)
+    if (String && size >= string_from) {
+        size_t words = size / 4;
+        __asm__ volatile("rep stosl" : "+D"(dst), "+c"(words) : "a"(pattern) : "memory");
+        return size & -size_t(4);
+    }
+#endif
     for (; x + 4 * bytes <= size; x += 4 * bytes) {
         store(dst + x, v);
         store(dst + x + bytes, v);
         store(dst + x + 2 * bytes, v);
         store(dst + x + 3 * bytes, v);
     }
-    for (; x < size; x += bytes) store(dst + x, v);
+    for (; x + bytes <= size; x += bytes) store(dst + x, v);
+    return x;
 }
 
-// The first and the last vector lie where the block begins and ends, all between on aligned
-// addresses, where the pattern begins with another byte.
+// Unaligned vectors reach from the start to the first cache line and over the end; between them the
+// pattern begins with another byte.
 template <bool String>
 void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
     if (size < size_t(bytes)) {  // 32 bytes on a machine with wider vectors
@@ -57,13 +60,17 @@ void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
         return;
     }
     const u8v v = set_u32(value);
-    store(dst, v);
-    store(dst + size - bytes, v);
-    const size_t head = -reinterpret_cast<uintptr_t>(dst) & (bytes - 1);
-    if (size <= head + bytes) return;
-    const unsigned turn = head % 4 * 8;
-    const uint32_t turned = turn ? value >> turn | value << (32 - turn) : value;
-    fill_aligned<String>(dst + head, turned, (size - head) & -size_t(bytes));
+    const size_t head = -reinterpret_cast<uintptr_t>(dst) & 63;
+    size_t x = 0;
+    if (size >= 256) {
+        for (; x < head; x += bytes) store(dst + x, v);
+        const unsigned turn = head % 4 * 8;
+        const uint32_t turned = turn ? value >> turn | value << (32 - turn) : value;
+        x = head + fill_lines<String>(dst + head, turned, size - head);
+    } else {
+        for (; x + bytes <= size; x += bytes) store(dst + x, v);
+    }
+    if (x < size) store(dst + size - bytes, v);
 }
 
 void fill_mem(rows &t) {
