@@ -153,16 +153,34 @@ inline u8v natural_to_by4(u8v v) {
     return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 2, 4, 6, 1, 3, 5, 7));
 }
 inline u8v by8_to_natural(u8v v) { return _mm256_permute4x64_epi64(v, 0xD8); }
-inline u8v by8_to_by4(u8v v) {
-    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 2, 6, 1, 5, 3, 7));
-}
 
 struct pair_u8 {
     u8v even, odd;
 };
-inline pair_u8 load_split(const uint8_t *p) {
-    const __m256i a = load(p), b = load(p + bytes);
-    return {_mm256_packus_epi16(even(a), even(b)), _mm256_packus_epi16(odd(a), odd(b))};
+// The 16 bytes at p and those at q.
+inline __m256i load_blocks(const uint8_t *p, const uint8_t *q) {
+    const auto block = [](const uint8_t *at) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(at));
+    };
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(p)), block(q), 1);
+}
+
+// In-block: the even bytes of each block go to its lower half, the odd ones to its upper half; then
+// halves of two vectors meet. What is loaded where decides the order.
+inline pair_u8 split_blocks(__m256i a, __m256i b) {
+    const __m256i split = _mm256_broadcastsi128_si256(
+        _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
+    a = _mm256_shuffle_epi8(a, split);
+    b = _mm256_shuffle_epi8(b, split);
+    return {_mm256_unpacklo_epi64(a, b), _mm256_unpackhi_epi64(a, b)};
+}
+inline pair_u8 load_split(const uint8_t *p) { return split_blocks(load(p), load(p + bytes)); }
+inline pair_u8 load_split_natural(const uint8_t *p) {
+    return split_blocks(load_blocks(p, p + 32), load_blocks(p + 16, p + 48));
+}
+inline pair_u8 load_split_by4(const uint8_t *p) {
+    return split_blocks(_mm256_permute4x64_epi64(load(p), 0xD8),
+                        _mm256_permute4x64_epi64(load(p + bytes), 0xD8));
 }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     v = _mm256_shuffle_epi8(
@@ -204,6 +222,42 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     store(p + 2 * bytes, _mm256_permute2x128_si256(second, third, 0x31));
 }
 
+// Pairs a, b of 8 pixels give two thirds of 16 output bytes, and c the others. c is packed only: the
+// shuffle takes its even pixels from the lower halves of the blocks and its odd ones from the upper.
+struct zip3_index {
+    alignas(32) uint8_t ab[3][32], c[3][32];
+    constexpr zip3_index() : ab(), c() {
+        for (int k = 0; k < 3; k++)
+            for (int i = 0; i < 32; i++) {
+                const int q = 16 * k + i % 16, pixel = q / 3, channel = q % 3;
+                const bool is_c = channel == 2;
+                ab[k][i] = static_cast<uint8_t>(is_c ? 255 : 2 * (pixel - 4 * k) + channel);
+                c[k][i] = static_cast<uint8_t>(is_c ? 8 * (pixel & 1) + pixel / 2 : 255);
+            }
+    }
+};
+inline constexpr zip3_index zip3;
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd) {
+    const __m256i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
+    const __m256i c =
+        _mm256_packus_epi16(_mm256_srai_epi16(c_even, C), _mm256_srai_epi16(c_odd, C));
+    const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
+    const __m256i ab_mid = _mm256_alignr_epi8(ab_hi, ab_lo, 8);
+    const auto part = [=](__m256i ab, int k) {
+        return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(zip3.ab[k])),
+                               _mm256_shuffle_epi8(c, load(zip3.c[k])));
+    };
+    const auto store_blocks = [=](int k, __m256i v) {
+        _mm_storeu_si128(reinterpret_cast<__m128i *>(p + 16 * k), _mm256_castsi256_si128(v));
+        _mm_storeu_si128(reinterpret_cast<__m128i *>(p + 48 + 16 * k),
+                         _mm256_extracti128_si256(v, 1));
+    };
+    store_blocks(0, part(ab_lo, 0));
+    store_blocks(1, part(ab_mid, 1));
+    store_blocks(2, part(ab_hi, 2));
+}
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
     const __m256i cd_lo = _mm256_unpacklo_epi8(c, d), cd_hi = _mm256_unpackhi_epi8(c, d);
@@ -228,14 +282,6 @@ inline void store_high(uint8_t *p, u16v a) {
 struct rgb_v {
     __m256i ac_even, b_even, ac_odd, b_odd;
 };
-
-// The 16 bytes at p and those at q.
-inline __m256i load_blocks(const uint8_t *p, const uint8_t *q) {
-    const auto block = [](const uint8_t *at) {
-        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(at));
-    };
-    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(p)), block(q), 1);
-}
 
 inline rgb_v load_565(const uint8_t *p) {
     const __m256i v0 = load_blocks(p, p + 32), v1 = load_blocks(p + 16, p + 48),

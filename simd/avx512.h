@@ -150,27 +150,47 @@ inline u8v natural_to_by4(u8v v) {
 inline u8v by8_to_natural(u8v v) {
     return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), v);
 }
-inline u8v by8_to_by4(u8v v) {
-    return _mm512_permutexvar_epi32(
-        _mm512_setr_epi32(0, 8, 2, 10, 1, 9, 3, 11, 4, 12, 6, 14, 5, 13, 7, 15), v);
-}
 
 struct pair_u8 {
     u8v even, odd;
 };
+// Each vector is permuted once, so that the parts of the results that it holds stand where these
+// want them, and the parts of two vectors put together.
 inline pair_u8 load_split(const uint8_t *p) {
-    const __m512i a = load(p), b = load(p + bytes);
-    return {_mm512_packus_epi16(even(a), even(b)), _mm512_packus_epi16(odd(a), odd(b))};
+    const __m512i split =
+        _mm512_broadcast_i32x4(_mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
+    const __m512i a = _mm512_shuffle_epi8(load(p), split);
+    const __m512i b = _mm512_shuffle_epi8(load(p + bytes), split);
+    return {_mm512_unpacklo_epi64(a, b), _mm512_unpackhi_epi64(a, b)};
 }
 struct split_index {
-    alignas(64) uint8_t lane[64];
-    constexpr split_index() : lane() {
-        for (int i = 0; i < 64; i++) lane[i] = static_cast<uint8_t>(2 * (i % 32) + i / 32);
+    alignas(64) uint8_t natural[64], by4[64];
+    constexpr split_index() : natural(), by4() {
+        for (int i = 0; i < 32; i++) {
+            natural[i] = static_cast<uint8_t>(2 * i);
+            natural[32 + i] = static_cast<uint8_t>(2 * i + 1);
+            // Granule g of a vector's 32 even bytes goes to block g % 4, and so do the odd ones.
+            const int granule = i / 4, at = 16 * (granule % 4) + 4 * (granule / 4) + i % 4;
+            by4[at] = static_cast<uint8_t>(2 * i);
+            by4[at + 8] = static_cast<uint8_t>(2 * i + 1);
+        }
     }
 };
-inline constexpr split_index even_then_odd;
+inline constexpr split_index split_order;
+inline pair_u8 load_split_natural(const uint8_t *p) {
+    const __m512i order = load(split_order.natural);
+    const __m512i a = _mm512_permutexvar_epi8(order, load(p));
+    const __m512i b = _mm512_permutexvar_epi8(order, load(p + bytes));
+    return {_mm512_shuffle_i64x2(a, b, 0x44), _mm512_shuffle_i64x2(a, b, 0xEE)};
+}
+inline pair_u8 load_split_by4(const uint8_t *p) {
+    const __m512i order = load(split_order.by4);
+    const __m512i a = _mm512_permutexvar_epi8(order, load(p));
+    const __m512i b = _mm512_permutexvar_epi8(order, load(p + bytes));
+    return {_mm512_unpacklo_epi64(a, b), _mm512_unpackhi_epi64(a, b)};
+}
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
-    v = _mm512_permutexvar_epi8(load(even_then_odd.lane), v);
+    v = _mm512_permutexvar_epi8(load(split_order.natural), v);
     _mm256_storeu_si256(reinterpret_cast<__m256i *>(p), _mm512_castsi512_si256(v));
     _mm256_storeu_si256(reinterpret_cast<__m256i *>(q), _mm512_extracti64x4_epi64(v, 1));
 }
@@ -186,19 +206,24 @@ inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
 
 // Byte q of the 192 is byte q / 3 of a, b or c, as q modulo 3 is 0, 1 or 2: one index vector for
 // each output serves all three inputs.
+// Of packed vectors, whose blocks hold 8 even pixels and 8 odd ones, it is the byte of pixel q / 3.
 struct zip3_index {
-    alignas(64) uint8_t lane[3 * 64];
-    constexpr zip3_index() : lane() {
-        for (int q = 0; q < 3 * 64; q++) lane[q] = static_cast<uint8_t>(q / 3);
+    alignas(64) uint8_t natural[3 * 64], packed[3 * 64];
+    constexpr zip3_index() : natural(), packed() {
+        for (int q = 0; q < 3 * 64; q++) {
+            const int pixel = q / 3;
+            natural[q] = static_cast<uint8_t>(pixel);
+            packed[q] = static_cast<uint8_t>(pixel / 16 * 16 + pixel % 2 * 8 + pixel % 16 / 2);
+        }
     }
 };
 inline constexpr zip3_index zip3;
-inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = zip3.natural) {
     constexpr __mmask64 every_third = 0x9249249249249249;  // bits 0, 3, ... 63
     constexpr __mmask64 second[3] = {every_third << 1, every_third, every_third >> 1};
     constexpr __mmask64 third[3] = {every_third << 2, every_third << 1, every_third};
     const auto part = [&](int k) {
-        const __m512i index = load(zip3.lane + 64 * k);
+        const __m512i index = load(places + 64 * k);
         __m512i v = _mm512_permutexvar_epi8(index, a);
         v = _mm512_mask_permutexvar_epi8(v, second[k], index, b);
         v = _mm512_mask_permutexvar_epi8(v, third[k], index, c);
@@ -209,6 +234,16 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     part(2);
 }
 
+template <int N>
+inline __m512i pack(s16v even, s16v odd) {
+    return _mm512_packus_epi16(_mm512_srai_epi16(even, N), _mm512_srai_epi16(odd, N));
+}
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd) {
+    store_zip3(p, pack<A>(a_even, a_odd), pack<B>(b_even, b_odd), pack<C>(c_even, c_odd),
+               zip3.packed);
+}
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const __m512i ab_lo = _mm512_unpacklo_epi8(a, b), ab_hi = _mm512_unpackhi_epi8(a, b);
     const __m512i cd_lo = _mm512_unpacklo_epi8(c, d), cd_hi = _mm512_unpackhi_epi8(c, d);

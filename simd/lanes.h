@@ -257,19 +257,30 @@ inline u8v by8_to_natural(u8v v) {
         return v.lane[granule % blocks * 16 + granule / blocks * 8 + i % 8];
     });
 }
-inline u8v by8_to_by4(u8v v) { return natural_to_by4(by8_to_natural(v)); }
 
-// 2 bytes bytes, split: byte 2i and 2i + 1 of memory are byte i of even and odd, in by8 order.
+// 2 bytes bytes, split: byte 2i and 2i + 1 of memory are byte i of even and odd. load_split gives
+// by8 order, the others that of their names.
 struct pair_u8 {
     u8v even, odd;
 };
+inline pair_u8 load_split_natural(const uint8_t *p) {
+    return {make<u8v>([&](int i) { return p[2 * i]; }),
+            make<u8v>([&](int i) { return p[2 * i + 1]; })};
+}
 inline pair_u8 load_split(const uint8_t *p) {
-    return {natural_to_by8(make<u8v>([&](int i) { return p[2 * i]; })),
-            natural_to_by8(make<u8v>([&](int i) { return p[2 * i + 1]; }))};
+    const pair_u8 v = load_split_natural(p);
+    return {natural_to_by8(v.even), natural_to_by8(v.odd)};
+}
+inline pair_u8 load_split_by4(const uint8_t *p) {
+    const pair_u8 v = load_split_natural(p);
+    return {natural_to_by4(v.even), natural_to_by4(v.odd)};
 }
 // The even bytes of v at p, the odd ones at q.
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
-    for (int i = 0; i < bytes; i++) (i & 1 ? q : p)[i / 2] = v.lane[i];
+    for (int i = 0; i < bytes / 2; i++) {
+        p[i] = v.lane[2 * i];
+        q[i] = v.lane[2 * i + 1];
+    }
 }
 
 // Stores of 2, 3 and 4 vectors: the bytes of two vectors in by8 order, in turn; the words of the
@@ -292,6 +303,13 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
         p[3 * i + 1] = b.lane[i];
         p[3 * i + 2] = c.lane[i];
     }
+}
+// store_zip3 of three pairs, each through narrow_join with its own shift.
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd) {
+    store_zip3(p, narrow_join<A>(a_even, a_odd), narrow_join<B>(b_even, b_odd),
+               narrow_join<C>(c_even, c_odd));
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const u8v v[4] = {a, b, c, d};

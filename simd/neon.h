@@ -142,7 +142,6 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
 inline u8v natural_to_by8(u8v v) { return v; }
 inline u8v natural_to_by4(u8v v) { return v; }
 inline u8v by8_to_natural(u8v v) { return v; }
-inline u8v by8_to_by4(u8v v) { return v; }
 
 struct pair_u8 {
     u8v even, odd;
@@ -156,6 +155,8 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     vst1_u8(p, split.val[0]);
     vst1_u8(q, split.val[1]);
 }
+inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
+inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) { vst2q_u8(p, uint8x16x2_t{{even, odd}}); }
 inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
@@ -164,6 +165,12 @@ inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
     vst1q_u8(p + bytes, as_u8(zip.val[1]));
 }
 inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) { vst3q_u8(p, uint8x16x3_t{{a, b, c}}); }
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd) {
+    store_zip3(p, narrow_join<A>(a_even, a_odd), narrow_join<B>(b_even, b_odd),
+               narrow_join<C>(c_even, c_odd));
+}
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     vst4q_u8(p, uint8x16x4_t{{a, b, c, d}});
 }

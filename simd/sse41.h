@@ -141,20 +141,23 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
 inline u8v natural_to_by8(u8v v) { return v; }
 inline u8v natural_to_by4(u8v v) { return v; }
 inline u8v by8_to_natural(u8v v) { return v; }
-inline u8v by8_to_by4(u8v v) { return v; }
 
 struct pair_u8 {
     u8v even, odd;
 };
 inline pair_u8 load_split(const uint8_t *p) {
-    const __m128i a = load(p), b = load(p + bytes);
-    return {_mm_packus_epi16(even(a), even(b)), _mm_packus_epi16(odd(a), odd(b))};
+    const __m128i split = _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15);
+    const __m128i a = _mm_shuffle_epi8(load(p), split),
+                  b = _mm_shuffle_epi8(load(p + bytes), split);
+    return {_mm_unpacklo_epi64(a, b), _mm_unpackhi_epi64(a, b)};
 }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     v = _mm_shuffle_epi8(v, _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
     _mm_storel_epi64(reinterpret_cast<__m128i *>(p), v);
-    _mm_storeh_pd(reinterpret_cast<double *>(q), _mm_castsi128_pd(v));
+    _mm_storel_epi64(reinterpret_cast<__m128i *>(q), _mm_srli_si128(v, 8));
 }
+inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
+inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm_unpacklo_epi8(even, odd));
@@ -182,6 +185,36 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     store(p + 2 * bytes, blend(c, a, b));
 }
 
+// Pairs a, b of 8 pixels give two thirds of 16 output bytes, and c the others. c is packed only: the
+// shuffle takes its even pixels from the lower halves of the blocks and its odd ones from the upper.
+struct zip3_index {
+    alignas(16) uint8_t ab[3][16], c[3][16];
+    constexpr zip3_index() : ab(), c() {
+        for (int k = 0; k < 3; k++)
+            for (int i = 0; i < 16; i++) {
+                const int q = 16 * k + i % 16, pixel = q / 3, channel = q % 3;
+                const bool is_c = channel == 2;
+                ab[k][i] = static_cast<uint8_t>(is_c ? 255 : 2 * (pixel - 4 * k) + channel);
+                c[k][i] = static_cast<uint8_t>(is_c ? 8 * (pixel & 1) + pixel / 2 : 255);
+            }
+    }
+};
+inline constexpr zip3_index zip3;
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd) {
+    const __m128i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
+    const __m128i c = _mm_packus_epi16(_mm_srai_epi16(c_even, C), _mm_srai_epi16(c_odd, C));
+    const __m128i ab_lo = _mm_unpacklo_epi8(a, b), ab_hi = _mm_unpackhi_epi8(a, b);
+    const __m128i ab_mid = _mm_alignr_epi8(ab_hi, ab_lo, 8);
+    const auto part = [=](__m128i ab, int k) {
+        return _mm_or_si128(_mm_shuffle_epi8(ab, load(zip3.ab[k])),
+                            _mm_shuffle_epi8(c, load(zip3.c[k])));
+    };
+    store(p, part(ab_lo, 0));
+    store(p + 16, part(ab_mid, 1));
+    store(p + 32, part(ab_hi, 2));
+}
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const __m128i ab_lo = _mm_unpacklo_epi8(a, b), ab_hi = _mm_unpackhi_epi8(a, b);
     const __m128i cd_lo = _mm_unpacklo_epi8(c, d), cd_hi = _mm_unpackhi_epi8(c, d);

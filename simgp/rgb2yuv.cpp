@@ -107,13 +107,10 @@ void convert_to_yuv(const csc_args &a, rgb_packing packing, const yuv_planes &pl
     }
 }
 
-void convert_to_rgb565(const csc_args &a, rgb_packing packing) {
-    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
-    if (width < 1) return;
-    rgb_to_rgb_row *const row = live_rows().rgb_to_rgb565[size_t(packing)];
-    const plane_lines in = whole_pixel_lines(src_lines(a, 0), packing);
-    const plane_lines out = whole_pixel_lines(dst_lines(a, 0), rgb_packing::rgb565);
-    for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), width);
+void convert_to_rgb565(const csc_args &a, rgb_packing packing, int pixel_bytes) {
+    walk_one_plane(a, whole_pixel_lines(src_lines(a, 0), packing), pixel_bytes,
+                   whole_pixel_lines(dst_lines(a, 0), rgb_packing::rgb565), 2,
+                   live_rows().rgb_to_rgb565[size_t(packing)]);
 }
 
 }  // namespace
@@ -123,7 +120,7 @@ using namespace simgp;
 
 // clang-format off
 #define KERNEL(from, to)    SIMGP_CSC_KERNEL(simgp_csc_##from##_to_##to, convert_to_yuv(args, rgb_packing::from, planes_##to))
-#define RGB565_KERNEL(from) SIMGP_CSC_KERNEL(simgp_csc_##from##_to_rgb565, convert_to_rgb565(args, rgb_packing::from))
+#define RGB565_KERNEL(from, pixel_bytes) SIMGP_CSC_KERNEL(simgp_csc_##from##_to_rgb565, convert_to_rgb565(args, rgb_packing::from, pixel_bytes))
 
 KERNEL(rgb888, yuv420)
 KERNEL(rgb888, yv12)
@@ -135,6 +132,6 @@ KERNEL(rgb565, yuv420)
 KERNEL(rgb565, yv12)
 KERNEL(rgb565, nv12)
 KERNEL(rgb565, nv21)
-RGB565_KERNEL(rgb888)
-RGB565_KERNEL(rgba8888)
+RGB565_KERNEL(rgb888, 3)
+RGB565_KERNEL(rgba8888, 4)
 // clang-format on

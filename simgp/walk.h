@@ -46,8 +46,6 @@ inline constexpr yuv_planes planes_yuv422w{yuv_layout::full, 1, 2, true};
 inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, false};
 inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, true};
 inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, true};
-inline constexpr yuv_planes planes_uyvy{yuv_layout::uyvy, -1, -1, false};
-inline constexpr yuv_planes planes_yuyv{yuv_layout::yuyv, -1, -1, false};
 
 // Four kernels let row 0 of an odd-height picture have the first chroma line to itself, unless the
 // width is a multiple of 4: row y then takes line (y + 1) >> 1.
@@ -93,6 +91,18 @@ void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes, c
         walk_yuv_to_rgb(a, luma, planes, live.yuv_to_rgb_pair[from][to], lead);
     else
         walk_yuv_to_rgb(a, luma, planes, live.yuv_to_rgb[from][to]);
+}
+
+// Calls row(in, out, width) for every row of a picture of one plane on either side, whose pixels
+// have so many bytes. Lines of an even width that lie end to end are one long row.
+template <class Row>
+void walk_one_plane(const csc_args &a, const plane_lines &in, int in_bytes, const plane_lines &out,
+                    int out_bytes, Row row) {
+    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
+    if (width < 1 || height < 1) return;
+    if (width % 2 == 0 && in.stride == width * in_bytes && out.stride == width * out_bytes)
+        return row(in.first, out.first, width * height);
+    for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), width);
 }
 
 }  // namespace simgp

@@ -2,6 +2,7 @@
 
 #include <signal.h>
 
+#include <algorithm>
 #include <cstring>
 
 #include "simd/areas.h"
@@ -380,7 +381,7 @@ bool check_job(const std::string &name, int width, int height, flush where, cons
         size_t i = 0;
         for (const plane &p : src.parts)
             for (ptrdiff_t y = 0; y < p.shape().rows; y++, i++)
-                if (memcmp(before[i].data(), p.row(y), before[i].size()) != 0)
+                if (!std::equal(before[i].begin(), before[i].end(), p.row(y)))
                     fault = "the source was written";
         if (fault.empty() && !defines) fault = difference(expected, got);
         if (fault.empty()) continue;

@@ -46,9 +46,9 @@ void unpack_pairs(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
     in_steps(
         pairs,
         [&](ptrdiff_t i) {
-            const pair_u8 v = load_split(src + 2 * i);
-            store(a + i, by8_to_natural(v.even));
-            store(b + i, by8_to_natural(v.odd));
+            const pair_u8 v = load_split_natural(src + 2 * i);
+            store(a + i, v.even);
+            store(b + i, v.odd);
         },
         [&](ptrdiff_t i) { store_split(a + i, b + i, load(src + 2 * i)); },
         [&](ptrdiff_t i) {

@@ -12,18 +12,12 @@ namespace simgp::SIMD_TARGET {
 
 enum class pixel_order { natural, by8, by4 };
 
-// Brings samples from natural order, or from by8, into the order of a packer.
+// Brings samples from natural order into the order of a packer.
 template <pixel_order Order>
 inline u8v arrange(u8v v) {
     return Order == pixel_order::by8   ? natural_to_by8(v)
            : Order == pixel_order::by4 ? natural_to_by4(v)
                                        : v;
-}
-template <pixel_order Order>
-inline u8v arrange_by8(u8v v) {
-    return Order == pixel_order::by8   ? v
-           : Order == pixel_order::by4 ? by8_to_by4(v)
-                                       : by8_to_natural(v);
 }
 
 template <rgb_packing>
@@ -57,8 +51,10 @@ struct packer_888 {
     static constexpr pixel_order order = pixel_order::natural;
     static constexpr int size = 3;
     static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
-        const rgb_u8 p = narrow(even, odd);
-        store_zip3(dst, BGR ? p.b : p.r, p.g, BGR ? p.r : p.b);
+        if constexpr (BGR)
+            store_narrow_zip3<6, 7, 7>(dst, even.b6, odd.b6, even.g, odd.g, even.r, odd.r);
+        else
+            store_narrow_zip3<7, 7, 6>(dst, even.r, odd.r, even.g, odd.g, even.b6, odd.b6);
     }
 };
 template <>

@@ -96,9 +96,11 @@ struct source_packed {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        const pair_u8 p = load_split(s.y + 2 * x);
-        return {arrange_by8<Order>(LUMA_FIRST ? p.even : p.odd),
-                arrange_by8<Order>(LUMA_FIRST ? p.odd : p.even)};
+        const uint8_t *const at = s.y + 2 * x;
+        const pair_u8 p = Order == pixel_order::by8   ? load_split(at)
+                          : Order == pixel_order::by4 ? load_split_by4(at)
+                                                      : load_split_natural(at);
+        return {LUMA_FIRST ? p.even : p.odd, LUMA_FIRST ? p.odd : p.even};
     }
     // A last group of one pixel gets the V of the group before.
     static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {

@@ -42,9 +42,9 @@ void detile_unpack(const uint8_t *tile, uint8_t *a, ptrdiff_t stride_a, uint8_t 
             store_split(a + r * stride_a, b + r * stride_b, load(from));
         } else {
             for (ptrdiff_t i = 0; i < tile_row / 2; i += bytes) {
-                const pair_u8 v = load_split(from + 2 * i);
-                store(a + r * stride_a + i, by8_to_natural(v.even));
-                store(b + r * stride_b + i, by8_to_natural(v.odd));
+                const pair_u8 v = load_split_natural(from + 2 * i);
+                store(a + r * stride_a + i, v.even);
+                store(b + r * stride_b + i, v.odd);
             }
         }
     }

@@ -41,6 +41,8 @@ static const operation operations[] = {
     MEMORY("load_split", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("store_split", bytes, store_split(out, out + bytes / 2, u8(in, 0))),
     MEMORY("store_split, anywhere", bytes + 1, { out[bytes / 2] = 0; store_split(out + bytes / 2 + 1, out, u8(in, 0)); }),
+    MEMORY("load_split_natural", 2 * bytes, const pair_u8 v = load_split_natural(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("load_split_by4", 2 * bytes, const pair_u8 v = load_split_by4(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("set_u8", bytes, put(out, set_u8(in[-1]))),
     MEMORY("set_u16", bytes, put(out, set_u16(uint16_t(in[-1] << 8 | in[-2])))),
     MEMORY("set_u32", bytes, put(out, set_u32(uint32_t(in[-1]) << 24 | in[-2] << 16 | in[-3] << 8 | in[-4]))),
@@ -62,6 +64,8 @@ static const operation operations[] = {
     VECTOR("shl 11", u16, shl<11>(a)),
     VECTOR("shr 1", u16, shr<1>(a)),
     VECTOR("shr 13", u16, shr<13>(a)),
+    VECTOR("sar 1", s16, sar<1>(a)),
+    VECTOR("sar 15", s16, sar<15>(a)),
 
     VECTOR("add", s16, add(a, b)),
     VECTOR("add_sat", s16, add_sat(a, b)),
@@ -97,7 +101,6 @@ static const operation operations[] = {
     VECTOR("natural_to_by8", u8, natural_to_by8(a)),
     VECTOR("natural_to_by4", u8, natural_to_by4(a)),
     VECTOR("by8_to_natural", u8, by8_to_natural(a)),
-    VECTOR("by8_to_by4", u8, by8_to_by4(a)),
     VECTOR("join_high", u16, join_high(a, b)),
     MEMORY("store_high", bytes / 2, store_high(out, u16(in, 0))),
     MEMORY("load_565, dot_high", bytes, put(out, dot_high<66, 129, 25, 16>(load_565(in - 2 * bytes)))),
@@ -112,6 +115,7 @@ static const operation operations[] = {
     MEMORY("store_zip8", 2 * bytes, store_zip8(out, u8(in, 0), u8(in, 1))),
     MEMORY("store_zip16", 2 * bytes, store_zip16(out, u16(in, 0), u16(in, 1))),
     MEMORY("store_zip3", 3 * bytes, store_zip3(out, u8(in, 0), u8(in, 1), u8(in, 2))),
+    MEMORY("store_narrow_zip3", 3 * bytes, store_narrow_zip3<7, 6, 5>(out, s16(in, 0), s16(in, 1), s16(in, 2), s16(in, 3), s16(in, 4), s16(in, 5))),
     MEMORY("store_zip4", 4 * bytes, store_zip4(out, u8(in, 0), u8(in, 1), u8(in, 2), u8(in, 3))),
 };
 // clang-format on
