@@ -14,14 +14,17 @@ SIMGP_BEGIN_DECLS
  *
  * media_type is a video code of tags.h. What decides, bytes in memory order:
  *
- *   SCMN_MT_H264     first slice after a start code 00 00 01 (ITU-T H.264 Annex B), by the low five
- * bits of the byte behind it: 5, a slice of an IDR picture, gives 1; 1, any other slice, gives 0;
- * parameter sets, SEI, delimiters and the rest are passed over SCMN_MT_MPEG4    first VOP start
- * code 00 00 01 B6: the top two bits of the next byte are 00 (I-VOP) SCMN_MT_H263     first picture
- * start code 00 00 80 .. 83: the picture coding type in PTYPE, or in and 111          PLUSPTYPE
- * where that is present, is intra (ITU-T H.263, 5.1) SCMN_MT_WMV1,    the top two bits of the first
- * byte are 00 SCMN_MT_DIV3 SCMN_MT_WMV2     the top bit of the first byte is 0 others never a key
- * frame, SCMN_MT_WMV3 included
+ *   SCMN_MT_H264    the first slice behind a start code 00 00 01 (ITU-T H.264 Annex B), by the low
+ *                   five bits of the byte behind it: 5, a slice of an IDR picture, gives 1; 1, any
+ *                   other slice, gives 0; parameter sets, SEI, delimiters and the rest are passed over
+ *   SCMN_MT_MPEG4   the first VOP start code 00 00 01 B6: the top two bits of the next byte are 00
+ *                   (I-VOP)
+ *   SCMN_MT_H263    the first picture start code 00 00 80 .. 83: the picture coding type in PTYPE, or
+ *   and 111         in PLUSPTYPE where that is present, is intra (ITU-T H.263, 5.1)
+ *   SCMN_MT_WMV1,   the top two bits of the first byte are 00
+ *   SCMN_MT_DIV3
+ *   SCMN_MT_WMV2    the top bit of the first byte is 0
+ *   others          never a key frame, SCMN_MT_WMV3 included
  *
  * Only bytes of the buffer are read, from front to back up to the deciding one.
  *

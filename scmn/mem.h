@@ -40,9 +40,9 @@ SIMGP_API void scmn_blk_mcpy(void *dst, const void *src, int32_t dst_stride, int
  * Repeat the four bytes of `value`, lowest byte first, from dst on, in whole blocks:
  *
  *   function           bytes of whole blocks               tail
- *   scmn_mset_x128     128 x max(1, ceil(count / 128))     none: may write up to 127 bytes past
- * count scmn_mset_x64      128 x floor(count / 128)            none: the last count % 128 bytes
- * stay scmn_mset_x64a     64 x floor(count / 64)              the other count % 64 bytes
+ *   scmn_mset_x128     128 x max(1, ceil(count / 128))     none: writes past count, to a whole block
+ *   scmn_mset_x64      128 x floor(count / 128)            none: the last count % 128 bytes stay
+ *   scmn_mset_x64a     64 x floor(count / 64)              the other count % 64 bytes
  *   scmn_mset_x32      32 x floor(count / 32)              none: the last count % 32 bytes stay
  *   scmn_mset_x32ax4   32 x floor(count / 32)              the other count % 32 bytes
  *
@@ -63,8 +63,7 @@ SIMGP_API void scmn_mclr_x64(void *dst, int32_t count);
 /* Logarithms --------------------------------------------------------------------------------------
  *
  * Floor and ceiling of the base-2 logarithm: of 1 it is 0, of 5 it is 2 and 3, of 0xFFFFFFFF it is
- * 31 and
- * 32. Both give -1 for 0. */
+ * 31 and 32. Both give -1 for 0. */
 SIMGP_API int32_t scmn_floor_log2(uint32_t x);
 SIMGP_API int32_t scmn_ceil_log2(uint32_t x);
 

@@ -25,8 +25,11 @@ inline void in_steps(ptrdiff_t pairs, Whole whole, Half half, One one) {
         whole(i);
         whole(i + bytes);
     }
-    if (i + bytes <= pairs) whole(i);
-    whole(pairs - bytes);
+    if (i + bytes <= pairs) {
+        whole(i);
+        i += bytes;
+    }
+    if (i < pairs) whole(pairs - bytes);
 }
 
 void pack_pairs(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs) {
