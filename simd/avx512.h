@@ -312,9 +312,10 @@ inline rgb_v load_channels(const uint8_t *p) {
         return _mm512_maskz_permutexvar_epi8(channels_only, load(order), load(p + at));
     };
     const uint8_t *order = channels<Size, 0>.lane;
+    const uint8_t *last_order = channels<Size, 48 * Size - last>.lane;
     const __m512i v0 = sixteen(0, order), v1 = sixteen(16 * Size, order),
                   v2 = sixteen(32 * Size, order);
-    const __m512i v3 = sixteen(last, channels<Size, 48 * Size - last>.lane);
+    const __m512i v3 = sixteen(last, last_order);
     const __m512i ac01 = _mm512_shuffle_i32x4(v0, v1, 0x44),
                   ac23 = _mm512_shuffle_i32x4(v2, v3, 0x44);
     const __m512i b01 = _mm512_shuffle_i32x4(v0, v1, 0xEE),
