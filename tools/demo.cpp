@@ -144,7 +144,7 @@ void demo(const std::string &directory, const SourceOptions &options) {
     const std::vector<Tile> rgb = every_rgb(frames);
     save(folder + "every-rgb-format.png", rgb, int(rgb.size() / frames.size()));
     std::printf("%severy-rgb-format.png: %s in every RGB format\n", folder.c_str(),
-                source->name().c_str());
+                wanted.path == "-" ? "the video" : source->name().c_str());
     save(folder + "every-yuv-to-rgb.png", every_pair(), 6);
     std::printf("%severy-yuv-to-rgb.png: the test card through every YUV to RGB conversion\n",
                 folder.c_str());

@@ -22,6 +22,8 @@ command -v ffmpeg >/dev/null || {
     echo "demo: '$file' is neither Y4M nor PNG; install ffmpeg to show it" >&2
     exit 1
 }
-# The first 41 frames are enough; one that is empty says why by itself.
+# Says what is wrong with the file, if something is.
+ffmpeg -v error -nostdin -i "$file" -frames:v 1 -an -f null - || exit 1
+# The demonstration takes no more than 41 frames.
 ffmpeg -v error -nostdin -i "$file" -frames:v 41 -an -f yuv4mpegpipe -pix_fmt yuv420p - |
     "$convert" --demo "$folder" -
