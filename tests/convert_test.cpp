@@ -150,6 +150,11 @@ TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
     EXPECT_EQ(fs::file_size(at("yuv420128x64.yuv420")), 3u * 128 * 64 * 3 / 2);
     EXPECT_EQ(fs::file_size(at("uyvy97x51.uyvy")), 3u * 97 * 2 * 51);
     EXPECT_EQ(fs::file_size(at("nv2197x51.nv21")), 3u * (97 * 51 + 49 * 2 * 26));
+    // The last pixel of an odd line has no V of its own.
+    good("uyvy97x51.uyvy --size 97x51 -n 1 --to yuv444 -o last.y4m");
+    good("last.y4m -o last.png -q");
+    const Picture last = png("last.png");
+    for (int c = 0; c < 3; ++c) EXPECT_LE(*last.sample(c, 96, 0), 8);
     // 97 x 51: one pair of tile rows of one group; chroma of 25 rows: one single tile row.
     EXPECT_EQ(fs::file_size(at("t64x3297x51.t64x32")), 3u * (8192 + 8192));
 }

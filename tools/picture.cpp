@@ -198,34 +198,19 @@ simgp_img Picture::descriptor(bool even_width, bool even_height) {
     return img;
 }
 
-void Picture::pad() {
-    if (format().kind == Kind::tiled) return;
-    if (format().kind == Kind::packed && width() % 2) {
-        // The last group has its U; of V and the second Y the group before is the best guess.
-        for (int y = 0; y < height(); ++y) {
-            *sample(2, width(), y) = width() > 1 ? *sample(2, width() - 2, y) : uint8_t{128};
-            *sample(0, width(), y) = *sample(0, width() - 1, y);
-        }
-    }
-    for (int k = 0; k < planes(); ++k) {
-        const PlaneShape &p = format().planes[k];
-        const size_t visible = row_bytes_[k], whole = size_t(stride_[k]);
-        if (whole > visible && format().kind != Kind::packed)
-            for (int y = 0; y < rows_[k]; ++y)
-                std::memcpy(row(k, y) + visible, row(k, y) + visible - p.bytes, whole - visible);
-        if (shifted_up(even(height()), p.y_shift) > rows_[k])
-            std::memcpy(row(k, rows_[k]), row(k, rows_[k] - 1), whole);
-    }
-}
-
 void move_samples(const Picture &src, Picture &dst) {
+    // The V of a last half group lies outside the row: that of the group before serves, as everywhere
+    // in the library.
+    const bool half_group = src.format().kind == Kind::packed && src.width() % 2 == 1;
     for (int c = 0; c < 3; ++c) {
         const Channel &to = dst.format().channel[c];
         if (to.step == 0) continue;
         const bool known = src.format().channel[c].step != 0;
         for (int y = 0; y < dst.height(); y += 1 << to.y_shift)
-            for (int x = 0; x < dst.width(); x += 1 << to.x_shift)
-                *dst.sample(c, x, y) = known ? *src.sample(c, x, y) : uint8_t{128};
+            for (int x = 0; x < dst.width(); x += 1 << to.x_shift) {
+                const int from = half_group && c == 2 && x == src.width() - 1 ? x - 2 : x;
+                *dst.sample(c, x, y) = known && from >= 0 ? *src.sample(c, from, y) : uint8_t{128};
+            }
     }
 }
 

@@ -82,10 +82,8 @@ class Picture {
     size_t raw_bytes() const;
 
     /// The library's descriptor. `even_width` and `even_height` round the size up to even numbers;
-    /// the added column and line hold something only after pad().
+    /// nobody looks at what the added column and line hold.
     simgp_img descriptor(bool even_width = false, bool even_height = false);
-    /// Repeats the last column and the last line into the allocated ones beyond the picture.
-    void pad();
 
     /// Sample `channel` (Y, U, V or R, G, B) of pixel (x, y); for the kinds planar, packed and rgb.
     uint8_t *sample(int channel, int x, int y) {

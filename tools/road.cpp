@@ -48,16 +48,15 @@ int step_cost(const Format &from, const Format &to, Via via) {
 /// begin a tile row of its own, it lies in the last one.
 bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
 
-/// Converts one picture. Where the source has an odd size, it is taken as if its last column and
-/// line stood there twice, so that each chroma sample of the destination gets a value; conversions
-/// from YUV to RGB have their own rules for that, which are kept.
+/// Converts one picture. The library may leave out the chroma of a last odd column or line; given the
+/// next even size it does not, and as chroma is never averaged, nothing of what is added shows.
+/// Conversions from YUV to RGB have their own rules for odd sizes, which are kept.
 void convert(Via via, Picture &src, Picture &dst) {
     const Format &from = src.format(), &to = dst.format();
     if (via == Via::samples) return move_samples(src, dst);
     const bool even_width = !to.is_rgb(), tiled = from.kind == Kind::tiled;
     const bool even_height =
         even_width && ((!tiled && to.kind != Kind::tiled) || tiles_hold_last_chroma(src.height()));
-    if (even_width) src.pad();
     const simgp_img in = src.descriptor(even_width, even_height), out = dst.descriptor();
     const int32_t result = call(via, in, out);
     if (result != SIMGP_OK)
