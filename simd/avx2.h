@@ -222,8 +222,8 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     store(p + 2 * bytes, _mm256_permute2x128_si256(second, third, 0x31));
 }
 
-// Pairs a, b of 8 pixels give two thirds of 16 output bytes, and c the others. c is packed only: the
-// shuffle takes its even pixels from the lower halves of the blocks and its odd ones from the upper.
+// Pairs a, b of 8 pixels give two thirds of 16 output bytes, and c the others. c is packed only:
+// the shuffle takes its even pixels from the lower half of the block, its odd ones from the upper.
 struct zip3_index {
     alignas(32) uint8_t ab[3][32], c[3][32];
     constexpr zip3_index() : ab(), c() {
@@ -298,35 +298,30 @@ inline rgb_v load_565(const uint8_t *p) {
     return {ac(even), b(even), ac(odd), b(odd)};
 }
 
-// Puts the bytes of four pixels of Size bytes, the first of which is at place `first` of a block,
-// in order: words ac of pixels 0 and 2, of 1 and 3, words b likewise.
-template <int Size>
+// Puts the bytes of four pixels, the first of which is at place `first` of a block, in order: words
+// ac of pixels 0 and 2, of 1 and 3, words b likewise.
 inline __m256i channel_order(int first) {
     const auto at = [=](int pixel, int channel) {
-        return static_cast<char>(first + Size * pixel + channel);
+        return static_cast<char>(first + 3 * pixel + channel);
     };
     return _mm256_broadcastsi128_si256(
         _mm_setr_epi8(at(0, 0), at(0, 2), at(2, 0), at(2, 2), at(1, 0), at(1, 2), at(3, 0),
                       at(3, 2), at(0, 1), -1, at(2, 1), -1, at(1, 1), -1, at(3, 1), -1));
 }
-// Four times four pixels of each block of the result, transposed in units of two words. Every load
-// takes 16 bytes; of three-byte pixels the last begins early, to end with the pixels.
-template <int Size>
-inline rgb_v load_channels(const uint8_t *p) {
-    constexpr int last = 16 * Size - 16;
+// Four times four pixels in each block, transposed in units of two words. Every load takes 16
+// bytes; the last begins early, to end with the pixels.
+inline rgb_v load_888(const uint8_t *p) {
     const auto four = [&](ptrdiff_t at, __m256i order) {
-        return _mm256_shuffle_epi8(load_blocks(p + at, p + at + 16 * Size), order);
+        return _mm256_shuffle_epi8(load_blocks(p + at, p + at + 48), order);
     };
-    const __m256i order = channel_order<Size>(0);
-    const __m256i v0 = four(0, order), v1 = four(4 * Size, order), v2 = four(8 * Size, order);
-    const __m256i v3 = four(last, channel_order<Size>(12 * Size - last));
+    const __m256i order = channel_order(0);
+    const __m256i v0 = four(0, order), v1 = four(12, order), v2 = four(24, order);
+    const __m256i v3 = four(32, channel_order(4));
     const __m256i ac01 = _mm256_unpacklo_epi32(v0, v1), ac23 = _mm256_unpacklo_epi32(v2, v3);
     const __m256i b01 = _mm256_unpackhi_epi32(v0, v1), b23 = _mm256_unpackhi_epi32(v2, v3);
     return {_mm256_unpacklo_epi64(ac01, ac23), _mm256_unpacklo_epi64(b01, b23),
             _mm256_unpackhi_epi64(ac01, ac23), _mm256_unpackhi_epi64(b01, b23)};
 }
-inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
-inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
 
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
@@ -346,15 +341,38 @@ inline u16v even_dot(rgb_v v) {
     return _mm256_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 
-inline __m256i pack565(__m256i ac, __m256i b) {
-    const __m256i hi =
-        _mm256_and_si256(_mm256_slli_epi16(ac, 8), _mm256_set1_epi16(static_cast<int16_t>(0xF800)));
-    const __m256i mid = _mm256_slli_epi16(_mm256_and_si256(b, _mm256_set1_epi16(0xFC)), 3);
-    return _mm256_or_si256(_mm256_or_si256(hi, mid), _mm256_srli_epi16(ac, 11));
+// Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels
+// lose their low bits, 32 c0 + c1 and c2 are made from bytes, and 64 times the first plus the
+// second is 8 times the word.
+inline __m256i words_565(__m256i v) {
+    v = _mm256_and_si256(v, _mm256_set1_epi32(0x00F8FCF8));
+    v = _mm256_maddubs_epi16(v, _mm256_set1_epi32(1 << 16 | 1 << 8 | 32));
+    return _mm256_srli_epi32(_mm256_madd_epi16(v, _mm256_set1_epi32(1 << 16 | 64)), 3);
 }
-inline void store_565(uint8_t *p, rgb_v v) {
-    store_zip16(p, natural_to_by8(pack565(v.ac_even, v.b_even)),
-                natural_to_by8(pack565(v.ac_odd, v.b_odd)));
+// Eight pixels each of a, b, c and d: four of the first block and four of the second; those of a
+// and b, and of c and d, follow each other.
+inline void store_565(uint8_t *p, __m256i a, __m256i b, __m256i c, __m256i d) {
+    store(p, _mm256_packus_epi32(words_565(a), words_565(b)));
+    store(p + bytes, _mm256_packus_epi32(words_565(c), words_565(d)));
+}
+inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
+    store_565(p, load_blocks(q, q + 32), load_blocks(q + 16, q + 48), load_blocks(q + 64, q + 96),
+              load_blocks(q + 80, q + 112));
+}
+inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
+    // The last block begins early, to end with the pixels.
+    const auto order = [](int first) {
+        const auto z = [=](int i) { return static_cast<char>(first + i); };
+        return _mm_setr_epi8(z(0), z(1), z(2), -1, z(3), z(4), z(5), -1, z(6), z(7), z(8), -1, z(9),
+                             z(10), z(11), -1);
+    };
+    const __m256i all = _mm256_broadcastsi128_si256(order(0)),
+                  last = _mm256_inserti128_si256(all, order(4), 1);
+    const auto eight = [](const uint8_t *a, const uint8_t *b, __m256i o) {
+        return _mm256_shuffle_epi8(load_blocks(a, b), o);
+    };
+    store_565(p, eight(q, q + 24, all), eight(q + 12, q + 36, all), eight(q + 48, q + 72, all),
+              eight(q + 60, q + 80, last));
 }
 
 }  // namespace simgp::avx2

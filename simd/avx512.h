@@ -285,37 +285,33 @@ inline rgb_v load_565(const uint8_t *p) {
     return {ac(even), b(even), ac(odd), b(odd)};
 }
 
-// Where the bytes of 16 pixels of Size bytes go, the first of which is at place First of a vector:
-// a block each for words ac of the even and of the odd pixels and for words b.
-template <int Size, int First>
+// Where the bytes of 16 pixels go, the first of which is at place First of a vector: a block each
+// for words ac of the even and of the odd pixels and for words b.
+template <int First>
 struct channel_order {
     alignas(64) uint8_t lane[64];
     constexpr channel_order() : lane() {
         for (int i = 0; i < 16; i++) {
-            const int pixel = First + Size * i, word = 16 * (i & 1) + (i & ~1);
+            const int pixel = First + 3 * i, word = 16 * (i & 1) + (i & ~1);
             lane[word] = static_cast<uint8_t>(pixel);
             lane[word + 1] = static_cast<uint8_t>(pixel + 2);
             lane[word + 32] = static_cast<uint8_t>(pixel + 1);
         }
     }
 };
-template <int Size, int First>
-inline constexpr channel_order<Size, First> channels;
+template <int First>
+inline constexpr channel_order<First> channels;
 
-// Four times 16 pixels, transposed in blocks. Every load takes 64 bytes; of three-byte pixels the
-// last begins early, to end with the pixels.
-template <int Size>
-inline rgb_v load_channels(const uint8_t *p) {
-    constexpr int last = 64 * Size - 64;
+// Four times 16 pixels, transposed in blocks. Every load takes 64 bytes; the last begins early, to
+// end with the pixels.
+inline rgb_v load_888(const uint8_t *p) {
     constexpr __mmask64 channels_only = 0x55555555FFFFFFFF;  // zeros the high bytes of words b
     const auto sixteen = [&](ptrdiff_t at, const uint8_t *order) {
         return _mm512_maskz_permutexvar_epi8(channels_only, load(order), load(p + at));
     };
-    const uint8_t *order = channels<Size, 0>.lane;
-    const uint8_t *last_order = channels<Size, 48 * Size - last>.lane;
-    const __m512i v0 = sixteen(0, order), v1 = sixteen(16 * Size, order),
-                  v2 = sixteen(32 * Size, order);
-    const __m512i v3 = sixteen(last, last_order);
+    const uint8_t *order = channels<0>.lane, *last_order = channels<16>.lane;
+    const __m512i v0 = sixteen(0, order), v1 = sixteen(48, order), v2 = sixteen(96, order);
+    const __m512i v3 = sixteen(128, last_order);
     const __m512i ac01 = _mm512_shuffle_i32x4(v0, v1, 0x44),
                   ac23 = _mm512_shuffle_i32x4(v2, v3, 0x44);
     const __m512i b01 = _mm512_shuffle_i32x4(v0, v1, 0xEE),
@@ -323,8 +319,6 @@ inline rgb_v load_channels(const uint8_t *p) {
     return {_mm512_shuffle_i32x4(ac01, ac23, 0x88), _mm512_shuffle_i32x4(b01, b23, 0x88),
             _mm512_shuffle_i32x4(ac01, ac23, 0xDD), _mm512_shuffle_i32x4(b01, b23, 0xDD)};
 }
-inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
-inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
 
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
@@ -344,17 +338,39 @@ inline u16v even_dot(rgb_v v) {
     return _mm512_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 
-inline __m512i pack565(__m512i ac, __m512i b) {
-    constexpr int select = 0xCA;  // first ? second : third, bit by bit
-    const __m512i upper =
-        _mm512_ternarylogic_epi32(_mm512_set1_epi16(static_cast<int16_t>(0xF800)),
-                                  _mm512_slli_epi16(ac, 8), _mm512_slli_epi16(b, 3), select);
-    return _mm512_ternarylogic_epi32(_mm512_set1_epi16(static_cast<int16_t>(0xFFE0)), upper,
-                                     _mm512_srli_epi16(ac, 11), select);
+// Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels
+// lose their low bits, 32 c0 + c1 and c2 are made from bytes, and 64 times the first plus the
+// second is 8 times the word.
+inline __m512i words_565(__m512i v) {
+    v = _mm512_and_si512(v, _mm512_set1_epi32(0x00F8FCF8));
+    v = _mm512_maddubs_epi16(v, _mm512_set1_epi32(1 << 16 | 1 << 8 | 32));
+    return _mm512_srli_epi32(_mm512_madd_epi16(v, _mm512_set1_epi32(1 << 16 | 64)), 3);
 }
-inline void store_565(uint8_t *p, rgb_v v) {
-    store_zip16(p, natural_to_by8(pack565(v.ac_even, v.b_even)),
-                natural_to_by8(pack565(v.ac_odd, v.b_odd)));
+inline void store_565(uint8_t *p, __m512i a, __m512i b) {
+    store(p, by8_to_natural(_mm512_packus_epi32(words_565(a), words_565(b))));
+}
+inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
+    store_565(p, load(q), load(q + 64));
+    store_565(p + bytes, load(q + 128), load(q + 192));
+}
+// Where the bytes of 16 pixels go that begin at place First of a vector.
+template <int First>
+struct spread_order {
+    alignas(64) uint8_t lane[64];
+    constexpr spread_order() : lane() {
+        for (int i = 0; i < 64; i++)
+            lane[i] = static_cast<uint8_t>((First + i / 4 * 3 + i % 4) & 63);
+    }
+};
+template <int First>
+inline constexpr spread_order<First> spread;
+inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
+    const auto sixteen = [&](int at, const uint8_t *order) {
+        return _mm512_permutexvar_epi8(load(order), load(q + at));
+    };
+    const uint8_t *order = spread<0>.lane, *last_order = spread<16>.lane;
+    store_565(p, sixteen(0, order), sixteen(48, order));
+    store_565(p + bytes, sixteen(96, order), sixteen(128, last_order));
 }
 
 }  // namespace simgp::avx512

@@ -328,7 +328,7 @@ inline void store_high(uint8_t *p, u16v a) {
 
 // `bytes` pixels of three channels, in the order of memory; how they are held is the header's own
 // business. Words of 5, 6 and 5 bits are widened by shifting alone, and the first channel is the
-// one in the highest bits. Of four bytes the last is dropped.
+// one in the highest bits.
 struct rgb_v {
     u8v c[3];
 };
@@ -338,13 +338,10 @@ inline rgb_v load_565(const uint8_t *p) {
             make<u8v>([&](int i) { return word(i) >> 3 & 0xFC; }),
             make<u8v>([&](int i) { return word(i) << 3 & 0xF8; })};
 }
-template <int Size>
-inline rgb_v load_channels(const uint8_t *p) {
-    const auto channel = [&](int k) { return make<u8v>([&](int i) { return p[Size * i + k]; }); };
+inline rgb_v load_888(const uint8_t *p) {
+    const auto channel = [&](int k) { return make<u8v>([&](int i) { return p[3 * i + k]; }); };
     return {channel(0), channel(1), channel(2)};
 }
-inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
-inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
 
 // ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, their sum is at
 // most 256, and A + C <= 127.
@@ -362,14 +359,18 @@ inline u16v even_dot(rgb_v v) {
         return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
     });
 }
-// The words of 5, 6 and 5 bits, the low bits of each channel dropped; 2 bytes bytes.
-inline void store_565(uint8_t *p, rgb_v v) {
-    for (int i = 0; i < bytes; i++) {
-        const int word = v.c[0].lane[i] >> 3 << 11 | v.c[1].lane[i] >> 2 << 5 | v.c[2].lane[i] >> 3;
-        p[2 * i] = static_cast<uint8_t>(word);
-        p[2 * i + 1] = static_cast<uint8_t>(word >> 8);
+// `bytes` pixels of 3 or 4 bytes at q become words of 5, 6 and 5 bits at p, the first channel in
+// the highest bits; the low bits of each channel are dropped, and so is the fourth byte.
+template <int Size>
+inline void repack_to_565(uint8_t *p, const uint8_t *q) {
+    for (int i = 0; i < bytes; i++, p += 2, q += Size) {
+        const int word = q[0] >> 3 << 11 | q[1] >> 2 << 5 | q[2] >> 3;
+        p[0] = static_cast<uint8_t>(word);
+        p[1] = static_cast<uint8_t>(word >> 8);
     }
 }
+inline void repack_888_to_565(uint8_t *p, const uint8_t *q) { repack_to_565<3>(p, q); }
+inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) { repack_to_565<4>(p, q); }
 
 }  // namespace simgp::SIMD_LANES_NAMESPACE
 

@@ -188,10 +188,6 @@ inline rgb_v load_565(const uint8_t *p) {
         {vandq_u8(high, vdupq_n_u8(0xF8)), vandq_u8(mid, vdupq_n_u8(0xFC)), vshlq_n_u8(low, 3)}};
 }
 inline rgb_v load_888(const uint8_t *p) { return vld3q_u8(p); }
-inline rgb_v load_8888(const uint8_t *p) {
-    const uint8x16x4_t v = vld4q_u8(p);
-    return {{v.val[0], v.val[1], v.val[2]}};
-}
 
 template <int K>
 inline u16v add_product(u16v sum, uint8x8_t x) {
@@ -218,9 +214,17 @@ inline u16v even_dot(rgb_v v) {
     sum = add_product<B>(sum, evens(v.val[1]));
     return add_product<C>(sum, evens(v.val[2]));
 }
-inline void store_565(uint8_t *p, rgb_v v) {
-    const u8v low = vsriq_n_u8(vshlq_n_u8(v.val[1], 3), v.val[2], 3);
-    vst2q_u8(p, uint8x16x2_t{{low, vsriq_n_u8(v.val[0], v.val[1], 5)}});
+inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
+    const u8v low = vsriq_n_u8(vshlq_n_u8(b, 3), c, 3);
+    vst2q_u8(p, uint8x16x2_t{{low, vsriq_n_u8(a, b, 5)}});
+}
+inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
+    const uint8x16x3_t v = vld3q_u8(q);
+    store_565(p, v.val[0], v.val[1], v.val[2]);
+}
+inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
+    const uint8x16x4_t v = vld4q_u8(q);
+    store_565(p, v.val[0], v.val[1], v.val[2]);
 }
 
 }  // namespace simgp::neon

@@ -185,8 +185,8 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     store(p + 2 * bytes, blend(c, a, b));
 }
 
-// Pairs a, b of 8 pixels give two thirds of 16 output bytes, and c the others. c is packed only: the
-// shuffle takes its even pixels from the lower halves of the blocks and its odd ones from the upper.
+// Pairs a, b of 8 pixels give two thirds of 16 output bytes, and c the others. c is packed only:
+// the shuffle takes its even pixels from the lower half of the block, its odd ones from the upper.
 struct zip3_index {
     alignas(16) uint8_t ab[3][16], c[3][16];
     constexpr zip3_index() : ab(), c() {
@@ -253,34 +253,29 @@ inline rgb_v load_565(const uint8_t *p) {
     return {ac(even), b(even), ac(odd), b(odd)};
 }
 
-// Puts the bytes of four pixels of Size bytes, the first of which is at place `first` of a block,
-// in order: words ac of pixels 0 and 2, of 1 and 3, words b likewise.
-template <int Size>
+// Puts the bytes of four pixels, the first of which is at place `first` of a block, in order: words
+// ac of pixels 0 and 2, of 1 and 3, words b likewise.
 inline __m128i channel_order(int first) {
     const auto at = [=](int pixel, int channel) {
-        return static_cast<char>(first + Size * pixel + channel);
+        return static_cast<char>(first + 3 * pixel + channel);
     };
     return _mm_setr_epi8(at(0, 0), at(0, 2), at(2, 0), at(2, 2), at(1, 0), at(1, 2), at(3, 0),
                          at(3, 2), at(0, 1), -1, at(2, 1), -1, at(1, 1), -1, at(3, 1), -1);
 }
-// Four times four pixels of each block, transposed in units of two words. Every load takes 16
-// bytes; of three-byte pixels the last begins early, to end with the pixels.
-template <int Size>
-inline rgb_v load_channels(const uint8_t *p) {
-    constexpr int last = 16 * Size - 16;
+// Four times four pixels, transposed in units of two words. Every load takes 16 bytes; the last
+// begins early, to end with the pixels.
+inline rgb_v load_888(const uint8_t *p) {
     const auto four = [&](ptrdiff_t at, __m128i order) {
         return _mm_shuffle_epi8(load(p + at), order);
     };
-    const __m128i order = channel_order<Size>(0);
-    const __m128i v0 = four(0, order), v1 = four(4 * Size, order), v2 = four(8 * Size, order);
-    const __m128i v3 = four(last, channel_order<Size>(12 * Size - last));
+    const __m128i order = channel_order(0);
+    const __m128i v0 = four(0, order), v1 = four(12, order), v2 = four(24, order);
+    const __m128i v3 = four(32, channel_order(4));
     const __m128i ac01 = _mm_unpacklo_epi32(v0, v1), ac23 = _mm_unpacklo_epi32(v2, v3);
     const __m128i b01 = _mm_unpackhi_epi32(v0, v1), b23 = _mm_unpackhi_epi32(v2, v3);
     return {_mm_unpacklo_epi64(ac01, ac23), _mm_unpacklo_epi64(b01, b23),
             _mm_unpackhi_epi64(ac01, ac23), _mm_unpackhi_epi64(b01, b23)};
 }
-inline rgb_v load_888(const uint8_t *p) { return load_channels<3>(p); }
-inline rgb_v load_8888(const uint8_t *p) { return load_channels<4>(p); }
 
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
@@ -300,14 +295,30 @@ inline u16v even_dot(rgb_v v) {
     return _mm_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 
-inline __m128i pack565(__m128i ac, __m128i b) {
-    const __m128i hi =
-        _mm_and_si128(_mm_slli_epi16(ac, 8), _mm_set1_epi16(static_cast<int16_t>(0xF800)));
-    const __m128i mid = _mm_slli_epi16(_mm_and_si128(b, _mm_set1_epi16(0xFC)), 3);
-    return _mm_or_si128(_mm_or_si128(hi, mid), _mm_srli_epi16(ac, 11));
+// Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels
+// lose their low bits, 32 c0 + c1 and c2 are made from bytes, and 64 times the first plus the
+// second is 8 times the word.
+inline __m128i words_565(__m128i v) {
+    v = _mm_and_si128(v, _mm_set1_epi32(0x00F8FCF8));
+    v = _mm_maddubs_epi16(v, _mm_set1_epi32(1 << 16 | 1 << 8 | 32));
+    return _mm_srli_epi32(_mm_madd_epi16(v, _mm_set1_epi32(1 << 16 | 64)), 3);
 }
-inline void store_565(uint8_t *p, rgb_v v) {
-    store_zip16(p, pack565(v.ac_even, v.b_even), pack565(v.ac_odd, v.b_odd));
+// Four pixels each of a, b, c and d.
+inline void store_565(uint8_t *p, __m128i a, __m128i b, __m128i c, __m128i d) {
+    store(p, _mm_packus_epi32(words_565(a), words_565(b)));
+    store(p + bytes, _mm_packus_epi32(words_565(c), words_565(d)));
+}
+inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
+    store_565(p, load(q), load(q + 16), load(q + 32), load(q + 48));
+}
+inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
+    const auto four = [&](int at, int first) {
+        const auto z = [=](int i) { return static_cast<char>(first + i); };
+        return _mm_shuffle_epi8(
+            load(q + at), _mm_setr_epi8(z(0), z(1), z(2), -1, z(3), z(4), z(5), -1, z(6), z(7),
+                                        z(8), -1, z(9), z(10), z(11), -1));
+    };
+    store_565(p, four(0, 0), four(12, 0), four(24, 0), four(32, 4));
 }
 
 }  // namespace simgp::sse41

@@ -32,11 +32,6 @@ template <>
 struct unpacker<rgb_packing::rgb888> : unpacker_888<false> {};
 template <>
 struct unpacker<rgb_packing::bgr888> : unpacker_888<true> {};
-template <>
-struct unpacker<rgb_packing::rgba8888> {
-    static constexpr int size = 4;
-    static rgb_v load(const uint8_t *p) { return load_8888(p); }
-};
 
 // BT.601, limited range, of pixels whose first channel is red, or blue.
 template <bool BLUE_FIRST>
@@ -99,16 +94,20 @@ struct rgb_to_yuv_step {
 
 template <rgb_packing Packing>
 struct rgb_to_rgb565_step {
-    using from = unpacker<Packing>;
     static constexpr bool pixels_in_pairs = false;
+    static constexpr bool four_bytes = Packing == rgb_packing::rgba8888;
+    static constexpr int size = four_bytes ? 4 : 3;
 
-    static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + from::size * x; }
+    static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + size * x; }
     static void convert(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
-        store_565(out + 2 * x, from::load(pixels));
+        if constexpr (four_bytes)
+            repack_8888_to_565(out + 2 * x, pixels);
+        else
+            repack_888_to_565(out + 2 * x, pixels);
     }
     static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
-        uint8_t pixels[bytes * from::size] = {}, words[2 * bytes];
-        memcpy(pixels, in + from::size * x, size_t(count) * from::size);
+        uint8_t pixels[bytes * size] = {}, words[2 * bytes];
+        memcpy(pixels, in + size * x, size_t(count) * size);
         convert(words, 0, pixels);
         memcpy(out + 2 * x, words, 2 * size_t(count));
     }
