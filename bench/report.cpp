@@ -101,48 +101,70 @@ void print_summary(const std::vector<line> &lines) {
     printf("\n");
 }
 
+namespace {
+
+// Lines of operations that were measured at the same sizes, for one target.
+struct block {
+    std::vector<std::string> sizes;
+    std::vector<std::vector<line>> operations;  // the lines of each, by size
+};
+
+std::vector<block> blocks_of(const std::vector<line> &lines, const std::string &target) {
+    std::vector<block> blocks;
+    for (const std::string &name : distinct(lines, &line::name)) {
+        std::vector<line> own;
+        for (const line &l : lines)
+            if (l.name == name && l.target_name == target) own.push_back(l);
+        const std::vector<std::string> sizes = distinct(own, &line::size);
+        const auto same = std::find_if(blocks.begin(), blocks.end(),
+                                       [&](const block &b) { return b.sizes == sizes; });
+        if (same == blocks.end())
+            blocks.push_back({sizes, {own}});
+        else
+            same->operations.push_back(own);
+    }
+    return blocks;
+}
+
+// A quotient, in bold if it falls short of its goal.
+std::string cell(double goal, const quartiles &got, int digits) {
+    return format(falls_short(goal, got) ? "**%s**" : "%s",
+                  got.middle ? number(got.middle, digits).c_str() : "-");
+}
+
+void write_row(FILE *file, const std::vector<line> &lines) {
+    std::string peer_goal, peers, scalar, limit, twin;
+    for (const line &l : lines) {
+        if (peer_goal.empty()) peer_goal = number(l.goals.peer, 1);
+        peers.append(" ").append(cell(l.goals.peer, l.peer, 2)).append(" |");
+        scalar.append(scalar.empty() ? "" : " / ").append(cell(l.goals.scalar, l.scalar, 1));
+        limit.append(limit.empty() ? "" : " / ").append(cell(l.goals.limit, l.limit, 2));
+        if (l.twin.middle) {
+            twin.append(twin.empty() ? "" : " / ").append(cell(l.twin_goal, l.twin, 2));
+            twin.append(" ").append(l.twin_name);
+        }
+    }
+    fprintf(file, "| %s | %s | %s |%s %s | %s | %s |\n", lines[0].name.c_str(),
+            lines[0].best_peer.c_str(), peer_goal.c_str(), peers.c_str(), scalar.c_str(),
+            limit.c_str(), twin.c_str());
+}
+
+}  // namespace
+
 void write_markdown(const std::string &path, const std::vector<line> &lines) {
     FILE *file = fopen(path.c_str(), "w");
     if (!file) fail("cannot write " + path);
-    const std::vector<std::string> sizes = distinct(lines, &line::size);
-    const std::vector<std::string> operations = distinct(lines, &line::name);
-
     for (const std::string &target : distinct(lines, &line::target_name)) {
-        fprintf(file, "### %s\n\n| operation | best peer | goal |", target.c_str());
-        for (const std::string &s : sizes) fprintf(file, " %s |", s.c_str());
-        fprintf(file, " x scalar | x limit | x twin |\n|---|---|---|");
-        for (size_t i = 0; i < sizes.size() + 3; i++) fprintf(file, "---:|");
-        fprintf(file, "\n");
-
-        for (const std::string &name : operations) {
-            std::string peer, peer_goal, peers, scalar, limit, twin;
-            const auto cell = [](double goal, const quartiles &got, int digits) {
-                return format(falls_short(goal, got) ? "**%s**" : "%s",
-                              got.middle ? number(got.middle, digits).c_str() : "-");
-            };
-            for (const std::string &size : sizes) {
-                const auto l = std::find_if(lines.begin(), lines.end(), [&](const line &x) {
-                    return x.name == name && x.size == size && x.target_name == target;
-                });
-                if (l == lines.end()) {
-                    peers += "  |";
-                    continue;
-                }
-                if (peer.empty()) peer = l->best_peer;
-                if (peer_goal.empty()) peer_goal = number(l->goals.peer, 1);
-                peers.append(" ").append(cell(l->goals.peer, l->peer, 2)).append(" |");
-                const auto add = [&](std::string &to, double goal, const quartiles &got,
-                                     int digits) {
-                    to.append(to.empty() ? "" : " / ").append(cell(goal, got, digits));
-                };
-                add(scalar, l->goals.scalar, l->scalar, 1);
-                add(limit, l->goals.limit, l->limit, 2);
-                if (l->twin.middle) add(twin, l->twin_goal, l->twin, 2), twin += " " + l->twin_name;
-            }
-            fprintf(file, "| %s | %s | %s |%s %s | %s | %s |\n", name.c_str(), peer.c_str(),
-                    peer_goal.c_str(), peers.c_str(), scalar.c_str(), limit.c_str(), twin.c_str());
+        fprintf(file, "### %s\n\n", target.c_str());
+        for (const block &b : blocks_of(lines, target)) {
+            fprintf(file, "| operation | best peer | goal |");
+            for (const std::string &s : b.sizes) fprintf(file, " %s |", s.c_str());
+            fprintf(file, " x scalar | x limit | x twin |\n|---|---|---|");
+            for (size_t i = 0; i < b.sizes.size() + 3; i++) fprintf(file, "---:|");
+            fprintf(file, "\n");
+            for (const std::vector<line> &operation : b.operations) write_row(file, operation);
+            fprintf(file, "\n");
         }
-        fprintf(file, "\n");
     }
     if (fclose(file)) fail("cannot write " + path);
 }
