@@ -1,4 +1,6 @@
 // Packed YUV to RGB: every kernel against its scalar rows, and against the planar kernels.
+#include <string.h>
+
 #include "simgp/simgp.h"
 #include "tests/rig.h"
 
@@ -29,26 +31,32 @@ TEST(packed2rgb, vector_rows_equal_scalar_rows) {
     for (const kernel &k : kernels) rig::check_csc(k.name, k.run, k.from, k.to);
 }
 
-// One row, unpacked by hand, must give what the planar kernel gives. Of an odd width the last
-// chroma pair is the last U with the V before it, or 128.
+// Rows, unpacked by hand, must give what the planar kernel gives. Of an odd width the last chroma
+// pair is the last U with the V before it, or 128. The rows lie end to end, which must not make one
+// row of them where the width is odd.
 TEST(packed2rgb, packed_rows_equal_planar_rows) {
     rig::rng random(rig::seed());
     for (const kernel &k : kernels)
         for (int width = 1; width <= 150; width += 1 + random.below(3)) {
             SCOPED_TRACE(testing::Message() << k.name << ", width " << width);
-            rig::picture src(rig::shapes_of(k.from, width, 1));
+            rig::picture src(rig::shapes_of(k.from, width, 2));
             src.fill(rig::content::random, random);
-            rig::picture planar(rig::shapes_of(SIMGP_FMT_YUV420, width, 1));
-            const int first_luma = k.from == SIMGP_FMT_UYVY, first_chroma = !first_luma;
-            for (int x = 0; x < width; x++) planar.row(0, 0)[x] = src.row(0, 0)[2 * x + first_luma];
-            for (int i = 0; i < (width + 1) / 2; i++) {
-                const uint8_t *u = src.row(0, 0) + 4 * i + first_chroma;
-                planar.row(1, 0)[i] = *u;
-                planar.row(2, 0)[i] = 2 * i + 1 < width ? u[2] : i ? u[-2] : 128;
-            }
-            const auto shapes = rig::shapes_of(k.to, width, 1);
+            rig::picture planar(rig::shapes_of(SIMGP_FMT_YUV420, width, 1)),
+                row(rig::shapes_of(k.to, width, 1));
+            const auto shapes = rig::shapes_of(k.to, width, 2);
             rig::picture expected(shapes), got(shapes);
-            rig::call(k.planar, planar, expected);
+            const int first_luma = k.from == SIMGP_FMT_UYVY, first_chroma = !first_luma;
+            for (int y = 0; y < 2; y++) {
+                const uint8_t *const in = src.row(0, y);
+                for (int x = 0; x < width; x++) planar.row(0, 0)[x] = in[2 * x + first_luma];
+                for (int i = 0; i < (width + 1) / 2; i++) {
+                    const uint8_t *u = in + 4 * i + first_chroma;
+                    planar.row(1, 0)[i] = *u;
+                    planar.row(2, 0)[i] = 2 * i + 1 < width ? u[2] : i ? u[-2] : 128;
+                }
+                rig::call(k.planar, planar, row);
+                memcpy(expected.row(0, y), row.row(0, 0), size_t(shapes[0].row_bytes));
+            }
             rig::for_each_target([&](const rig::target_rows &) {
                 got.fill_pattern(0);
                 rig::call(k.run, src, got);
