@@ -11,8 +11,6 @@ namespace {
 // The tiles of a plane in the order of memory
 // ---------------------------------------------------------------
 
-constexpr int empty = -1;
-
 class tile_map {
   public:
     tile_map(int width, int rows) : columns_((width + 63) / 64) {
