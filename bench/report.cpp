@@ -135,7 +135,7 @@ std::string cell(double goal, const quartiles &got, int digits) {
 void write_row(FILE *file, const std::vector<line> &lines) {
     std::string peer_goal, peers, scalar, limit, twin;
     for (const line &l : lines) {
-        if (peer_goal.empty()) peer_goal = number(l.goals.peer, 1);
+        if (peer_goal.empty()) peer_goal = l.goals.peer ? format("%g", l.goals.peer) : "";
         peers.append(" ").append(cell(l.goals.peer, l.peer, 2)).append(" |");
         scalar.append(scalar.empty() ? "" : " / ").append(cell(l.goals.scalar, l.scalar, 1));
         limit.append(limit.empty() ? "" : " / ").append(cell(l.goals.limit, l.limit, 2));
