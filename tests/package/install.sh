@@ -13,7 +13,7 @@ user=$source_dir/tests/package/user
 backward=$(grep -rIlF -e "$source_dir" -e "$build_dir" "$prefix")
 [ -z "$backward" ] || fault "Installed files name the source or build folder:" "$backward"
 
-"$cmake" -S "$user" -B "$scratch/user" -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_FIND_ROOT_PATH="$prefix" \
+"$cmake" -G "$generator" -S "$user" -B "$scratch/user" -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_FIND_ROOT_PATH="$prefix" \
     ${toolchain:+-DCMAKE_TOOLCHAIN_FILE="$toolchain"} -DCMAKE_C_COMPILER="$cc" >"$scratch/log" 2>&1 &&
     "$cmake" --build "$scratch/user" >>"$scratch/log" 2>&1 || {
     cat "$scratch/log"

@@ -3,7 +3,7 @@
 . "$(dirname "$0")/gate.sh" "$1"
 
 launcher=$(sed -n 's/^CMAKE_CXX_COMPILER_LAUNCHER:[A-Z]*=//p' "$build_dir/CMakeCache.txt")
-"$cmake" -S "$source_dir/tests/package/superproject" -B "$scratch/build" -DSIMGP_SOURCE="$source_dir" \
+"$cmake" -G "$generator" -S "$source_dir/tests/package/superproject" -B "$scratch/build" -DSIMGP_SOURCE="$source_dir" \
     -DCMAKE_BUILD_TYPE=Debug -DCMAKE_C_COMPILER="$cc" -DCMAKE_CXX_COMPILER="$cxx" \
     ${launcher:+-DCMAKE_C_COMPILER_LAUNCHER="$launcher" -DCMAKE_CXX_COMPILER_LAUNCHER="$launcher"} \
     >"$scratch/log" 2>&1 && "$cmake" --build "$scratch/build" --parallel 2 >>"$scratch/log" 2>&1 || {
