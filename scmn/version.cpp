@@ -6,8 +6,11 @@
 #define SCMN_BUILD_TIME __TIME__
 #endif
 
+// Kept in one piece, where a compiler would make immediate operands of it: the stamp of a binary can then be
+// read without running it.
+[[gnu::used]] static constexpr char text[] = SCMN_BUILD_DATE " " SCMN_BUILD_TIME "\n";
+
 const char *scmn_version(void) {
-    static constexpr char text[] = SCMN_BUILD_DATE " " SCMN_BUILD_TIME "\n";
     static char buffer[64];
     // Any number of threads may write the same text here at once.
     for (unsigned i = 0; i < sizeof text; i++)
