@@ -14,7 +14,7 @@
 #include <numeric>
 #include <random>
 
-#include "simd/choose.h"
+#include "rows/choose.h"
 
 namespace bench {
 

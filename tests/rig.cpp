@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "simd/areas.h"
+#include "areas.h"
 #include "simgp/simgp.h"
 
 #if defined(__SANITIZE_ADDRESS__)
@@ -21,7 +21,7 @@
 
 // The vector rows over plain lanes, compiled for the tests alone.
 namespace simgp::lanes {
-#define DECLARE(family, area) void fill_##area(rows &);
+#define DECLARE(area) void fill_##area(area##_rows &);
 SIMGP_AREAS(DECLARE)
 #undef DECLARE
 }  // namespace simgp::lanes
@@ -308,9 +308,9 @@ std::string difference(const picture &expected, const picture &got) {
 
 const std::vector<target_rows> &all_targets() {
     using simgp::target;
-    static const simgp::rows lanes = [] {
-        simgp::rows table = simgp::rows_of(target::scalar);
-#define FILL(family, area) simgp::lanes::fill_##area(table);
+    static const simgp::row_table lanes = [] {
+        simgp::row_table table = simgp::rows_of(target::scalar);
+#define FILL(area) simgp::lanes::fill_##area(table.area);
         SIMGP_AREAS(FILL)
 #undef FILL
         return table;

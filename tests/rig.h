@@ -17,7 +17,7 @@
 #include <string>
 #include <vector>
 
-#include "simd/choose.h"
+#include "rows/choose.h"
 #include "simgp/img.h"
 #include "tests/guard.h"
 
@@ -134,7 +134,7 @@ std::string difference(const picture &expected, const picture &got);
 
 struct target_rows {
     const char *name;
-    const simgp::rows *rows;
+    const simgp::row_table *rows;
 };
 // Scalar first; then `lanes`, the vector rows compiled over plain lanes; then every target that the
 // processor offers.

@@ -4,7 +4,7 @@
 
 #include <string.h>
 
-#include "simgp/rows.h"
+#include "rows/mem.h"
 
 #if defined(__x86_64__) || defined(__i386__)
 #include <cpuid.h>
@@ -25,7 +25,7 @@ inline constexpr size_t string_from = bytes == 64 ? 32768 : 2048;
 // The pattern from dst, the start of a cache line, over `size` bytes but for less than a vector at
 // their end. Returns the number of bytes written.
 template <bool String>
-size_t fill_lines(uint8_t *dst, uint32_t pattern, size_t size) {
+static size_t fill_lines(uint8_t *dst, uint32_t pattern, size_t size) {
     const u8v v = set_u32(pattern);
     size_t x = 0;
     if (size >= stream_from) {
@@ -53,7 +53,7 @@ size_t fill_lines(uint8_t *dst, uint32_t pattern, size_t size) {
 // Unaligned vectors reach from the start to the first cache line and over the end; between them the
 // pattern begins with another byte.
 template <bool String>
-void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
+static void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
     if (size < size_t(bytes)) {  // 32 bytes on a machine with wider vectors
         for (size_t x = 0; x < size; x += 4) memcpy(dst + x, &value, 4);
         return;
@@ -72,7 +72,7 @@ void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
     if (x < size) store(dst + size - bytes, v);
 }
 
-void fill_mem(rows &t) {
+void fill_mem(mem_rows &t) {
     t.fill = fill_pattern<false>;
 #if defined(__x86_64__) || defined(__i386__)
     unsigned a, b, c, d;

@@ -1,4 +1,4 @@
-// A row as a sequence of vector steps, right to the last pixel.
+// Rows as sequences of vector steps, right to the last pixel.
 #ifndef SIMGP_VECTOR_STEPS_H
 #define SIMGP_VECTOR_STEPS_H
 
@@ -35,6 +35,30 @@ inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
         pixels = ahead;
     }
     if (whole < width) Step::part(in, out, whole, 1);
+}
+
+// Moves `pairs` >= 1 pairs in steps of a vector: whole(i) does `bytes` of them from pair i on,
+// half(i) half as many, one(i) one. The last step ends at the last pair and may do some again.
+template <class Whole, class Half, class One>
+inline void in_pair_steps(ptrdiff_t pairs, Whole whole, Half half, One one) {
+    if (pairs < bytes / 2) {
+        for (ptrdiff_t i = 0; i < pairs; i++) one(i);
+        return;
+    }
+    if (pairs < bytes) {
+        half(0);
+        return half(pairs - bytes / 2);
+    }
+    ptrdiff_t i = 0;
+    for (; i + 2 * bytes <= pairs; i += 2 * bytes) {
+        whole(i);
+        whole(i + bytes);
+    }
+    if (i + bytes <= pairs) {
+        whole(i);
+        i += bytes;
+    }
+    if (i < pairs) whole(pairs - bytes);
 }
 
 }  // namespace simgp::SIMD_TARGET

@@ -2,7 +2,7 @@
 #ifndef SIMGP_VECTOR_YUV2RGB_H
 #define SIMGP_VECTOR_YUV2RGB_H
 
-#include "simgp/rows.h"
+#include "rows/yuv2rgb.h"
 #include "simgp/vector/matrix.h"
 #include "simgp/vector/packer.h"
 #include "simgp/vector/source.h"
@@ -113,29 +113,35 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
 };
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
-void yuv_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
+static void to_rgb_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                       ptrdiff_t width) {
     row_of_steps<yuv_step<Layout, Matrix, Packing>>(samples{y, u, v}, dst, width);
 }
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
-void yuv_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
-                  uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
+static void to_rgb_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
+                            const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
     row_of_steps<pair_step<yuv_step<Layout, Matrix, Packing>>>(samples_pair{{y0, u, v}, y1},
                                                                out_pair{dst0, dst1}, width);
 }
 
-void fill_yuv2rgb(rows &t) {
-#define FILL(layout, packing)                                     \
-    t.yuv_to_rgb_slot(yuv_layout::layout, rgb_packing::packing) = \
-        yuv_row<yuv_layout::layout, bt601, rgb_packing::packing>;
-    SIMGP_YUV_TO_RGB_ROWS(FILL)
+template <yuv_layout Layout, bool TwoRows, rgb_packing Packing, yuv_matrix Matrix>
+static void fill_slot(yuv2rgb_rows &t) {
+    using matrix = matrix_named<Matrix>;
+    constexpr size_t m = size_t(Matrix), l = size_t(Layout), p = size_t(Packing);
+    if constexpr (TwoRows)
+        t.pair[m][l][p] = to_rgb_row_pair<Layout, matrix, Packing>;
+    else
+        t.row[m][l][p] = to_rgb_row<Layout, matrix, Packing>;
+}
+
+void fill_yuv2rgb(yuv2rgb_rows &t) {
+#define FILL(name, from, to, rule)                                                       \
+    fill_slot<formats::from.layout, serves_two_rows(formats::from), formats::to.packing, \
+              matrix_of(yuv_rule::rule)>(t);
+    SIMGP_YUV_TO_RGB_KERNELS(FILL)
+    SIMGP_PACKED_TO_RGB_KERNELS(FILL)
 #undef FILL
-#define FILL(layout, packing)                                          \
-    t.yuv_to_rgb_pair_slot(yuv_layout::layout, rgb_packing::packing) = \
-        yuv_row_pair<yuv_layout::layout, bt601, rgb_packing::packing>;
-    SIMGP_YUV_TO_RGB_PAIRS(FILL)
-#undef FILL
-    t.vu_to_rgb565_coarse_pair = yuv_row_pair<yuv_layout::vu, bt601_coarse, rgb_packing::rgb565>;
 }
 
 }  // namespace simgp::SIMD_TARGET

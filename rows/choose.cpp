@@ -1,11 +1,11 @@
-// The choice of the instruction set, made once and nowhere else.
-#include "simd/choose.h"
+// The choice of the instruction set: the one place that looks at the processor.
+#include "rows/choose.h"
 
-#include <pthread.h>
+#include <sched.h>
 
 #include <atomic>
 
-#include "simd/areas.h"
+#include "areas.h"  // SIMGP_AREAS, made by the build from its list
 
 #if defined(__x86_64__) || defined(__i386__)
 #include <cpuid.h>
@@ -16,7 +16,7 @@
 namespace simgp {
 
 // clang-format off
-#define DECLARE(family, area) void fill_##area(rows &);
+#define DECLARE(area) void fill_##area(area##_rows &);
 namespace scalar { SIMGP_AREAS(DECLARE) }
 namespace neon   { SIMGP_AREAS(DECLARE) }
 namespace sse41  { SIMGP_AREAS(DECLARE) }
@@ -76,25 +76,24 @@ cpu detect() { return {}; }
 
 #endif
 
-rows tables[size_t(target::count)];
+row_table tables[size_t(target::count)];
 bool available[size_t(target::count)];
 target best = target::scalar;
-pthread_once_t once = PTHREAD_ONCE_INIT;
-std::atomic<const rows *> live;
+std::atomic<const row_table *> live;
 
-void offer(target t, void (*const *fills)(rows &), size_t count) {
-    rows &table = tables[size_t(t)] = tables[size_t(target::scalar)];
-    for (size_t i = 0; i < count; i++) fills[i](table);
+// The rows of a target take the place of the scalar ones.
+row_table &add_table(target t) {
     available[size_t(t)] = true;
     best = t;
+    return tables[size_t(t)] = tables[size_t(target::scalar)];
 }
 
-#define FILL(family, area) fill_##area,
-#define OFFER(name)                                                 \
-    {                                                               \
-        using namespace name;                                       \
-        void (*const fills[])(rows &) = {SIMGP_AREAS(FILL)};        \
-        offer(target::name, fills, sizeof fills / sizeof fills[0]); \
+#define FILL(area) fill_##area(table.area);
+#define OFFER(name)                                 \
+    {                                               \
+        using namespace name;                       \
+        row_table &table = add_table(target::name); \
+        SIMGP_AREAS(FILL)                           \
     }
 
 void fill_tables() {
@@ -115,7 +114,21 @@ void fill_tables() {
     live.store(&tables[size_t(best)], std::memory_order_release);
 }
 
-void ensure_tables() { pthread_once(&once, fill_tables); }
+enum class progress : uint8_t { none, filling, done };
+std::atomic<progress> tables_are{progress::none};
+
+// By whichever thread comes first; the others wait for the microsecond that it takes.
+void ensure_tables() {
+    progress now = tables_are.load(std::memory_order_acquire);
+    if (now == progress::none && tables_are.compare_exchange_strong(now, progress::filling)) {
+        fill_tables();
+        tables_are.store(now = progress::done, std::memory_order_release);
+    }
+    while (now != progress::done) {
+        sched_yield();
+        now = tables_are.load(std::memory_order_acquire);
+    }
+}
 
 }  // namespace
 
@@ -129,13 +142,13 @@ bool target_available(target t) {
     return available[size_t(t)];
 }
 
-const rows &rows_of(target t) {
+const row_table &rows_of(target t) {
     ensure_tables();
     return tables[size_t(t)];
 }
 
-const rows &live_rows() {
-    const rows *table = live.load(std::memory_order_acquire);
+const row_table &live_rows() {
+    const row_table *table = live.load(std::memory_order_acquire);
     if (!table) {
         ensure_tables();
         table = live.load(std::memory_order_acquire);
@@ -145,7 +158,7 @@ const rows &live_rows() {
 
 target live_target() { return target(&live_rows() - tables); }
 
-void force_rows(const rows *table) {
+void force_rows(const row_table *table) {
     ensure_tables();
     live.store(table ? table : &tables[size_t(best)], std::memory_order_release);
 }
