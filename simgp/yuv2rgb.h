@@ -27,8 +27,8 @@ SIMGP_BEGIN_DECLS
  * last row (but see below).
  *
  * The parameters of all kernels are explained at simgp_csc_fn (img.h). Of the widths and heights
- * only entry 0 is read: the picture is W x H pixels. Any W and H work; of 0 or less
- * nothing is written.
+ * only entry 0 is read: the picture is W x H pixels. Any W and H work; of 0 or less nothing is
+ * written.
  *
  *   source        as drawn at the format's code (img.h); src_planes[k] with src_strides[k]. Chroma
  *                 lines are found by their stride alone.
