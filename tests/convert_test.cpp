@@ -19,9 +19,8 @@
 namespace {
 
 namespace fs = std::filesystem;
-using tools::Format;
-using tools::Kind;
-using tools::Picture;
+using tools::picture;
+using tools::pixel_format;
 
 std::string read_file(const fs::path &path) {
     std::ifstream file(path, std::ios::binary);
@@ -47,7 +46,7 @@ class Convert : public testing::Test {
     fs::path work() const { return folder_ / "work"; }
     fs::path at(const std::string &name) const { return work() / name; }
 
-    /// Runs a shell command line in the folder, the program's name written as $C.
+    // Runs a shell command line in the folder, the program's name written as $C.
     int shell(const std::string &line) {
         const std::string command = "cd '" + work().string() + "' && C=" + SIMGP_CONVERT +
                                     " && { " + line + "; } >../out 2>../err";
@@ -74,27 +73,27 @@ class Convert : public testing::Test {
         return result + "'";
     }
 
-    /// The picture of a PNG in the folder.
-    Picture png(const std::string &name) const {
+    // The picture of a PNG in the folder.
+    picture png(const std::string &name) const {
         auto source = tools::open_source({at(name), "", ""});
-        Picture picture;
-        source->next(picture);
-        return picture;
+        picture p;
+        source->next(p);
+        return p;
     }
 
     fs::path folder_;
     std::string out_, err_;
 };
 
-std::vector<const Format *> formats(bool rgb) {
-    std::vector<const Format *> list;
-    for (const Format &format : tools::formats())
+std::vector<const pixel_format *> formats(bool rgb) {
+    std::vector<const pixel_format *> list;
+    for (const pixel_format &format : tools::formats())
         if (format.is_rgb() == rgb) list.push_back(&format);
     return list;
 }
 
-/// The largest difference between two RGB pictures of the same size, and where it is.
-int difference(const Picture &a, const Picture &b, std::string *where = nullptr) {
+// The largest difference between two RGB pictures of the same size, and where it is.
+int difference(const picture &a, const picture &b, std::string *where = nullptr) {
     EXPECT_EQ(a.width(), b.width());
     EXPECT_EQ(a.height(), b.height());
     if (a.width() != b.width() || a.height() != b.height()) return 256;
@@ -121,8 +120,8 @@ constexpr std::array<std::array<int, 3>, 8> bar_colours = {{{255, 255, 255},
                                                             {0, 0, 255},
                                                             {0, 0, 0}}};
 
-/// The bars stand where they should, left to right, in their colours.
-void expect_bars(const Picture &picture, int tolerance, bool grey, const std::string &what) {
+// The bars stand where they should, left to right, in their colours.
+void expect_bars(const picture &picture, int tolerance, bool grey, const std::string &what) {
     for (int bar = 0; bar < 8; ++bar) {
         const int x = (2 * bar + 1) * picture.width() / 16;
         for (int c = 0; c < 3; ++c) {
@@ -137,7 +136,7 @@ void expect_bars(const Picture &picture, int tolerance, bool grey, const std::st
 // are odd and not multiples of a tile: a wrong plane order, offset, stride or channel shows.
 // Grey shows its luma as it is, so that black is 16 there and white 235.
 TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
-    for (const Format *format : formats(false))
+    for (const pixel_format *format : formats(false))
         for (const char *size : {"128x64", "97x51"}) {
             const std::string name(format->name), file = name + size + "." + name;
             good(std::string("testcard:") + size + "@3 --format " + name + " -o " + file);
@@ -153,25 +152,25 @@ TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
     // The last pixel of an odd line has no V of its own.
     good("uyvy97x51.uyvy --size 97x51 -n 1 --to yuv444 -o last.y4m");
     good("last.y4m -o last.png -q");
-    const Picture last = png("last.png");
+    const picture last = png("last.png");
     for (int c = 0; c < 3; ++c) EXPECT_LE(*last.sample(c, 96, 0), 8);
     // 97 x 51: one pair of tile rows of one group; chroma of 25 rows: one single tile row.
     EXPECT_EQ(fs::file_size(at("t64x3297x51.t64x32")), 3u * (8192 + 8192));
 }
 
 TEST_F(Convert, EveryRgbFormatHasTheBarsAndWidensToFullWhite) {
-    for (const Format *format : formats(true)) {
+    for (const pixel_format *format : formats(true)) {
         const std::string name(format->name);
         good("testcard:97x51 -q --to " + name + " -o " + name + ".png");
-        const Picture picture = png(name + ".png");
-        expect_bars(picture, format->kind == Kind::rgb16 ? 8 : 2, false, name);
+        const picture picture = png(name + ".png");
+        expect_bars(picture, format->is_rgb16() ? 8 : 2, false, name);
         for (int c = 0; c < 3; ++c) EXPECT_EQ(*picture.sample(c, 1, 0), 255) << name;
         // The same pixels as PPM, after the header, and as raw bytes of the format.
         good("testcard:97x51 -q --to " + name + " -o " + name + ".ppm");
         const std::string header = "P6\n97 51\n255\n", ppm = read_file(at(name + ".ppm"));
         ASSERT_EQ(ppm.size(), header.size() + 97 * 51 * 3);
         EXPECT_EQ(ppm.substr(0, header.size()), header);
-        EXPECT_EQ(std::memcmp(ppm.data() + header.size(), picture.row(0, 0), 97 * 3), 0) << name;
+        EXPECT_EQ(std::memcmp(ppm.data() + header.size(), picture.line(0, 0), 97 * 3), 0) << name;
     }
     good("testcard:16x8 -o one.argb8888");
     EXPECT_EQ(read_file(at("one.argb8888")).substr(0, 4), "\xff\xff\xff\xff");
@@ -185,7 +184,7 @@ TEST_F(Convert, PicturesGoIntoEveryYuvFormatAndComeBack) {
     constexpr int width = 75;
     for (int height : {67, 65}) {
         const std::string size = "75x" + std::to_string(height);
-        Picture soft({&tools::format_named("rgb888"), width, height});
+        picture soft({&tools::format_named("rgb888"), width, height});
         std::string bytes;
         for (int y = 0; y < height; ++y) {
             for (int x = 0; x < width; ++x) {
@@ -193,12 +192,12 @@ TEST_F(Convert, PicturesGoIntoEveryYuvFormatAndComeBack) {
                 *soft.sample(1, x, y) = uint8_t(200 - y);
                 *soft.sample(2, x, y) = uint8_t(90 + x / 2 + y / 2);
             }
-            bytes.append(reinterpret_cast<char *>(soft.row(0, y)), width * 3);
+            bytes.append(reinterpret_cast<char *>(soft.line(0, y)), width * 3);
         }
         write_file(at("soft.rgb888"), bytes);
         good("soft.rgb888 --size " + size + " -o soft.png");
         ASSERT_EQ(difference(png("soft.png"), soft), 0);
-        for (const Format *format : formats(false)) {
+        for (const pixel_format *format : formats(false)) {
             const std::string name(format->name);
             good("soft.png -o soft." + name);
             good("soft." + name + " --size " + size + " -q -o back.png");
@@ -242,13 +241,13 @@ TEST_F(Convert, SeveralFramesBecomeNumberedFilesOrASheet) {
     EXPECT_GT(difference(png("a%-000.png"), png("a%-011.png")), 100) << "the card does not move";
 
     good("testcard:64x48@12 -n 6 -o sheet.png --sheet --columns 3");
-    const Picture sheet = png("sheet.png");
+    const picture sheet = png("sheet.png");
     EXPECT_EQ(sheet.width(), 3 * (64 + 8) + 8);
     // The first picture stands in its frame unchanged, below its label.
-    const Picture first = png("a%-000.png");
+    const picture first = png("a%-000.png");
     const int top = (sheet.height() - 8) / 2 - 48;
     for (int y = 0; y < 48; ++y)
-        ASSERT_EQ(std::memcmp(sheet.sample(0, 8, top + y), first.row(0, y), 64 * 3), 0)
+        ASSERT_EQ(std::memcmp(sheet.sample(0, 8, top + y), first.line(0, y), 64 * 3), 0)
             << "line " << y;
 
     good("testcard:64x48@200 -o long.ppm --sheet");
@@ -260,12 +259,12 @@ TEST_F(Convert, DitheringIsTheLibrarysOwn) {
     good("testcard:64x48 -o dithered.rgb565 --dither");
     EXPECT_NE(read_file(at("plain.rgb565")), read_file(at("dithered.rgb565")));
     auto card = tools::open_source({"testcard:64x48", "", ""});
-    Picture frame, screen({&tools::format_named("rgb565"), 64, 48});
+    picture frame, screen({&tools::format_named("rgb565"), 64, 48});
     card->next(frame);
     const simgp_img src = frame.descriptor(), dst = screen.descriptor();
     ASSERT_EQ(simgp_csc_dither(&src, &dst), SIMGP_OK);
     EXPECT_EQ(read_file(at("dithered.rgb565")),
-              std::string(reinterpret_cast<char *>(screen.row(0, 0)), 64 * 48 * 2));
+              std::string(reinterpret_cast<char *>(screen.line(0, 0)), 64 * 48 * 2));
     // Where the library does not dither from a format, the road goes over one from which it does.
     good("testcard:64x48 --format nv12 -o over.bgr565 --dither -v");
     EXPECT_NE(err_.find("nv12 -> yuv420 -> bgr565 (dithered)"), std::string::npos) << err_;

@@ -1,6 +1,7 @@
 // simgp-convert: takes frames from files, pipes or a test card through the library's conversions.
+#include <stdio.h>
+
 #include <CLI/CLI.hpp>
-#include <cstdio>
 #include <exception>
 
 #include "tools/job.h"
@@ -32,7 +33,7 @@ int main(int argc, char **argv) {
     CLI::App app("Converts pictures and video frames between the formats of the simgp library.",
                  "simgp-convert");
     app.footer(examples);
-    tools::Job job;
+    tools::job job;
     bool list = false;
     std::string demo;
     app.add_option("input", job.source.path, "file, \"-\", or testcard:[WxH][@FRAMES]");
@@ -64,23 +65,23 @@ int main(int argc, char **argv) {
     } catch (const CLI::Success &wish) {
         return app.exit(wish);
     } catch (const CLI::ParseError &error) {
-        std::fprintf(stderr, "simgp-convert: %s (see --help)\n", error.what());
+        fprintf(stderr, "simgp-convert: %s (see --help)\n", error.what());
         return 2;
     }
 
     try {
         if (list) {
-            std::fputs(tools::list_conversions().c_str(), stdout);
+            fputs(tools::list_conversions().c_str(), stdout);
         } else if (!demo.empty()) {
             tools::demo(demo, job.source);
         } else {
             tools::run(job);
         }
     } catch (const std::bad_alloc &) {
-        std::fprintf(stderr, "simgp-convert: not enough memory\n");
+        fprintf(stderr, "simgp-convert: not enough memory\n");
         return 1;
     } catch (const std::exception &error) {
-        std::fprintf(stderr, "simgp-convert: %s\n", error.what());
+        fprintf(stderr, "simgp-convert: %s\n", error.what());
         return 1;
     }
     return 0;

@@ -12,9 +12,9 @@ namespace {
 
 constexpr size_t longest_line = 1024;
 
-/// The layouts of the colour space tag. 4:2:0 comes in several sitings of chroma, which say where a
-/// sample belongs, not where it lies in memory.
-const Format *format_of_tag(std::string_view tag) {
+// The layouts of the colour space tag. 4:2:0 comes in several sitings of chroma, which say where a
+// sample belongs, not where it lies in memory.
+const pixel_format *format_of_tag(std::string_view tag) {
     for (const char *same : {"420", "420jpeg", "420mpeg2", "420paldv"})
         if (tag == same) return &format_coded(SIMGP_FMT_YUV420);
     if (tag == "422") return &format_coded(SIMGP_FMT_YUV422N);
@@ -23,7 +23,7 @@ const Format *format_of_tag(std::string_view tag) {
     return nullptr;
 }
 
-/// "420p10", "mono16": the digits after the last letter that is followed by digits only.
+// "420p10", "mono16": the digits after the last letter that is followed by digits only.
 bool high_depth(std::string_view tag) {
     for (const char *begin : {"420p", "422p", "444p", "440p", "mono"})
         if (tag.starts_with(begin)) {
@@ -34,9 +34,9 @@ bool high_depth(std::string_view tag) {
     return false;
 }
 
-class Y4mSource : public Source {
+class y4m_source : public source {
   public:
-    explicit Y4mSource(std::unique_ptr<Input> input) : input_(std::move(input)) {
+    explicit y4m_source(std::unique_ptr<input> in) : input_(std::move(in)) {
         name_ = input_->name();
         std::string header;
         if (!input_->line(header, longest_line)) fail(0, "the Y4M header has no end");
@@ -63,13 +63,13 @@ class Y4mSource : public Source {
                     colour = value;
                     break;
                 case 'F':
-                    tempo_.rate = value;
+                    traits_.rate = value;
                     break;
                 case 'I':
-                    tempo_.interlacing = value;
+                    traits_.interlacing = value;
                     break;
                 case 'A':
-                    tempo_.aspect = value;
+                    traits_.aspect = value;
                     break;
                 case 'X':
                     break;  // comments and extensions
@@ -94,7 +94,7 @@ class Y4mSource : public Source {
         shape_.height = int(height);
     }
 
-    bool next(Picture &to) override {
+    bool next(picture &to) override {
         const int64_t begin = input_->offset();
         if (input_->peek(1).empty()) return false;
         std::string header;
@@ -125,36 +125,37 @@ class Y4mSource : public Source {
         return value;
     }
 
-    std::unique_ptr<Input> input_;
+    std::unique_ptr<input> input_;
     int64_t frame_ = 0;
 };
 
-class Y4mSink : public Sink {
+class y4m_sink : public sink {
   public:
-    Y4mSink(const std::string &path, const Tempo &tempo) : output_(path), tempo_(tempo) {}
+    y4m_sink(const std::string &path, const video_traits &traits)
+        : output_(path), traits_(traits) {}
 
-    void put(const Picture &picture) override {
+    void put(const picture &p) override {
         if (frames_++ == 0) {
             std::ostringstream header;
-            header << "YUV4MPEG2 W" << picture.width() << " H" << picture.height() << " F"
-                   << tempo_.rate << " I" << tempo_.interlacing << " A" << tempo_.aspect << " C"
-                   << y4m_tag(picture.format()) << "\n";
+            header << "YUV4MPEG2 W" << p.width() << " H" << p.height() << " F" << traits_.rate
+                   << " I" << traits_.interlacing << " A" << traits_.aspect << " C"
+                   << y4m_tag(p.format()) << "\n";
             output_.write(header.str());
         }
         output_.write("FRAME\n");
-        write_frame(output_, picture);
+        write_frame(output_, p);
     }
     void finish() override { output_.commit(); }
 
   private:
-    Output output_;
-    Tempo tempo_;
+    output output_;
+    video_traits traits_;
     int64_t frames_ = 0;
 };
 
 }  // namespace
 
-std::string_view y4m_tag(const Format &format) {
+std::string_view y4m_tag(const pixel_format &format) {
     switch (format.code) {
         case SIMGP_FMT_YUV400:
             return "mono";
@@ -169,12 +170,12 @@ std::string_view y4m_tag(const Format &format) {
     }
 }
 
-std::unique_ptr<Source> open_y4m(std::unique_ptr<Input> input) {
-    return std::make_unique<Y4mSource>(std::move(input));
+std::unique_ptr<source> open_y4m(std::unique_ptr<input> in) {
+    return std::make_unique<y4m_source>(std::move(in));
 }
 
-std::unique_ptr<Sink> y4m_sink(const std::string &path, const Tempo &tempo) {
-    return std::make_unique<Y4mSink>(path, tempo);
+std::unique_ptr<sink> open_y4m_sink(const std::string &path, const video_traits &traits) {
+    return std::make_unique<y4m_sink>(path, traits);
 }
 
 }  // namespace tools
