@@ -1,13 +1,12 @@
 // simgp-probe: names the codec of a stream and lists its pictures.
 #include <stdio.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
-#include <exception>
 #include <nlohmann/json.hpp>
 #include <optional>
 
 #include "scmn/scmn.h"
+#include "tools/main.h"
 #include "tools/progress.h"
 #include "tools/stream.h"
 
@@ -56,7 +55,7 @@ uint32_t tag_of(const std::string &text) {
 }
 
 // Text on its way to standard output, in portions between which the progress bar makes room.
-class output {
+class listing {
   public:
     void write(const std::string &text, tools::progress *bar = nullptr) {
         text_ += text;
@@ -74,11 +73,16 @@ class output {
     std::string text_;
 };
 
-template <typename... Part>
+template <class... Part>
 std::string format(const char *pattern, Part... part) {
     char line[256];
     snprintf(line, sizeof line, pattern, part...);
     return line;
+}
+
+// Names of files need not be UTF-8; JSON has to be.
+std::string dumped(const json &value) {
+    return value.dump(-1, ' ', false, json::error_handler_t::replace);
 }
 
 struct summary {
@@ -125,7 +129,7 @@ std::string to_text(const summary &s, uint64_t stream_bytes) {
 }
 
 // Lists one file. In JSON an object, in pieces, so that its length does not matter.
-void list(const std::string &path, int32_t media_type, const options &o, output &out) {
+void list(const std::string &path, int32_t media_type, const options &o, listing &out) {
     tools::progress bar(!o.quiet);
     bool open = false;  // the array of pictures
     try {
@@ -137,7 +141,7 @@ void list(const std::string &path, int32_t media_type, const options &o, output 
                                {"codec", tools::media_name(stream.media_type())},
                                {"media_type", stream.media_type()},
                                {"recognised_by", by}};
-            const std::string text = head.dump(-1, ' ', false, json::error_handler_t::replace);
+            const std::string text = dumped(head);
             out.write(" " + text.substr(0, text.size() - 1));
             if (!o.summary_only) out.write(",\"pictures\":["), open = true;
         } else {
@@ -152,7 +156,7 @@ void list(const std::string &path, int32_t media_type, const options &o, output 
             if (!o.summary_only && o.as_json) {
                 const json line = {
                     {"offset", picture.offset}, {"size", picture.size}, {"key", picture.key}};
-                out.write((total.pictures ? ",\n  " : "\n  ") + line.dump(), &bar);
+                out.write((total.pictures ? ",\n  " : "\n  ") + dumped(line), &bar);
             } else if (!o.summary_only) {
                 out.write(format("%9llu %13llu %9llu  %s", (unsigned long long)total.pictures,
                                  (unsigned long long)picture.offset,
@@ -170,18 +174,15 @@ void list(const std::string &path, int32_t media_type, const options &o, output 
         const uint64_t stream_bytes = uint64_t(in.offset());
         if (o.as_json)
             out.write((open ? "],\n  " : ",") +
-                      ("\"summary\":" + to_json(total, stream_bytes).dump()) + "}");
+                      ("\"summary\":" + dumped(to_json(total, stream_bytes))) + "}");
         else
             out.write("  " + to_text(total, stream_bytes));
         out.flush(&bar);
     } catch (const fault &f) {
         if (o.as_json) {
             const json error = {{"error", f.what()}};
-            std::string text = error.dump(-1, ' ', false, json::error_handler_t::replace).substr(1);
-            out.write(open ? "],\n  " + text
-                           : " {\"file\":" +
-                                 json(path).dump(-1, ' ', false, json::error_handler_t::replace) +
-                                 "," + text);
+            const std::string text = dumped(error).substr(1);
+            out.write(open ? "],\n  " + text : " {\"file\":" + dumped(path) + "," + text);
         }
         out.flush(&bar);
         throw;
@@ -189,13 +190,12 @@ void list(const std::string &path, int32_t media_type, const options &o, output 
 }
 
 // Names the codec of a tag.
-void name(const std::string &text, uint32_t tag, output &out, bool as_json) {
+void name(const std::string &text, uint32_t tag, listing &out, bool as_json) {
     const int32_t type = scmn_fcc2mt(tag);
     if (as_json)
         out.write(
-            json::array(
-                {{{"fourcc", text}, {"codec", tools::media_name(type)}, {"media_type", type}}})
-                .dump(-1, ' ', false, json::error_handler_t::replace) +
+            dumped(json::array(
+                {{{"fourcc", text}, {"codec", tools::media_name(type)}, {"media_type", type}}})) +
             "\n");
     else
         out.write(text + ": " + tools::media_name(type) + ", media type " + std::to_string(type) +
@@ -204,7 +204,7 @@ void name(const std::string &text, uint32_t tag, output &out, bool as_json) {
 }
 
 int run(const options &o) {
-    output out;
+    listing out;
     int32_t media_type = 0;
     if (o.fourcc) {
         const uint32_t tag = tag_of(*o.fourcc);
@@ -244,21 +244,8 @@ int main(int argc, char **argv) {
     app.add_flag("-j,--json", o.as_json, "write JSON, an array with an object for each file");
     app.add_flag("-s,--summary", o.summary_only, "leave the list of pictures out");
     app.add_flag("-q,--quiet", o.quiet, "no progress bar");
-    try {
-        app.parse(argc, argv);
+    const auto check = [&] {
         if (o.files.empty() && !o.fourcc) throw CLI::RequiredError("a file or --fourcc");
-    } catch (const CLI::Success &wish) {
-        return app.exit(wish);
-    } catch (const CLI::ParseError &error) {
-        fprintf(stderr, "simgp-probe: %s (see --help)\n", error.what());
-        return 2;
-    }
-    try {
-        return run(o);
-    } catch (const std::bad_alloc &) {
-        fprintf(stderr, "simgp-probe: not enough memory\n");
-    } catch (const std::exception &error) {
-        fprintf(stderr, "simgp-probe: %s\n", error.what());
-    }
-    return 1;
+    };
+    return tools::run_program(app, argc, argv, check, [&] { return run(o); });
 }
