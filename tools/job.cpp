@@ -2,6 +2,7 @@
 
 #include <stdio.h>
 
+#include <algorithm>
 #include <limits>
 #include <memory>
 #include <vector>

@@ -1,8 +1,5 @@
 #include "tools/picture.h"
 
-#include <string.h>
-
-#include <algorithm>
 #include <charconv>
 
 #include "tools/fault.h"
@@ -192,8 +189,8 @@ simgp_img picture::descriptor(bool even_width, bool even_height) {
 }
 
 void move_samples(const picture &src, picture &dst) {
-    // The V of a last half group lies outside the line: that of the group before serves, as everywhere
-    // in the library.
+    // The V of a last half group lies outside the line: that of the group before serves, as
+    // everywhere in the library.
     const bool half_group = src.format().is_packed() && src.width() % 2 == 1;
     for (int c = 0; c < 3; ++c) {
         const channel &to = dst.format().channels[c];

@@ -99,7 +99,7 @@ class picture {
     // nobody looks at what the added column and line hold.
     simgp_img descriptor(bool even_width = false, bool even_height = false);
 
-    // The sample of channel `number` (Y, U, V or R, G, B) of pixel (x, y); if the format has_samples().
+    // The sample of channel `number` (Y, U, V or R, G, B) of pixel (x, y). The format has_samples().
     uint8_t *sample(int number, int x, int y) {
         const channel &c = format().channels[number];
         return line(c.plane, y >> c.y_shift) + c.first + c.step * (x >> c.x_shift);

@@ -1,6 +1,5 @@
 // PNG through libpng's simplified interface, which brings every kind of PNG to 8-bit sRGB.
 #include <png.h>
-#include <string.h>
 
 #include "tools/rgb.h"
 #include "tools/sink.h"

@@ -16,22 +16,6 @@ int32_t call(method how, const simgp_img &src, const simgp_img &dst) {
     return how == method::dither ? simgp_csc_dither(&src, &dst) : simgp_csc(&src, &dst);
 }
 
-// Layouts that the library reads but never writes. That pictures can be brought into them all the
-// same, the tool moves samples into them itself.
-bool only_by_samples(const pixel_format &to) {
-    switch (to.code) {
-        case SIMGP_FMT_YUV400:
-        case SIMGP_FMT_YUV444:
-        case SIMGP_FMT_YV16:
-        case SIMGP_FMT_YUV422W:
-        case SIMGP_FMT_UYVY:
-        case SIMGP_FMT_YUYV:
-            return true;
-        default:
-            return false;
-    }
-}
-
 // Every step costs, and more so what it loses: bits of colour, chroma samples, and the rounding of
 // a passage between YUV and RGB.
 int step_cost(const pixel_format &from, const pixel_format &to, method how) {
@@ -46,8 +30,8 @@ int step_cost(const pixel_format &from, const pixel_format &to, method how) {
 // begin a tile row of its own, it lies in the last one.
 bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
 
-// Converts one picture. The library may leave out the chroma of a last odd column or line; given the
-// next even size it does not, and as chroma is never averaged, nothing of what is added shows.
+// Converts one picture. The library may leave out the chroma of a last odd column or line; given
+// the next even size it does not, and as chroma is never averaged, nothing of what is added shows.
 // Conversions from YUV to RGB have their own rules for odd sizes, which are kept.
 void convert(method how, picture &src, picture &dst) {
     const pixel_format &from = src.format(), &to = dst.format();
@@ -74,12 +58,17 @@ void convert(method how, picture &src, picture &dst) {
 }  // namespace
 
 bool offered(const pixel_format &from, const pixel_format &to, method how) {
-    if (how == method::samples)
-        return only_by_samples(to) && !from.is_rgb() && !from.is_tiled() && &from != &to;
-    const size_t count = formats().size();
-    static std::vector<signed char> known(2 * count * count);  // 0: not asked
+    const std::span<const pixel_format> all = formats();
+    if (how == method::samples) {
+        // Layouts that the library reads but never writes. That pictures can be brought into them
+        // all the same, the tool moves samples into them itself.
+        const auto writes = [&](const pixel_format &f) { return offered(f, to, method::csc); };
+        return !from.is_rgb() && !from.is_tiled() && !to.is_rgb() && &from != &to &&
+               std::none_of(all.begin(), all.end(), writes);
+    }
+    static std::vector<signed char> known(2 * all.size() * all.size());  // 0: not asked
     signed char &answer =
-        known[(index(from) * count + index(to)) * 2 + (how == method::dither ? 1 : 0)];
+        known[2 * (index(from) * all.size() + index(to)) + (how == method::dither)];
     if (answer == 0) {
         picture src({&from, 8, 8}), dst({&to, 8, 8});
         answer = call(how, src.descriptor(), dst.descriptor()) == SIMGP_OK ? 1 : -1;

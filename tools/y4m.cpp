@@ -1,5 +1,6 @@
 // Y4M, uncompressed video: a line of text about the stream, then for each frame a line that begins
 // with FRAME and the tight planes.
+#include <algorithm>
 #include <charconv>
 #include <limits>
 
@@ -12,8 +13,8 @@ namespace {
 
 constexpr size_t longest_line = 1024;
 
-// Colour space tags. 4:2:0 comes in several sitings of chroma, which say where a sample belongs, not
-// where it lies in memory. Of the tags of one format, the first is the one that is written.
+// Colour space tags. 4:2:0 comes in several sitings of chroma, which say where a sample belongs,
+// not where it lies in memory. Of the tags of one format, the first is the one that is written.
 constexpr struct {
     std::string_view tag;
     int32_t format;
