@@ -1,8 +1,6 @@
 #include "tools/picture.h"
 
-#include <algorithm>
 #include <charconv>
-#include <cstring>
 
 #include "tools/fault.h"
 
@@ -10,127 +8,126 @@ namespace tools {
 
 namespace {
 
-const std::vector<Format> table = {
-    {SIMGP_FMT_YUV400, "yuv400", Kind::planar, {{1, 0, 0}}, {{0, 0, 1, 0, 0}, {}, {}}},
-    {SIMGP_FMT_YUV420,
-     "yuv420",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 1}, {1, 1, 1}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 1, 1}, {2, 0, 1, 1, 1}}},
-    {SIMGP_FMT_YUV422N,
-     "yuv422n",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 0}, {1, 1, 0}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 1, 0}, {2, 0, 1, 1, 0}}},
-    {SIMGP_FMT_YUV444,
-     "yuv444",
-     Kind::planar,
-     {{1, 0, 0}, {1, 0, 0}, {1, 0, 0}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 0, 0}, {2, 0, 1, 0, 0}}},
-    {SIMGP_FMT_YV12,
-     "yv12",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 1}, {1, 1, 1}},
-     {{0, 0, 1, 0, 0}, {2, 0, 1, 1, 1}, {1, 0, 1, 1, 1}}},
-    {SIMGP_FMT_YV16,
-     "yv16",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 0}, {1, 1, 0}},
-     {{0, 0, 1, 0, 0}, {2, 0, 1, 1, 0}, {1, 0, 1, 1, 0}}},
-    {SIMGP_FMT_NV12,
-     "nv12",
-     Kind::planar,
-     {{1, 0, 0}, {2, 1, 1}},
-     {{0, 0, 1, 0, 0}, {1, 0, 2, 1, 1}, {1, 1, 2, 1, 1}}},
-    {SIMGP_FMT_NV21,
-     "nv21",
-     Kind::planar,
-     {{1, 0, 0}, {2, 1, 1}},
-     {{0, 0, 1, 0, 0}, {1, 1, 2, 1, 1}, {1, 0, 2, 1, 1}}},
-    {SIMGP_FMT_YUV422W,
-     "yuv422w",
-     Kind::planar,
-     {{1, 0, 0}, {1, 0, 1}, {1, 0, 1}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 0, 1}, {2, 0, 1, 0, 1}}},
-    {SIMGP_FMT_T64X32, "t64x32", Kind::tiled, {{1, 0, 0}, {2, 1, 1}}, {}},
-    {SIMGP_FMT_UYVY,
-     "uyvy",
-     Kind::packed,
-     {{2, 0, 0}},
-     {{0, 1, 2, 0, 0}, {0, 0, 4, 1, 0}, {0, 2, 4, 1, 0}}},
-    {SIMGP_FMT_YUYV,
-     "yuyv",
-     Kind::packed,
-     {{2, 0, 0}},
-     {{0, 0, 2, 0, 0}, {0, 1, 4, 1, 0}, {0, 3, 4, 1, 0}}},
-    {SIMGP_FMT_RGB565, "rgb565", Kind::rgb16, {{2, 0, 0}}, {}},
-    {SIMGP_FMT_BGR565, "bgr565", Kind::rgb16, {{2, 0, 0}}, {}},
-    {SIMGP_FMT_RGB888,
-     "rgb888",
-     Kind::rgb,
-     {{3, 0, 0}},
-     {{0, 0, 3, 0, 0}, {0, 1, 3, 0, 0}, {0, 2, 3, 0, 0}}},
-    {SIMGP_FMT_BGR888,
-     "bgr888",
-     Kind::rgb,
-     {{3, 0, 0}},
-     {{0, 2, 3, 0, 0}, {0, 1, 3, 0, 0}, {0, 0, 3, 0, 0}}},
-    {SIMGP_FMT_RGBA8888,
-     "rgba8888",
-     Kind::rgb,
-     {{4, 0, 0}},
-     {{0, 0, 4, 0, 0}, {0, 1, 4, 0, 0}, {0, 2, 4, 0, 0}}},
-    {SIMGP_FMT_BGRA8888,
-     "bgra8888",
-     Kind::rgb,
-     {{4, 0, 0}},
-     {{0, 2, 4, 0, 0}, {0, 1, 4, 0, 0}, {0, 0, 4, 0, 0}}},
-    {SIMGP_FMT_ARGB8888,
-     "argb8888",
-     Kind::rgb,
-     {{4, 0, 0}},
-     {{0, 1, 4, 0, 0}, {0, 2, 4, 0, 0}, {0, 3, 4, 0, 0}}},
+using family = pixel_format::family;
+
+// Planes of their own for each channel; `u` is the plane of U.
+constexpr pixel_format planar(int32_t code, std::string_view name, int x_shift, int y_shift,
+                              int u = 1) {
+    const plane_shape chroma = {1, x_shift, y_shift};
+    return {code,
+            name,
+            family::planar,
+            3,
+            {{1, 0, 0}, chroma, chroma},
+            {{0, 0, 1, 0, 0}, {u, 0, 1, x_shift, y_shift}, {3 - u, 0, 1, x_shift, y_shift}}};
+}
+
+// 4:2:0 with pairs of chroma in one plane; `u` is the byte of U in a pair.
+constexpr pixel_format semi_planar(int32_t code, std::string_view name, int u) {
+    return {code,
+            name,
+            family::planar,
+            2,
+            {{1, 0, 0}, {2, 1, 1}},
+            {{0, 0, 1, 0, 0}, {1, u, 2, 1, 1}, {1, 1 - u, 2, 1, 1}}};
+}
+
+// 4:2:2 in groups of four bytes; `y` and `u` are the places of the first Y and of U in a group.
+constexpr pixel_format packed(int32_t code, std::string_view name, int y, int u) {
+    return {code, name,        family::packed,
+            1,    {{2, 0, 0}}, {{0, y, 2, 0, 0}, {0, u, 4, 1, 0}, {0, u + 2, 4, 1, 0}}};
+}
+
+constexpr pixel_format rgb16(int32_t code, std::string_view name) {
+    return {code, name, family::rgb16, 1, {{2, 0, 0}}, {}};
+}
+
+// `bytes` bytes a pixel, with R, G and B at the places r, g and b.
+constexpr pixel_format rgb(int32_t code, std::string_view name, int bytes, int r, int g, int b) {
+    return {code,
+            name,
+            family::rgb,
+            1,
+            {{bytes, 0, 0}},
+            {{0, r, bytes, 0, 0}, {0, g, bytes, 0, 0}, {0, b, bytes, 0, 0}}};
+}
+
+constexpr pixel_format table[] = {
+    {SIMGP_FMT_YUV400, "yuv400", family::planar, 1, {{1, 0, 0}}, {{0, 0, 1, 0, 0}}},
+    planar(SIMGP_FMT_YUV420, "yuv420", 1, 1),
+    planar(SIMGP_FMT_YUV422N, "yuv422n", 1, 0),
+    planar(SIMGP_FMT_YUV444, "yuv444", 0, 0),
+    planar(SIMGP_FMT_YV12, "yv12", 1, 1, 2),
+    planar(SIMGP_FMT_YV16, "yv16", 1, 0, 2),
+    semi_planar(SIMGP_FMT_NV12, "nv12", 0),
+    semi_planar(SIMGP_FMT_NV21, "nv21", 1),
+    planar(SIMGP_FMT_YUV422W, "yuv422w", 0, 1),
+    {SIMGP_FMT_T64X32, "t64x32", family::tiled, 2, {{1, 0, 0}, {2, 1, 1}}, {}},
+    packed(SIMGP_FMT_UYVY, "uyvy", 1, 0),
+    packed(SIMGP_FMT_YUYV, "yuyv", 0, 1),
+    rgb16(SIMGP_FMT_RGB565, "rgb565"),
+    rgb16(SIMGP_FMT_BGR565, "bgr565"),
+    rgb(SIMGP_FMT_RGB888, "rgb888", 3, 0, 1, 2),
+    rgb(SIMGP_FMT_BGR888, "bgr888", 3, 2, 1, 0),
+    rgb(SIMGP_FMT_RGBA8888, "rgba8888", 4, 0, 1, 2),
+    rgb(SIMGP_FMT_BGRA8888, "bgra8888", 4, 2, 1, 0),
+    rgb(SIMGP_FMT_ARGB8888, "argb8888", 4, 1, 2, 3),
 };
 
 int even(int n) { return n + (n & 1); }
 int shifted_up(int n, int shift) { return (n + (1 << shift) - 1) >> shift; }
 
-}  // namespace
-
-int Format::chroma() const {
-    if (is_rgb()) return 4;
-    if (kind == Kind::tiled) return 1;
-    if (channel[1].step == 0) return 0;
-    return 4 >> (channel[1].x_shift + channel[1].y_shift);
+// As simgp/tile.h says: whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one,
+// groups of 4 x 1.
+size_t tiled_plane_bytes(size_t line_bytes, size_t lines) {
+    const size_t tile_rows = (lines + 31) / 32;
+    return 8192 * ((line_bytes + 127) / 128 * (tile_rows / 2) +
+                   (tile_rows % 2 ? (line_bytes + 255) / 256 : 0));
 }
 
-std::span<const Format> formats() { return table; }
+}  // namespace
 
-const Format *find_format(std::string_view name) {
-    for (const Format &format : table)
+int pixel_format::chroma() const {
+    if (is_rgb()) return 4;
+    if (is_tiled()) return 1;
+    if (channels[1].step == 0) return 0;
+    return 4 >> (channels[1].x_shift + channels[1].y_shift);
+}
+
+std::span<const pixel_format> formats() { return table; }
+
+const pixel_format *find_format(std::string_view name) {
+    for (const pixel_format &format : table)
         if (format.name == name) return &format;
     return nullptr;
 }
 
-const Format &format_named(std::string_view name) {
-    if (const Format *format = find_format(name)) return *format;
+const pixel_format &format_named(std::string_view name) {
+    if (const pixel_format *format = find_format(name)) return *format;
     std::string known;
-    for (const Format &format : table) known.append(" ").append(format.name);
-    throw Fault("unknown format '", name, "'; there are", known);
+    for (const pixel_format &format : table) known.append(" ").append(format.name);
+    throw fault("unknown format '", name, "'; there are", known);
 }
 
-const Format &format_coded(int32_t code) {
-    for (const Format &format : table)
+const pixel_format &format_coded(int32_t code) {
+    for (const pixel_format &format : table)
         if (format.code == code) return format;
-    throw Fault("unknown format code ", code);
+    throw fault("unknown format code ", code);
+}
+
+std::string ending_of(const std::string &path) {
+    const size_t dot = path.rfind('.');
+    return dot == std::string::npos || path.find('/', dot) != std::string::npos
+               ? ""
+               : path.substr(dot + 1);
 }
 
 void check_size(int64_t width, int64_t height, const std::string &where) {
     if (width < 1 || height < 1 || width > 65535 || height > 65535)
-        throw Fault(where, ": impossible size ", width, "x", height,
+        throw fault(where, ": impossible size ", width, "x", height,
                     "; width and height go from 1 to 65535");
     if (width * height > (int64_t{1} << 30) / 4)
-        throw Fault(where, ": impossible size ", width, "x", height,
+        throw fault(where, ": impossible size ", width, "x", height,
                     "; a frame may have up to 268435456 pixels");
 }
 
@@ -143,69 +140,62 @@ void parse_size(std::string_view text, const std::string &what, int &width, int 
         auto second = std::from_chars(first.ptr + 1, end, h);
         good = second.ec != std::errc::invalid_argument && second.ptr == end;
         if (good && (first.ec != std::errc() || second.ec != std::errc()))
-            throw Fault(what, ": impossible size ", text, "; width and height go from 1 to 65535");
+            throw fault(what, ": impossible size ", text, "; width and height go from 1 to 65535");
     }
-    if (!good) throw Fault(what, ": '", text, "' is not a size such as 640x480");
+    if (!good) throw fault(what, ": '", text, "' is not a size such as 640x480");
     check_size(w, h, what);
     width = int(w);
     height = int(h);
 }
 
-size_t tiled_plane_bytes(size_t row_bytes, size_t rows) {
-    const size_t tile_rows = (rows + 31) / 32;
-    // Whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one, groups of 4 x 1.
-    return 8192 * ((row_bytes + 127) / 128 * (tile_rows / 2) +
-                   (tile_rows % 2 ? (row_bytes + 255) / 256 : 0));
-}
-
-Picture::Picture(const Shape &shape) : shape_(shape) {
+picture::picture(const picture_shape &shape) : shape_(shape) {
     size_t total = 0;
     for (int k = 0; k < planes(); ++k) {
-        const PlaneShape &p = format().planes[k];
+        const plane_shape &p = format().planes[k];
         start_[k] = total;
-        if (format().kind == Kind::tiled) {
-            rows_[k] = 1;
-            row_bytes_[k] = tiled_plane_bytes(width(), height() >> p.y_shift);
-            total += row_bytes_[k];
+        if (format().is_tiled()) {
+            lines_[k] = 1;
+            line_bytes_[k] = tiled_plane_bytes(width(), height() >> p.y_shift);
+            total += line_bytes_[k];
             continue;
         }
-        rows_[k] = shifted_up(height(), p.y_shift);
-        row_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
+        lines_[k] = shifted_up(height(), p.y_shift);
+        line_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
         stride_[k] = ptrdiff_t(shifted_up(even(width()), p.x_shift)) * p.bytes;
         total += size_t(stride_[k]) * shifted_up(even(height()), p.y_shift);
     }
     memory_.resize(total);
 }
 
-size_t Picture::raw_bytes() const {
+size_t picture::raw_bytes() const {
     size_t total = 0;
-    for (int k = 0; k < planes(); ++k) total += row_bytes_[k] * rows_[k];
+    for (int k = 0; k < planes(); ++k) total += line_bytes_[k] * lines_[k];
     return total;
 }
 
-simgp_img Picture::descriptor(bool even_width, bool even_height) {
+simgp_img picture::descriptor(bool even_width, bool even_height) {
     const int w = even_width ? even(width()) : width();
     const int h = even_height ? even(height()) : height();
     simgp_img img = {};
     img.format = format().code;
     for (int k = 0; k < planes(); ++k) {
-        const PlaneShape &p = format().planes[k];
+        const plane_shape &p = format().planes[k];
         img.width[k] = shifted_up(w, p.x_shift);
-        img.height[k] = format().kind == Kind::tiled ? h >> p.y_shift : shifted_up(h, p.y_shift);
+        img.height[k] = format().is_tiled() ? h >> p.y_shift : shifted_up(h, p.y_shift);
         img.stride[k] = int32_t(stride_[k]);
-        img.plane[k] = row(k, 0);
+        img.plane[k] = line(k, 0);
     }
     return img;
 }
 
-void move_samples(const Picture &src, Picture &dst) {
-    // The V of a last half group lies outside the row: that of the group before serves, as everywhere
-    // in the library.
-    const bool half_group = src.format().kind == Kind::packed && src.width() % 2 == 1;
+void move_samples(const picture &src, picture &dst) {
+    // The V of a last half group lies outside the line: that of the group before serves, as
+    // everywhere in the library.
+    const bool half_group = src.format().is_packed() && src.width() % 2 == 1;
     for (int c = 0; c < 3; ++c) {
-        const Channel &to = dst.format().channel[c];
+        const channel &to = dst.format().channels[c];
         if (to.step == 0) continue;
-        const bool known = src.format().channel[c].step != 0;
+        const bool known = src.format().channels[c].step != 0;
         for (int y = 0; y < dst.height(); y += 1 << to.y_shift)
             for (int x = 0; x < dst.width(); x += 1 << to.x_shift) {
                 const int from = half_group && c == 2 && x == src.width() - 1 ? x - 2 : x;
