@@ -47,8 +47,8 @@ void scmn_blk_mcpy(void *dst, const void *src, int32_t dst_stride, int32_t src_s
                       height);
 }
 
-// `whole` bytes of the pattern, and a tail of its low byte. Neither needs to be positive. The row comes
-// last, so that nothing has to be kept for afterwards.
+// `whole` bytes of the pattern, and behind them `tail` bytes of its low byte; of 0 or less nothing. The
+// tail is written first: the call of the row is then the last thing, a jump.
 static inline void fill(void *dst, uint32_t value, ptrdiff_t whole, ptrdiff_t tail) {
     uint8_t *p = static_cast<uint8_t *>(dst);
     if (tail > 0) memset(p + whole, uint8_t(value), size_t(tail));

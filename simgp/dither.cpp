@@ -108,7 +108,7 @@ consteval yuv_rule rule_between(const format &from, const format &to) {
 }
 
 template <const format &From, const format &To, class Luma>
-void convert(const csc_args &a, Luma &&luma) {
+void luma_to_rgb(const csc_args &a, Luma &&luma) {
     convert_to_rgb<From, To, rule_between(From, To)>(a, luma);
 }
 
@@ -116,15 +116,15 @@ void convert(const csc_args &a, Luma &&luma) {
 // picture of their own, without dithering; so is what has less than 4 rows.
 template <const format &From, const format &To>
 void dither_and_convert(const csc_args &a) {
-    if constexpr (From.u < 0) return convert<From, To>(a, dithered_luma(a, a.src_heights[0]));
+    if constexpr (From.u < 0) return luma_to_rgb<From, To>(a, dithered_luma(a, a.src_heights[0]));
 
     constexpr int32_t tail = 4;
-    if (a.src_heights[0] < tail) return convert<From, To>(a, src_lines(a, 0));
+    if (a.src_heights[0] < tail) return luma_to_rgb<From, To>(a, src_lines(a, 0));
 
     const int32_t body = a.src_heights[0] - tail;
     csc_args top = a;
     top.src_heights = &body;
-    convert<From, To>(top, dithered_luma(a, body));
+    luma_to_rgb<From, To>(top, dithered_luma(a, body));
 
     const auto last_lines = [&](int plane, int32_t height) {
         return lines_of(a.src_planes[plane], a.src_strides[plane])
@@ -138,7 +138,7 @@ void dither_and_convert(const csc_args &a) {
     bottom.src_planes = src_planes;
     bottom.src_heights = &tail;
     bottom.dst_planes = dst_planes;
-    convert<From, To>(bottom, src_lines(bottom, 0));
+    luma_to_rgb<From, To>(bottom, src_lines(bottom, 0));
 }
 
 #define DEFINE(name, from, to) \

@@ -18,7 +18,7 @@ SIMGP_BEGIN_DECLS
  *
  *     copy the plane; if height < 3 or width < 5, that is all
  *     for y = 1, 2, ... height - 2, with above, cur, below the rows y - 1, y, y + 1 of the copy
- *         for x = 2, 4, ... up to and with width - 3
+ *         for x = 2, 4, ... up to and including width - 3
  *             p = cur[x - 1], q = cur[x]
  *             cur[x + 2] += p > q ? 2 : -2
  *             below[x] and below[x + 1] += above[x] > q ? 1 : -1

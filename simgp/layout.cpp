@@ -78,7 +78,7 @@ void repeat_rows(const plane_args &a) {
 // Luma is copied. Chroma is moved between planes, or pairs and planes, the heights of which may
 // differ by a factor of two.
 template <const format &From, const format &To>
-void convert(const csc_args &a) {
+void between_layouts(const csc_args &a) {
     const auto move = [&](simgp_plane_fn *kernel, int from, int to) {
         kernel(a.src_planes[from], a.src_widths[from], a.src_heights[from], a.src_strides[from],
                a.dst_strides[to], a.dst_planes[to]);
@@ -124,5 +124,6 @@ void simgp_csc_8b8b_unpck(const uint8_t *src, int32_t width, int32_t height, int
     unpack_plane({src, src_stride}, {dst_a, stride_a}, {dst_b, stride_b}, width, height);
 }
 
-#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, convert<formats::from, formats::to>(args))
+#define DEFINE(name, from, to) \
+    SIMGP_CSC_KERNEL(name, between_layouts<formats::from, formats::to>(args))
 SIMGP_LAYOUT_KERNELS(DEFINE)

@@ -8,7 +8,7 @@ using namespace simgp;
 namespace {
 
 template <const format &From, const format &To>
-void convert(const csc_args &a) {
+void packed_to_rgb(const csc_args &a) {
     yuv_to_rgb_row *const row = yuv_to_rgb_row_of<From, To, yuv_rule::usual>(live_rows());
     walk_one_plane(a, src_lines(a, 0), From.bytes[0], dst_lines(a, 0), To.bytes[0],
                    [=](const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
@@ -19,5 +19,5 @@ void convert(const csc_args &a) {
 }  // namespace
 
 #define DEFINE(name, from, to, rule) \
-    SIMGP_CSC_KERNEL(name, convert<formats::from, formats::to>(args))
+    SIMGP_CSC_KERNEL(name, packed_to_rgb<formats::from, formats::to>(args))
 SIMGP_PACKED_TO_RGB_KERNELS(DEFINE)

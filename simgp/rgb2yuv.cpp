@@ -63,7 +63,7 @@ namespace {
 
 // Even rows give luma and the chroma of their even pixels, if a row follows; the others luma.
 template <const format &From, const format &To>
-void convert_to_yuv(const csc_args &a) {
+void rgb_to_yuv(const csc_args &a) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
     const auto &to_layout = live_rows().rgb2yuv.row[size_t(From.packing)];
@@ -80,7 +80,7 @@ void convert_to_yuv(const csc_args &a) {
 }
 
 template <const format &From, const format &To>
-void convert_to_rgb565(const csc_args &a) {
+void rgb_to_rgb565(const csc_args &a) {
     walk_one_plane(a, whole_pixel_lines(src_lines(a, 0), From.bytes[0]), From.bytes[0],
                    whole_pixel_lines(dst_lines(a, 0), To.bytes[0]), To.bytes[0],
                    live_rows().rgb2yuv.to_rgb565[size_t(From.packing)]);
@@ -91,10 +91,9 @@ void convert_to_rgb565(const csc_args &a) {
 
 using namespace simgp;
 
-#define DEFINE(name, from, to) \
-    SIMGP_CSC_KERNEL(name, convert_to_yuv<formats::from, formats::to>(args))
+#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, rgb_to_yuv<formats::from, formats::to>(args))
 SIMGP_RGB_TO_YUV_KERNELS(DEFINE)
 #undef DEFINE
 #define DEFINE(name, from, to) \
-    SIMGP_CSC_KERNEL(name, convert_to_rgb565<formats::from, formats::to>(args))
+    SIMGP_CSC_KERNEL(name, rgb_to_rgb565<formats::from, formats::to>(args))
 SIMGP_RGB_TO_RGB565_KERNELS(DEFINE)

@@ -138,8 +138,8 @@ constexpr mid_grey no_chroma;
 
 // The part of a tile goes through whole tiles on the stack, some rows at a time.
 template <ptrdiff_t PixelBytes>
-void convert_part(tile_to_rgb_rows *convert_tile, const uint8_t *luma, const uint8_t *chroma,
-                  const lines &out, const block &b) {
+void part_to_rgb(tile_to_rgb_rows *to_rgb_rows, const uint8_t *luma, const uint8_t *chroma,
+                 const lines &out, const block &b) {
     constexpr ptrdiff_t step = 8, stride = tile_width * PixelBytes;
     uint8_t y[step * tile_width] = {}, pairs[step / 2 * tile_width] = {}, pixels[step * stride];
     for (ptrdiff_t r = 0; r < b.height; r += step) {
@@ -147,15 +147,15 @@ void convert_part(tile_to_rgb_rows *convert_tile, const uint8_t *luma, const uin
         copy_lines({luma + tile_width * r, tile_width}, {y, tile_width}, b.width, height);
         copy_lines({chroma + tile_width * (r / 2), tile_width}, {pairs, tile_width},
                    (b.width + 1) & ~1, (height + 1) / 2);
-        convert_tile(y, pairs, pixels, stride, height);
+        to_rgb_rows(y, pairs, pixels, stride, height);
         copy_lines({pixels, stride}, out.from(0, r), b.width * PixelBytes, height);
     }
 }
 
 template <const format &To>
-void convert_to_rgb(const csc_args &a) {
+void tiles_to_rgb(const csc_args &a) {
     constexpr ptrdiff_t pixel_bytes = To.bytes[0];
-    tile_to_rgb_rows *const convert_tile = live_rows().tile.to_rgb[size_t(To.packing)];
+    tile_to_rgb_rows *const to_rgb_rows = live_rows().tile.to_rgb[size_t(To.packing)];
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     const ptrdiff_t chroma_height = height >> 1;
     const ptrdiff_t chroma_tile_rows = (chroma_height + tile_height - 1) / tile_height;
@@ -169,15 +169,15 @@ void convert_to_rgb(const csc_args &a) {
             line < 0 ? no_chroma.pairs
                      : a.src_planes[1] + tile_offset(width, chroma_height, b.x, line);
         const lines out = dst.from(b.x * pixel_bytes, b.y);
-        if (is_whole(b)) return convert_tile(luma, chroma, out.first, out.stride, b.height);
-        convert_part<pixel_bytes>(convert_tile, luma, chroma, out, b);
+        if (is_whole(b)) return to_rgb_rows(luma, chroma, out.first, out.stride, b.height);
+        part_to_rgb<pixel_bytes>(to_rgb_rows, luma, chroma, out, b);
     });
 }
 
 // Between tiles and linear planes of 4:2:0. Chroma has as many bytes a row as luma, and half the
 // rows, rounded down.
 template <const format &From, const format &To>
-void convert(const csc_args &a) {
+void between_tiles(const csc_args &a) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if constexpr (From.kind == format_kind::tiled) {
         copy_to_linear(a.src_planes[0], width, height, dst_lines(a, 0));
@@ -214,8 +214,9 @@ void simgp_csc_unpack_tiles_to_linear(const uint8_t *src, int32_t width, int32_t
     unpack_to_linear(src, width, height, {dst_u, stride_u}, {dst_v, stride_v});
 }
 
-#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, convert_to_rgb<formats::to>(args))
+#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, tiles_to_rgb<formats::to>(args))
 SIMGP_TILE_TO_RGB_KERNELS(DEFINE)
 #undef DEFINE
-#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, convert<formats::from, formats::to>(args))
+#define DEFINE(name, from, to) \
+    SIMGP_CSC_KERNEL(name, between_tiles<formats::from, formats::to>(args))
 SIMGP_TILE_KERNELS(DEFINE)

@@ -56,7 +56,7 @@ struct rgb_to_yuv_step {
     static constexpr int chroma_size = planar ? 1 : 2;
 
     static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + from::size * x; }
-    static void convert(const yuv_row_out &out, ptrdiff_t x, const uint8_t *pixels) {
+    static void write(const yuv_row_out &out, ptrdiff_t x, const uint8_t *pixels) {
         const rgb_v p = from::load(pixels);
         store(out.y + x, matrix::luma(p));
         if constexpr (Layout == yuv_layout::grey) return;
@@ -72,7 +72,7 @@ struct rgb_to_yuv_step {
     static void part(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x, int count) {
         uint8_t pixels[bytes * from::size] = {}, y[bytes], u[bytes], v[bytes];
         memcpy(pixels, in + from::size * x, size_t(count) * from::size);
-        convert({y, u, v}, 0, pixels);
+        write({y, u, v}, 0, pixels);
         memcpy(out.y + x, y, size_t(count));
         if (const size_t chroma = size_t(count / 2); pixels_in_pairs && chroma) {
             memcpy(out.u + chroma_size * (x / 2), u, chroma * chroma_size);
@@ -90,7 +90,7 @@ struct rgb_to_rgb565_step {
     static_assert(size >= 3 && at.r == 0 && at.g == 1 && at.b == 2);
 
     static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + size * x; }
-    static void convert(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
+    static void write(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
         if constexpr (four_bytes)
             repack_8888_to_565(out + 2 * x, pixels);
         else
@@ -99,7 +99,7 @@ struct rgb_to_rgb565_step {
     static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
         uint8_t pixels[bytes * size] = {}, words[2 * bytes];
         memcpy(pixels, in + size * x, size_t(count) * size);
-        convert(words, 0, pixels);
+        write(words, 0, pixels);
         memcpy(out + 2 * x, words, 2 * size_t(count));
     }
 };

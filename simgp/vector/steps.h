@@ -9,7 +9,7 @@ namespace simgp::SIMD_TARGET {
 // A Step converts `bytes` pixels at a time:
 //   pixels_in_pairs         whether a step must begin at an even pixel
 //   load(in, x)             the samples of pixels x ... x + bytes - 1
-//   convert(out, x, those)  stores the pixels at their places
+//   write(out, x, those)    computes the pixels and stores them at their places
 //   part(in, out, x, n)     converts n <= bytes pixels from x on and touches nothing else
 // In and Out are whatever the Step reads and writes: a few pointers.
 //
@@ -29,7 +29,7 @@ inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
     for (;;) {
         const ptrdiff_t next = x + 2 * bytes <= whole ? x + bytes : whole - bytes;
         const auto ahead = Step::load(in, next);
-        Step::convert(out, x, pixels);
+        Step::write(out, x, pixels);
         if (next == x) break;
         x = next;
         pixels = ahead;

@@ -16,7 +16,7 @@ inline void part_through_stack(const samples &in, uint8_t *out, ptrdiff_t x, int
     staged to;
     uint8_t pixels[bytes * Step::size];
     Step::stage(to, in, x, count);
-    Step::convert(pixels, 0, Step::load(to.all(), 0));
+    Step::write(pixels, 0, Step::load(to.all(), 0));
     memcpy(out + x * Step::size, pixels, size_t(count) * Step::size);
 }
 
@@ -42,11 +42,11 @@ struct yuv_step : source<Layout> {
         to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c.even),
                   Matrix::apply(Matrix::luma_odd(y), c.odd));
     }
-    static void convert(uint8_t *out, ptrdiff_t x, const yuv_half &p) {
+    static void write(uint8_t *out, ptrdiff_t x, const yuv_half &p) {
         apply(out, x, p.y, terms(p));
     }
     // In this order, since the terms of even and odd pixels together would not fit 16 registers.
-    static void convert(uint8_t *out, ptrdiff_t x, const yuv_full &p) {
+    static void write(uint8_t *out, ptrdiff_t x, const yuv_full &p) {
         const auto even = Matrix::apply(Matrix::luma_even(p.y),
                                         Matrix::template chroma<from::pairs>(p.pairs_even));
         const auto odd =
@@ -79,7 +79,7 @@ struct pair_step : Step {
             Step::load(in.first, x), load_luma<Step::to::order>(in.second_y, x)};
     }
     template <class Pixels>
-    static void convert(const out_pair &out, ptrdiff_t x, const Pixels &p) {
+    static void write(const out_pair &out, ptrdiff_t x, const Pixels &p) {
         const auto terms = Step::terms(p.first);
         Step::apply(out.first, x, p.first.y, terms);
         Step::apply(out.second, x, p.second_y, terms);
@@ -101,7 +101,7 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
     static void stage(staged &to, const samples &in, ptrdiff_t x, int count) {
         memcpy(to.y, in.y + x, size_t(count));
     }
-    static void convert(uint8_t *out, ptrdiff_t x, u8v y) {
+    static void write(uint8_t *out, ptrdiff_t x, u8v y) {
         const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
         const u16v w = as_u16(y);
         store_zip8(out + x * size, bit_or(bits(shl<3>(w), 0xE0), bits(shr<3>(w), 0x1F)),
