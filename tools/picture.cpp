@@ -1,7 +1,10 @@
 #include "tools/picture.h"
 
+#include <array>
 #include <charconv>
+#include <iterator>
 
+#include "simgp/formats.h"
 #include "tools/fault.h"
 
 namespace tools {
@@ -10,69 +13,43 @@ namespace {
 
 using family = pixel_format::family;
 
-// Planes of their own for each channel; `u` is the plane of U.
-constexpr pixel_format planar(int32_t code, std::string_view name, int x_shift, int y_shift,
-                              int u = 1) {
-    const plane_shape chroma = {1, x_shift, y_shift};
-    return {code,
-            name,
-            family::planar,
-            3,
-            {{1, 0, 0}, chroma, chroma},
-            {{0, 0, 1, 0, 0}, {u, 0, 1, x_shift, y_shift}, {3 - u, 0, 1, x_shift, y_shift}}};
+// A format of the library's table, with the places of the channels that its layout means.
+constexpr pixel_format described(const simgp::coded_format &coded) {
+    using simgp::format_kind;
+    using simgp::yuv_layout;
+    const simgp::format &f = *coded.is;
+    pixel_format d{coded.code, f.name, family::planar, f.planes, {}, {}};
+    for (int k = 0; k < f.planes; ++k) d.planes[k] = {f.bytes[k], f.x_shift[k], f.y_shift[k]};
+    if (f.kind == format_kind::rgb) {
+        const simgp::pixel_bytes at = simgp::pixels_of[size_t(f.packing)];
+        d.kind = at.size == 2 ? family::rgb16 : family::rgb;
+        if (at.size == 2) return d;
+        const int first[] = {at.r, at.g, at.b};
+        for (int c = 0; c < 3; ++c) d.channels[c] = {0, first[c], at.size, 0, 0};
+    } else if (f.kind == format_kind::tiled) {
+        d.kind = family::tiled;
+    } else if (f.kind == format_kind::packed) {
+        d.kind = family::packed;
+        const int y = f.layout == yuv_layout::uyvy ? 1 : 0, u = 1 - y;
+        d.channels[0] = {0, y, 2, 0, 0};
+        d.channels[1] = {0, u, 4, 1, 0};
+        d.channels[2] = {0, u + 2, 4, 1, 0};
+    } else {
+        d.channels[0] = {0, 0, 1, 0, 0};
+        for (int c = 1; c < 3 && f.u >= 0; ++c) {
+            const int plane = c == 1 ? f.u : f.v;
+            const bool second = c == 1 ? f.layout == yuv_layout::vu : f.layout == yuv_layout::uv;
+            d.channels[c] = {plane, second, f.bytes[plane], f.x_shift[plane], f.y_shift[plane]};
+        }
+    }
+    return d;
 }
 
-// 4:2:0 with pairs of chroma in one plane; `u` is the byte of U in a pair.
-constexpr pixel_format semi_planar(int32_t code, std::string_view name, int u) {
-    return {code,
-            name,
-            family::planar,
-            2,
-            {{1, 0, 0}, {2, 1, 1}},
-            {{0, 0, 1, 0, 0}, {1, u, 2, 1, 1}, {1, 1 - u, 2, 1, 1}}};
-}
-
-// 4:2:2 in groups of four bytes; `y` and `u` are the places of the first Y and of U in a group.
-constexpr pixel_format packed(int32_t code, std::string_view name, int y, int u) {
-    return {code, name,        family::packed,
-            1,    {{2, 0, 0}}, {{0, y, 2, 0, 0}, {0, u, 4, 1, 0}, {0, u + 2, 4, 1, 0}}};
-}
-
-constexpr pixel_format rgb16(int32_t code, std::string_view name) {
-    return {code, name, family::rgb16, 1, {{2, 0, 0}}, {}};
-}
-
-// `bytes` bytes a pixel, with R, G and B at the places r, g and b.
-constexpr pixel_format rgb(int32_t code, std::string_view name, int bytes, int r, int g, int b) {
-    return {code,
-            name,
-            family::rgb,
-            1,
-            {{bytes, 0, 0}},
-            {{0, r, bytes, 0, 0}, {0, g, bytes, 0, 0}, {0, b, bytes, 0, 0}}};
-}
-
-constexpr pixel_format table[] = {
-    {SIMGP_FMT_YUV400, "yuv400", family::planar, 1, {{1, 0, 0}}, {{0, 0, 1, 0, 0}}},
-    planar(SIMGP_FMT_YUV420, "yuv420", 1, 1),
-    planar(SIMGP_FMT_YUV422N, "yuv422n", 1, 0),
-    planar(SIMGP_FMT_YUV444, "yuv444", 0, 0),
-    planar(SIMGP_FMT_YV12, "yv12", 1, 1, 2),
-    planar(SIMGP_FMT_YV16, "yv16", 1, 0, 2),
-    semi_planar(SIMGP_FMT_NV12, "nv12", 0),
-    semi_planar(SIMGP_FMT_NV21, "nv21", 1),
-    planar(SIMGP_FMT_YUV422W, "yuv422w", 0, 1),
-    {SIMGP_FMT_T64X32, "t64x32", family::tiled, 2, {{1, 0, 0}, {2, 1, 1}}, {}},
-    packed(SIMGP_FMT_UYVY, "uyvy", 1, 0),
-    packed(SIMGP_FMT_YUYV, "yuyv", 0, 1),
-    rgb16(SIMGP_FMT_RGB565, "rgb565"),
-    rgb16(SIMGP_FMT_BGR565, "bgr565"),
-    rgb(SIMGP_FMT_RGB888, "rgb888", 3, 0, 1, 2),
-    rgb(SIMGP_FMT_BGR888, "bgr888", 3, 2, 1, 0),
-    rgb(SIMGP_FMT_RGBA8888, "rgba8888", 4, 0, 1, 2),
-    rgb(SIMGP_FMT_BGRA8888, "bgra8888", 4, 2, 1, 0),
-    rgb(SIMGP_FMT_ARGB8888, "argb8888", 4, 1, 2, 3),
-};
+constexpr auto table = [] {
+    std::array<pixel_format, std::size(simgp::coded_formats)> all{};
+    for (size_t i = 0; i < all.size(); ++i) all[i] = described(simgp::coded_formats[i]);
+    return all;
+}();
 
 int even(int n) { return n + (n & 1); }
 int shifted_up(int n, int shift) { return (n + (1 << shift) - 1) >> shift; }

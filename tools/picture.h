@@ -26,8 +26,7 @@ struct channel {
     int plane, first, step, x_shift, y_shift;
 };
 
-// All that the tools know about the layout of a format, so that a new one is a line of the table in
-// picture.cpp. Only the bits of 16-bit RGB are the business of rgb.cpp.
+// All that the tools know about the layout of a format, made from the library's own table. Only the bits of 16-bit RGB are the business of rgb.cpp.
 struct pixel_format {
     enum class family { planar, packed, tiled, rgb16, rgb };
 
