@@ -158,13 +158,20 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
 
-inline void store_zip8(uint8_t *p, u8v even, u8v odd) { vst2q_u8(p, uint8x16x2_t{{even, odd}}); }
+// Some compilers have macros for stores of several vectors, which take no braces: hence the names.
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
+    const uint8x16x2_t v = {{even, odd}};
+    vst2q_u8(p, v);
+}
 inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
     const uint16x8x2_t zip = vzipq_u16(even, odd);
     vst1q_u8(p, as_u8(zip.val[0]));
     vst1q_u8(p + bytes, as_u8(zip.val[1]));
 }
-inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) { vst3q_u8(p, uint8x16x3_t{{a, b, c}}); }
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+    const uint8x16x3_t v = {{a, b, c}};
+    vst3q_u8(p, v);
+}
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
                               s16v c_even, s16v c_odd) {
@@ -172,7 +179,8 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
                narrow_join<C>(c_even, c_odd));
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
-    vst4q_u8(p, uint8x16x4_t{{a, b, c, d}});
+    const uint8x16x4_t v = {{a, b, c, d}};
+    vst4q_u8(p, v);
 }
 
 inline u8v join_high(u16v a, u16v b) { return as_u8(vsriq_n_u16(b, a, 8)); }
@@ -216,7 +224,8 @@ inline u16v even_dot(rgb_v v) {
 }
 inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
     const u8v low = vsriq_n_u8(vshlq_n_u8(b, 3), c, 3);
-    vst2q_u8(p, uint8x16x2_t{{low, vsriq_n_u8(a, b, 5)}});
+    const uint8x16x2_t v = {{low, vsriq_n_u8(a, b, 5)}};
+    vst2q_u8(p, v);
 }
 inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
     const uint8x16x3_t v = vld3q_u8(q);
