@@ -7,6 +7,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "simd/limits.h"
+
 namespace simgp::avx512 {
 
 inline constexpr int bytes = 64;
@@ -52,14 +54,17 @@ inline u8v bit_or(u8v a, u8v b) { return _mm512_or_si512(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm512_xor_si512(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm512_slli_epi16(a, N);
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm512_srli_epi16(a, N);
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return _mm512_srai_epi16(a, N);
 }
 
@@ -87,10 +92,9 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
-    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    static_assert(limits::centred_pair<A, B>);
     constexpr bool negative = A < 0 || B < 0;
     constexpr int a = negative ? -A : A, b = negative ? -B : B;
-    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
     const __m512i centred = _mm512_xor_si512(v, _mm512_set1_epi8(-128));
     const __m512i dot =
         _mm512_maddubs_epi16(_mm512_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
@@ -100,12 +104,14 @@ inline s16v pair_dot(u8v v) {
 // K v / 2 = (256 v)(128 K) >> 16.
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm512_add_epi16(
         _mm512_mulhi_epu16(_mm512_and_si512(v, set_u16(0xFF00)), set_u16(128 * K)),
         set_u16(static_cast<uint16_t>(C)));
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm512_add_epi16(_mm512_mulhi_epu16(_mm512_slli_epi16(v, 8), set_u16(128 * K)),
                             set_u16(static_cast<uint16_t>(C)));
 }
@@ -122,6 +128,7 @@ inline u16v odd(u8v v) { return _mm512_srli_epi16(v, 8); }
 inline u8v join(u16v even, u16v odd) { return _mm512_or_si512(even, _mm512_slli_epi16(odd, 8)); }
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     const __m512i halves =
         _mm512_packus_epi16(_mm512_srai_epi16(even, N), _mm512_srai_epi16(odd, N));
     return _mm512_shuffle_epi8(halves, _mm512_broadcast_i32x4(_mm_setr_epi8(
@@ -236,6 +243,7 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = 
 
 template <int N>
 inline __m512i pack(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     return _mm512_packus_epi16(_mm512_srai_epi16(even, N), _mm512_srai_epi16(odd, N));
 }
 template <int A, int B, int C>
@@ -323,18 +331,19 @@ inline rgb_v load_888(const uint8_t *p) {
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline __m512i dot(__m512i ac, __m512i b) {
-    static_assert(A >= -128 && A <= 127 && C >= -128 && C <= 127 && A + C >= -128 && A + C <= 127);
     const __m512i pair =
         _mm512_maddubs_epi16(ac, _mm512_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
     return _mm512_add_epi16(pair, _mm512_mullo_epi16(b, _mm512_set1_epi16(B)));
 }
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     return _mm512_add_epi8(
         join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     return _mm512_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 

@@ -18,6 +18,8 @@
 #include <stdint.h>
 #include <string.h>
 
+#include "simd/limits.h"
+
 #ifndef SIMD_LANES_BYTES
 #define SIMD_LANES_BYTES 32
 #define SIMD_LANES_NAMESPACE lanes
@@ -104,7 +106,7 @@ inline int first_zero(u8v v) {
     return i;
 }
 
-// Bits.
+// Bits. Counts of shifts are 1 ... 15.
 inline u8v bit_and(u8v a, u8v b) {
     return make<u8v>([&](int i) { return a.lane[i] & b.lane[i]; });
 }
@@ -122,14 +124,17 @@ inline u16v bit_or(u16v a, u16v b) {
 }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return make<u16v>([&](int i) { return uint16_t(a.lane[i] << N); });
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return make<u16v>([&](int i) { return a.lane[i] >> N; });
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return make<s16v>([&](int i) { return a.lane[i] >> N; });
 }
 
@@ -186,9 +191,10 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &s) {
 }
 
 // A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the
-// same sign and at most 255 in size, and the sum of the two products fits 16 bits.
+// same sign, and A + B is at most 255 in size.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
+    static_assert(limits::centred_pair<A, B>);
     return make<s16v>([&](int i) {
         return int16_t(A * (v.lane[2 * i] - 128) + B * (v.lane[2 * i + 1] - 128) + C);
     });
@@ -197,10 +203,12 @@ inline s16v pair_dot(u8v v) {
 // the low byte.
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i + 1] >> 1) + C); });
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i] >> 1) + C); });
 }
 // 256 (low byte - 128) of each byte pair.
@@ -224,9 +232,11 @@ inline u16v odd(u8v v) {
 inline u8v join(u16v even, u16v odd) {
     return make<u8v>([&](int i) { return (i & 1 ? odd : even).lane[i / 2]; });
 }
-// Byte 2i = clamp(even lane i >> N), byte 2i + 1 = clamp(odd lane i >> N), to 0 ... 255.
+// Byte 2i = clamp(even lane i >> N), byte 2i + 1 = clamp(odd lane i >> N), to 0 ... 255; N is
+// 1 ... 8.
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     return make<u8v>(
         [&](int i) { return clamp_to(0, 255, (i & 1 ? odd : even).lane[i / 2] >> N); });
 }
@@ -239,15 +249,15 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
     });
 }
 
-// Orders of pixels, see above.
+// Changes of the order of pixels. From natural order: part k of block j, a granule of Granule bytes,
+// is granule k blocks + j of v.
 template <int Granule>
 inline u8v natural_to(u8v v) {
-    constexpr int parts = 16 / Granule;
+    static_assert(limits::granule<Granule>);
     return make<u8v>([&](int i) {
         const int block = i / 16, part = i % 16 / Granule;
         return v.lane[(part * blocks + block) * Granule + i % Granule];
     });
-    static_assert(parts * Granule == 16);
 }
 inline u8v natural_to_by8(u8v v) { return natural_to<8>(v); }
 inline u8v natural_to_by4(u8v v) { return natural_to<4>(v); }
@@ -258,8 +268,8 @@ inline u8v by8_to_natural(u8v v) {
     });
 }
 
-// 2 bytes bytes, split: byte 2i and 2i + 1 of memory are byte i of even and odd. load_split gives
-// by8 order, the others that of their names.
+// Twice `bytes` bytes of memory, split: bytes 2i and 2i + 1 are byte i of even and of odd.
+// load_split gives by8 order, the others that of their names.
 struct pair_u8 {
     u8v even, odd;
 };
@@ -344,9 +354,10 @@ inline rgb_v load_888(const uint8_t *p) {
 }
 
 // ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, their sum is at
-// most 256, and A + C <= 127.
+// most 256, A + C <= 127, and B <= 255.
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     return make<u8v>([&](int i) {
         return ((A * v.c[0].lane[i] + B * v.c[1].lane[i] + C * v.c[2].lane[i]) >> 8) + D;
     });
@@ -355,6 +366,7 @@ inline u8v dot_high(rgb_v v) {
 // -128 ... 127, B in -255 ... 255.
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     return make<u16v>([&](int i) {
         return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
     });

@@ -7,6 +7,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "simd/limits.h"
+
 namespace simgp::neon {
 
 inline constexpr int bytes = 16;
@@ -50,14 +52,17 @@ inline u16v bit_and(u16v a, u16v b) { return vandq_u16(a, b); }
 inline u16v bit_or(u16v a, u16v b) { return vorrq_u16(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return vshlq_n_u16(a, N);
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return vshrq_n_u16(a, N);
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return vshrq_n_s16(a, N);
 }
 
@@ -102,6 +107,7 @@ inline u8v join(u16v even, u16v odd) { return as_u8(vsliq_n_u16(even, odd, 8)); 
 // The offsets of 128 go into the constant, and the products are accumulated on it.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
+    static_assert(limits::centred_pair<A, B>);
     s16v sum = vdupq_n_s16(static_cast<int16_t>(C - 128 * (A + B)));
     if constexpr (A != 0) sum = vmlaq_n_s16(sum, as_s16(even(v)), A);
     if constexpr (B != 0) sum = vmlaq_n_s16(sum, as_s16(odd(v)), B);
@@ -114,10 +120,12 @@ inline s16v half_product(u16v v) {
 }
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return half_product<K, C>(odd(v));
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return half_product<K, C>(even(v));
 }
 inline s16v low_minus_128_shl8(u8v v) {
@@ -129,6 +137,7 @@ inline s16v high_minus_128_shl8(u8v v) {
 
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     const uint8x8x2_t zip = vzip_u8(vqshrun_n_s16(even, N), vqshrun_n_s16(odd, N));
     return vcombine_u8(zip.val[0], zip.val[1]);
 }
@@ -205,6 +214,7 @@ inline u16v add_product(u16v sum, uint8x8_t x) {
 }
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     const auto half = [](uint8x8_t c0, uint8x8_t c1, uint8x8_t c2) {
         const u16v sum = vmull_u8(c0, vdup_n_u8(A));
         return vshrn_n_u16(add_product<C>(add_product<B>(sum, c1), c2), 8);
@@ -216,6 +226,7 @@ inline u8v dot_high(rgb_v v) {
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     const auto evens = [](u8v c) { return vmovn_u16(as_u16(c)); };
     u16v sum = vdupq_n_u16(static_cast<uint16_t>(D));
     sum = add_product<A>(sum, evens(v.val[0]));
