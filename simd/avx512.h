@@ -34,8 +34,31 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return _mm512_or_si512(widen(p), _mm512_slli_epi16(widen(q), 8));
 }
 
+// Inserted from memory, a block needs no permutation: hence one after the other.
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
+    const auto block = [=](int j) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + j * step));
+    };
+    __m512i v = _mm512_castsi128_si512(block(0));
+    v = _mm512_inserti32x4(v, block(1), 1);
+    v = _mm512_inserti32x4(v, block(2), 2);
+    return _mm512_inserti32x4(v, block(3), 3);
+}
+// Extracted to memory from the lower or the upper half, a block needs no permutation either.
+inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
+    const auto put = [=](int j, __m128i block) {
+        _mm_storeu_si128(reinterpret_cast<__m128i *>(p + j * step), block);
+    };
+    const __m256i low = _mm512_castsi512_si256(v), high = _mm512_extracti64x4_epi64(v, 1);
+    put(0, _mm256_castsi256_si128(low));
+    put(1, _mm256_extracti128_si256(low, 1));
+    put(2, _mm256_castsi256_si128(high));
+    put(3, _mm256_extracti128_si256(high, 1));
+}
+
 inline u8v set_u8(uint8_t x) { return _mm512_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm512_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return set_u16(uint16_t(b << 8 | a)); }
 inline u8v set_u32(uint32_t x) { return _mm512_set1_epi32(static_cast<int>(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) {
@@ -44,6 +67,12 @@ inline void store_stream(uint8_t *p, u8v v) {
 inline void stream_end() { _mm_sfence(); }
 
 inline u8v min_u8(u8v a, u8v b) { return _mm512_min_epu8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return _mm512_max_epu8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return _mm512_avg_epu8(a, b); }
+// One of the two differences is 0.
+inline u8v absdiff_u8(u8v a, u8v b) {
+    return _mm512_or_si512(_mm512_subs_epu8(a, b), _mm512_subs_epu8(b, a));
+}
 inline int first_zero(u8v v) {
     const uint64_t zero = _mm512_testn_epi8_mask(v, v);
     return zero ? __builtin_ctzll(zero) : bytes;
@@ -70,6 +99,10 @@ inline s16v sar(s16v a) {
 
 inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }
+inline s16v sub(s16v a, s16v b) { return _mm512_sub_epi16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return _mm512_min_epi16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return _mm512_max_epi16(a, b); }
+inline u16v mul(u16v a, u16v b) { return _mm512_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm512_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm512_subs_epu8(a, b); }
@@ -88,6 +121,8 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
     carry = sum >> 32;
     return static_cast<uint32_t>(sum) ^ x ^ y ^ ~odd;
 }
+
+inline u16v dot_pairs(u8v samples, u8v weights) { return _mm512_maddubs_epi16(samples, weights); }
 
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
@@ -134,6 +169,40 @@ inline u8v narrow_join(s16v even, s16v odd) {
     return _mm512_shuffle_epi8(halves, _mm512_broadcast_i32x4(_mm_setr_epi8(
                                            0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15)));
 }
+
+inline u16v widen_low(u8v v) { return _mm512_unpacklo_epi8(v, _mm512_setzero_si512()); }
+inline u16v widen_high(u8v v) { return _mm512_unpackhi_epi8(v, _mm512_setzero_si512()); }
+inline u8v narrow(s16v low, s16v high) { return _mm512_packus_epi16(low, high); }
+
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm512_unpacklo_epi8(a, b);
+    if constexpr (N == 2) return _mm512_unpacklo_epi16(a, b);
+    if constexpr (N == 4) return _mm512_unpacklo_epi32(a, b);
+    if constexpr (N == 8) return _mm512_unpacklo_epi64(a, b);
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm512_unpackhi_epi8(a, b);
+    if constexpr (N == 2) return _mm512_unpackhi_epi16(a, b);
+    if constexpr (N == 4) return _mm512_unpackhi_epi32(a, b);
+    if constexpr (N == 8) return _mm512_unpackhi_epi64(a, b);
+}
+inline u8v shuffle(u8v v, u8v index) { return _mm512_shuffle_epi8(v, index); }
+struct reverse_index {
+    alignas(64) uint8_t u8[64], u16[64];
+    constexpr reverse_index() : u8(), u16() {
+        for (int i = 0; i < 64; i++) {
+            u8[i] = static_cast<uint8_t>(63 - i);
+            u16[i] = static_cast<uint8_t>((63 - i) ^ 1);
+        }
+    }
+};
+inline constexpr reverse_index reverse_order;
+inline u8v reverse_u8(u8v v) { return _mm512_permutexvar_epi8(load(reverse_order.u8), v); }
+inline u8v reverse_u16(u8v v) { return _mm512_permutexvar_epi8(load(reverse_order.u16), v); }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {
     constexpr int select = 0xCA;  // first ? second : third, bit by bit

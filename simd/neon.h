@@ -30,14 +30,21 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return vcombine_u8(zip.val[0], zip.val[1]);
 }
 
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
+inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
+
 inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
 inline u16v set_u16(uint16_t x) { return vdupq_n_u16(x); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return as_u8(set_u16(uint16_t(b << 8 | a))); }
 inline u8v set_u32(uint32_t x) { return vreinterpretq_u8_u32(vdupq_n_u32(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) { store(p, v); }
 inline void stream_end() {}
 
 inline u8v min_u8(u8v a, u8v b) { return vminq_u8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return vmaxq_u8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return vrhaddq_u8(a, b); }
+inline u8v absdiff_u8(u8v a, u8v b) { return vabdq_u8(a, b); }
 inline int first_zero(u8v v) {
     // Four bits for each byte, in one 64-bit word.
     const uint8x8_t zero = vshrn_n_u16(as_u16(vceqq_u8(v, vdupq_n_u8(0))), 4);
@@ -68,6 +75,10 @@ inline s16v sar(s16v a) {
 
 inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }
+inline s16v sub(s16v a, s16v b) { return vsubq_s16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
+inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return vqsubq_u8(a, b); }
@@ -103,6 +114,17 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
 inline u16v even(u8v v) { return vandq_u16(as_u16(v), vdupq_n_u16(255)); }
 inline u16v odd(u8v v) { return vshrq_n_u16(as_u16(v), 8); }
 inline u8v join(u16v even, u16v odd) { return as_u8(vsliq_n_u16(even, odd, 8)); }
+
+inline u16v dot_pairs(u8v samples, u8v weights) {
+    const u16v low = vmull_u8(vget_low_u8(samples), vget_low_u8(weights));
+#ifdef __aarch64__
+    return vpaddq_u16(low, vmull_high_u8(samples, weights));
+#else
+    const u16v high = vmull_u8(vget_high_u8(samples), vget_high_u8(weights));
+    return vcombine_u16(vpadd_u16(vget_low_u16(low), vget_high_u16(low)),
+                        vpadd_u16(vget_low_u16(high), vget_high_u16(high)));
+#endif
+}
 
 // The offsets of 128 go into the constant, and the products are accumulated on it.
 template <int A, int B, int C>
@@ -140,6 +162,56 @@ inline u8v narrow_join(s16v even, s16v odd) {
     static_assert(limits::narrowing_shift<N>);
     const uint8x8x2_t zip = vzip_u8(vqshrun_n_s16(even, N), vqshrun_n_s16(odd, N));
     return vcombine_u8(zip.val[0], zip.val[1]);
+}
+
+inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
+inline u16v widen_high(u8v v) { return vmovl_u8(vget_high_u8(v)); }
+inline u8v narrow(s16v low, s16v high) { return vcombine_u8(vqmovun_s16(low), vqmovun_s16(high)); }
+
+// 32-bit ARM interleaves whole vectors with one instruction; of a pair zip_low and zip_high of the
+// same vectors the compiler makes one.
+#ifdef __aarch64__
+#define SIMD_ZIP(low_or_high, lane, a, b) vzip##low_or_high##q_##lane(a, b)
+#else
+#define SIMD_ZIP(low_or_high, lane, a, b) vzipq_##lane(a, b).val[low_or_high - 1]
+#endif
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return SIMD_ZIP(1, u8, a, b);
+    if constexpr (N == 2) return as_u8(SIMD_ZIP(1, u16, as_u16(a), as_u16(b)));
+    if constexpr (N == 4)
+        return vreinterpretq_u8_u32(
+            SIMD_ZIP(1, u32, vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
+    if constexpr (N == 8) return vcombine_u8(vget_low_u8(a), vget_low_u8(b));
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return SIMD_ZIP(2, u8, a, b);
+    if constexpr (N == 2) return as_u8(SIMD_ZIP(2, u16, as_u16(a), as_u16(b)));
+    if constexpr (N == 4)
+        return vreinterpretq_u8_u32(
+            SIMD_ZIP(2, u32, vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
+    if constexpr (N == 8) return vcombine_u8(vget_high_u8(a), vget_high_u8(b));
+}
+#undef SIMD_ZIP
+inline u8v shuffle(u8v v, u8v index) {
+#ifdef __aarch64__
+    return vqtbl1q_u8(v, index);
+#else
+    const uint8x8x2_t table = {{vget_low_u8(v), vget_high_u8(v)}};
+    return vcombine_u8(vtbl2_u8(table, vget_low_u8(index)), vtbl2_u8(table, vget_high_u8(index)));
+#endif
+}
+// Each half reversed, then the halves exchanged.
+inline u8v reverse_u8(u8v v) {
+    const u8v halves = vrev64q_u8(v);
+    return vextq_u8(halves, halves, 8);
+}
+inline u8v reverse_u16(u8v v) {
+    const u8v halves = as_u8(vrev64q_u16(as_u16(v)));
+    return vextq_u8(halves, halves, 8);
 }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {

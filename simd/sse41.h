@@ -30,14 +30,24 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
                              _mm_loadl_epi64(reinterpret_cast<const __m128i *>(q)));
 }
 
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
+inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
+
 inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return set_u16(uint16_t(b << 8 | a)); }
 inline u8v set_u32(uint32_t x) { return _mm_set1_epi32(static_cast<int>(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) { _mm_stream_si128(reinterpret_cast<__m128i *>(p), v); }
 inline void stream_end() { _mm_sfence(); }
 
 inline u8v min_u8(u8v a, u8v b) { return _mm_min_epu8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return _mm_max_epu8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return _mm_avg_epu8(a, b); }
+// One of the two differences is 0.
+inline u8v absdiff_u8(u8v a, u8v b) {
+    return _mm_or_si128(_mm_subs_epu8(a, b), _mm_subs_epu8(b, a));
+}
 inline int first_zero(u8v v) {
     const unsigned zero =
         static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(v, _mm_setzero_si128())));
@@ -65,6 +75,10 @@ inline s16v sar(s16v a) {
 
 inline s16v add(s16v a, s16v b) { return _mm_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm_adds_epi16(a, b); }
+inline s16v sub(s16v a, s16v b) { return _mm_sub_epi16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return _mm_min_epi16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return _mm_max_epi16(a, b); }
+inline u16v mul(u16v a, u16v b) { return _mm_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm_subs_epu8(a, b); }
@@ -91,6 +105,8 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
     const __m128i odd_bit = _mm_set1_epi64x(0x4040000004040000);
     return _mm_cmpeq_epi8(_mm_and_si128(s, bit), odd_bit);
 }
+
+inline u16v dot_pairs(u8v samples, u8v weights) { return _mm_maddubs_epi16(samples, weights); }
 
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
@@ -134,6 +150,34 @@ inline u8v narrow_join(s16v even, s16v odd) {
     const __m128i halves = _mm_packus_epi16(_mm_srai_epi16(even, N), _mm_srai_epi16(odd, N));
     return _mm_shuffle_epi8(halves,
                             _mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15));
+}
+
+inline u16v widen_low(u8v v) { return _mm_unpacklo_epi8(v, _mm_setzero_si128()); }
+inline u16v widen_high(u8v v) { return _mm_unpackhi_epi8(v, _mm_setzero_si128()); }
+inline u8v narrow(s16v low, s16v high) { return _mm_packus_epi16(low, high); }
+
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm_unpacklo_epi8(a, b);
+    if constexpr (N == 2) return _mm_unpacklo_epi16(a, b);
+    if constexpr (N == 4) return _mm_unpacklo_epi32(a, b);
+    if constexpr (N == 8) return _mm_unpacklo_epi64(a, b);
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm_unpackhi_epi8(a, b);
+    if constexpr (N == 2) return _mm_unpackhi_epi16(a, b);
+    if constexpr (N == 4) return _mm_unpackhi_epi32(a, b);
+    if constexpr (N == 8) return _mm_unpackhi_epi64(a, b);
+}
+inline u8v shuffle(u8v v, u8v index) { return _mm_shuffle_epi8(v, index); }
+inline u8v reverse_u8(u8v v) {
+    return shuffle(v, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
+}
+inline u8v reverse_u16(u8v v) {
+    return shuffle(v, _mm_setr_epi8(14, 15, 12, 13, 10, 11, 8, 9, 6, 7, 4, 5, 2, 3, 0, 1));
 }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {
