@@ -29,6 +29,7 @@ namespace {
 
 struct cpu {
     bool neon = false, sse41 = false, avx2 = false, avx512 = false;
+    bool fast_strings = false;  // x86: ERMS
 };
 
 #if defined(__x86_64__) || defined(__i386__)
@@ -50,6 +51,7 @@ cpu detect() {
     const bool saves_ymm = (saved & 0x06) == 0x06;  // SSE and AVX state
     const bool saves_zmm = (saved & 0xE6) == 0xE6;  // and opmask, upper halves, upper registers
     if (!__get_cpuid_count(7, 0, &a, &b, &c, &d)) return has;
+    has.fast_strings = b & 1u << 9;
     has.avx2 = saves_ymm && (b & bit_AVX2);
     // The byte permutes (VBMI) came with the second generation, which no longer slows down for wide
     // integer code: the first generation is better served by AVX2.
@@ -88,16 +90,23 @@ row_table &add_table(target t) {
     return tables[size_t(t)] = tables[size_t(target::scalar)];
 }
 
+// Rows that suit the processor better than those of its instruction set in general.
+void fit(row_table &table, const cpu &has) {
+    if (has.fast_strings && table.mem.fill_with_strings)
+        table.mem.fill = table.mem.fill_with_strings;
+}
+
 #define FILL(area) fill_##area(table.area);
 #define OFFER(name)                                 \
     {                                               \
         using namespace name;                       \
         row_table &table = add_table(target::name); \
         SIMGP_AREAS(FILL)                           \
+        fit(table, has);                            \
     }
 
 void fill_tables() {
-    [[maybe_unused]] const cpu has = detect();
+    const cpu has = detect();
     OFFER(scalar)
 #ifdef SIMGP_HAVE_neon
     if (has.neon) OFFER(neon)

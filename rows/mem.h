@@ -12,6 +12,9 @@ using fill_row = void(uint8_t *dst, uint32_t value, size_t size);
 
 struct mem_rows {
     fill_row *fill;
+    // For processors whose string stores are fast, where the choice puts it in the place of `fill`;
+    // null where there is none.
+    fill_row *fill_with_strings;
 };
 
 }  // namespace simgp

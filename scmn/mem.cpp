@@ -15,7 +15,7 @@ void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
     for (size_t i = 0; i < size; i += 4) memcpy(dst + i, bytes, 4);
 }
 
-void fill_mem(mem_rows &t) { t.fill = fill_pattern; }
+void fill_mem(mem_rows &t) { t = {fill_pattern, nullptr}; }
 
 }  // namespace simgp::scalar
 
