@@ -17,7 +17,8 @@ TEST(layout, every_kernel_at_every_size_on_every_target) {
         const int above = from.at(channel::u).down, below = to.at(channel::u).down;
         ASSERT_EQ(from.at(channel::u).across, to.at(channel::u).across) << k.name;
         rig::check_jobs(k.name, {.max_width = 2 * 130}, [&](int w, int h) {
-            const bool halved = above<below, doubled = above> below;
+            const bool halved = above < below;
+            const bool doubled = above > below;
             const int chroma_rows = halved    ? h / 2
                                     : doubled ? (h + 1) / 2 * 2
                                               : (h + above - 1) / above;

@@ -9,6 +9,7 @@ namespace {
 
 using rig::channel;
 using rig::conversion;
+using rig::conversion_named;
 using rig::rgb;
 
 const std::vector<conversion> kernels = rig::conversions_of(rig::family::yuv_to_rgb);
@@ -81,7 +82,7 @@ std::vector<uint8_t> flat(const conversion &k, int y, int u, int v) {
 using bytes = std::vector<uint8_t>;
 
 TEST(yuv2rgb, colours_computed_by_hand) {
-    const conversion &fine = rig::conversion_named("yuv420_to_rgba8888");
+    const conversion &fine = conversion_named("yuv420_to_rgba8888");
     EXPECT_EQ(flat(fine, 16, 128, 128), (bytes{0, 0, 0, 255}));
     EXPECT_EQ(flat(fine, 235, 128, 128), (bytes{255, 255, 255, 255}));
     EXPECT_EQ(flat(fine, 0, 128, 128), (bytes{0, 0, 0, 255}));
@@ -91,16 +92,15 @@ TEST(yuv2rgb, colours_computed_by_hand) {
     EXPECT_EQ(flat(fine, 145, 54, 34), (bytes{0, 255, 1, 255}));
     EXPECT_EQ(flat(fine, 41, 240, 110), (bytes{0, 0, 255, 255}));
 
-    EXPECT_EQ(flat(rig::conversion_named("yuv444_to_rgb565"), 81, 90, 240), (bytes{0x00, 0xF8}));
-    EXPECT_EQ(flat(rig::conversion_named("yuv444_to_bgr565"), 81, 90, 240), (bytes{0x1F, 0x00}));
-    EXPECT_EQ(flat(rig::conversion_named("nv12_to_rgb565"), 128, 128, 128), (bytes{0x10, 0x84}));
+    EXPECT_EQ(flat(conversion_named("yuv444_to_rgb565"), 81, 90, 240), (bytes{0x00, 0xF8}));
+    EXPECT_EQ(flat(conversion_named("yuv444_to_bgr565"), 81, 90, 240), (bytes{0x1F, 0x00}));
+    EXPECT_EQ(flat(conversion_named("nv12_to_rgb565"), 128, 128, 128), (bytes{0x10, 0x84}));
 
-    const conversion &coarse =
-        rig::conversion_named("nv21_to_rgb565");  // 131, 131, 131; 251, 209, 159
+    const conversion &coarse = conversion_named("nv21_to_rgb565");  // 131, 131, 131; 251, 209, 159
     EXPECT_EQ(flat(coarse, 128, 128, 128), (bytes{0x10, 0x84}));
     EXPECT_EQ(flat(coarse, 200, 100, 150), (bytes{0x93, 0xFE}));
 
-    const conversion &grey = rig::conversion_named("yuv400_to_rgb565");
+    const conversion &grey = conversion_named("yuv400_to_rgb565");
     EXPECT_EQ(flat(grey, 0, 0, 0), (bytes{0x00, 0x00}));
     EXPECT_EQ(flat(grey, 16, 0, 0), (bytes{0x82, 0x10}));
     EXPECT_EQ(flat(grey, 255, 0, 0), (bytes{0xFF, 0xFF}));
@@ -120,7 +120,7 @@ TEST(yuv2rgb, one_colour_through_every_kernel) {
 TEST(yuv2rgb, odd_heights_choose_their_chroma_lines) {
     // Chroma line 0 is grey, line 1 is not.
     const auto lines = [](const char *name, int width) {
-        const conversion &k = rig::conversion_named(name);
+        const conversion &k = conversion_named(name);
         const rig::format &to = rig::format_of(k.to);
         rig::picture src(rig::shapes_of(k.from, width, 3)), dst(rig::shapes_of(k.to, width, 3));
         for (int y = 0; y < 3; y++) memset(src.row(0, y), 128, size_t(width));
@@ -169,7 +169,7 @@ TEST(yuv2rgb, every_colour_on_every_target) {
     std::vector<sweep> sweeps;
     for (const char *name : {"yuv420_to_rgba8888", "yuv420_to_rgb565", "nv21_to_rgb565",
                              "nv21_to_bgr565", "yuv444_to_rgb565", "nv12_to_rgb888"}) {
-        const conversion &k = rig::conversion_named(name);
+        const conversion &k = conversion_named(name);
         sweeps.push_back({k, rig::format_of(k.from), rig::format_of(k.to),
                           rig::picture(rig::shapes_of(k.from, width, 1))});
     }
