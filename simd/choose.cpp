@@ -115,6 +115,9 @@ void fill_tables() {
     live.store(&tables[size_t(best)], std::memory_order_release);
 }
 
+#undef FILL
+#undef OFFER
+
 void ensure_tables() { pthread_once(&once, fill_tables); }
 
 }  // namespace

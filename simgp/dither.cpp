@@ -153,7 +153,7 @@ struct pair {
 };
 
 // clang-format off
-constexpr pair pairs[] = {
+constexpr pair dithered_pairs[] = {
     {SIMGP_FMT_YUV400,  SIMGP_FMT_RGB565, simgp_csc_yuv400_to_rgb565_dither},
     {SIMGP_FMT_YUV420,  SIMGP_FMT_RGB565, simgp_csc_yuv420_to_rgb565_dither},
     {SIMGP_FMT_YUV420,  SIMGP_FMT_BGR565, simgp_csc_yuv420_to_bgr565_dither},
@@ -203,6 +203,7 @@ KERNEL(yuv422w, rgb565, as_usual)
 KERNEL(yuv422w, bgr565, as_usual)
 KERNEL(yuv444, rgb565, as_usual)
 KERNEL(yuv444, bgr565, as_usual)
+#undef KERNEL
 // clang-format on
 
 int32_t simgp_csc_dither(const simgp_img *src, const simgp_img *dst) {
@@ -210,7 +211,7 @@ int32_t simgp_csc_dither(const simgp_img *src, const simgp_img *dst) {
         dither_planes(*src, *dst);
         return SIMGP_OK;
     }
-    for (const pair &p : pairs) {
+    for (const pair &p : dithered_pairs) {
         if (p.from != src->format || p.to != dst->format) continue;
         p.kernel(src->plane, src->width, src->height, src->stride, dst->stride, dst->plane);
         return SIMGP_OK;

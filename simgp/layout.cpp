@@ -149,4 +149,5 @@ KERNEL(nv12,    yuv420,  pairs_to(args, 1, 2))
 KERNEL(nv12,    yv12,    pairs_to(args, 2, 1))
 KERNEL(nv21,    yuv420,  pairs_to(args, 2, 1))
 KERNEL(nv21,    yv12,    pairs_to(args, 1, 2))
+#undef KERNEL
 // clang-format on

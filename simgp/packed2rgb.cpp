@@ -31,3 +31,4 @@ KERNEL(uyvy, bgr888, 3)
 KERNEL(uyvy, rgba8888, 4)
 KERNEL(uyvy, bgra8888, 4)
 KERNEL(uyvy, argb8888, 4)
+#undef KERNEL

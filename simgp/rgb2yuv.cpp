@@ -134,4 +134,6 @@ KERNEL(rgb565, nv12)
 KERNEL(rgb565, nv21)
 RGB565_KERNEL(rgb888, 3)
 RGB565_KERNEL(rgba8888, 4)
+#undef KERNEL
+#undef RGB565_KERNEL
 // clang-format on

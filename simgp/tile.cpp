@@ -83,38 +83,38 @@ void for_each_tile(ptrdiff_t width, ptrdiff_t height, F f) {
 
 void copy_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, ptrdiff_t stride,
                     uint8_t *dst) {
-    const rows &live = live_rows();
+    const rows &table = live_rows();
     for_each_tile(width, height, [&](const block &b) {
         const uint8_t *const tile = src + b.offset;
         uint8_t *const to = dst + b.y * stride + b.x;
-        if (b.whole()) return live.detile(tile, to, stride, b.rows);
+        if (b.whole()) return table.detile(tile, to, stride, b.rows);
         copy_rows(tile, 64, to, stride, b.width, b.rows);
     });
 }
 
 void copy_from_linear(const uint8_t *src, ptrdiff_t stride, ptrdiff_t width, ptrdiff_t height,
                       uint8_t *dst) {
-    const rows &live = live_rows();
+    const rows &table = live_rows();
     for_each_tile(width, height, [&](const block &b) {
         const uint8_t *const from = src + b.y * stride + b.x;
         uint8_t *const tile = dst + b.offset;
-        if (b.whole()) return live.entile(from, stride, tile, b.rows);
+        if (b.whole()) return table.entile(from, stride, tile, b.rows);
         copy_rows(from, stride, tile, 64, b.width, b.rows);
     });
 }
 
 void unpack_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, const plane_lines &u,
                       const plane_lines &v) {
-    const rows &live = live_rows();
+    const rows &table = live_rows();
     for_each_tile(width, height, [&](const block &b) {
         const uint8_t *const tile = src + b.offset;
         const plane_lines to_u{u.line(b.y) + b.x / 2, u.stride};
         const plane_lines to_v{v.line(b.y) + b.x / 2, v.stride};
         if (b.whole())
-            return live.detile_unpack(tile, to_u.first, u.stride, to_v.first, v.stride, b.rows);
+            return table.detile_unpack(tile, to_u.first, u.stride, to_v.first, v.stride, b.rows);
         const ptrdiff_t pairs = b.width / 2;
         for (ptrdiff_t r = 0; r < b.rows; r++) {
-            if (pairs > 0) live.unpack(tile + 64 * r, to_u.line(r), to_v.line(r), pairs);
+            if (pairs > 0) table.unpack(tile + 64 * r, to_u.line(r), to_v.line(r), pairs);
             if (b.width & 1) to_u.line(r)[pairs] = tile[64 * r + 2 * pairs];
         }
     });
@@ -122,15 +122,15 @@ void unpack_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, con
 
 void pack_from_linear(const plane_lines &u, const plane_lines &v, ptrdiff_t width, ptrdiff_t height,
                       uint8_t *dst) {
-    const rows &live = live_rows();
+    const rows &table = live_rows();
     for_each_tile(width, height, [&](const block &b) {
         const plane_lines from_u{u.line(b.y) + b.x / 2, u.stride};
         const plane_lines from_v{v.line(b.y) + b.x / 2, v.stride};
         uint8_t *const tile = dst + b.offset;
         if (b.whole())
-            return live.entile_pack(from_u.first, u.stride, from_v.first, v.stride, tile, b.rows);
+            return table.entile_pack(from_u.first, u.stride, from_v.first, v.stride, tile, b.rows);
         for (ptrdiff_t r = 0; r < b.rows; r++)
-            live.pack(from_u.line(r), from_v.line(r), tile + 64 * r, (b.width + 1) / 2);
+            table.pack(from_u.line(r), from_v.line(r), tile + 64 * r, (b.width + 1) / 2);
     });
 }
 

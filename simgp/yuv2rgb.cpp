@@ -189,4 +189,6 @@ KERNEL(nv12, rgb888)
 KERNEL(nv21, bgr565)
 KERNEL(nv21, rgb888)
 SIMGP_CSC_KERNEL(simgp_csc_nv21_to_rgb565, walk_yuv_to_rgb(args, src_lines(args, 0), planes_nv21, live_rows().vu_to_rgb565_coarse_pair, 0))
+#undef KERNEL
+#undef LEAD_KERNEL
 // clang-format on
