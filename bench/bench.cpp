@@ -14,7 +14,7 @@
 #include <numeric>
 #include <random>
 
-#include "simd/choose.h"
+#include "rows/choose.h"
 
 namespace bench {
 
@@ -39,6 +39,27 @@ std::function<void()> memory_traffic(std::shared_ptr<void> keep, const uint8_t *
     };
 }
 
+// With the widest vectors there are, as the C library's memcpy; x86 is compiled for the oldest.
+#ifdef __x86_64__
+[[gnu::target_clones("avx512f", "avx2", "default")]]
+#endif
+static void
+invert(uint8_t *p, size_t n) {
+    typedef uint64_t vector [[gnu::vector_size(64), gnu::aligned(1), gnu::may_alias]];
+    for (size_t i = 0; i + sizeof(vector) <= n; i += sizeof(vector)) {
+        vector &v = *reinterpret_cast<vector *>(p + i);
+        v = ~v;
+    }
+}
+
+std::function<void()> memory_traffic_in_place(std::shared_ptr<void> keep, uint8_t *p, size_t n) {
+    return [=] {
+        (void)keep;
+        invert(p, n);
+        benchmark::ClobberMemory();
+    };
+}
+
 namespace {
 
 using simgp::target;
@@ -53,12 +74,12 @@ struct settings {
 class rotation {
   public:
     rotation(const match &m, const settings &s) : m_(m), s_(s), random_(1) {
-        add(target::scalar, m.ours, m.units);
-        for (target t : s.targets) add(t, m.ours, m.units);
+        add(target::scalar, m.ours, m.restore, m.units);
+        for (target t : s.targets) add(t, m.ours, m.restore, m.units);
         if (m.twin.run)
-            for (target t : s.targets) add(t, m.twin.run, m.twin.units);
-        for (const contender &p : m.peers) add(target::count, p.run, m.units);
-        if (m.limit) add(target::count, m.limit, m.units);
+            for (target t : s.targets) add(t, m.twin.run, m.twin.restore, m.twin.units);
+        for (const contender &p : m.peers) add(target::count, p.run, m.restore, m.units);
+        if (m.limit) add(target::count, m.limit, m.restore, m.units);
         order_.resize(all_.size());
         std::iota(order_.begin(), order_.end(), size_t(0));
         for (entry &e : all_) {
@@ -127,15 +148,16 @@ class rotation {
   private:
     struct entry {
         target rows;  // count: not ours
-        std::function<void()> run;
+        std::function<void()> run, restore;
         double units;
         int calls = 1;
         double warm_ns = 200e3;
         std::vector<double> ns = {};  // per unit, by round
     };
 
-    void add(target rows, const std::function<void()> &run, double units) {
-        all_.push_back({rows, run, units});
+    void add(target rows, const std::function<void()> &run, const std::function<void()> &restore,
+             double units) {
+        all_.push_back({rows, run, restore, units});
     }
 
     // Time of this thread: what others run on the machine meanwhile does not count, but for what it
@@ -146,12 +168,36 @@ class rotation {
         return double(t.tv_sec) * 1e9 + double(t.tv_nsec);
     }
 
+    // What two readings of the clock differ by with nothing in between. It is a call into the kernel,
+    // a few hundred nanoseconds, which count where each run is timed by itself.
+    static double clock_ns() {
+        static const double ns = [] {
+            std::vector<double> between;
+            for (int i = 0; i < 1001; i++) {
+                const double start = cpu_ns();
+                between.push_back(cpu_ns() - start);
+            }
+            return quartiles_of(between).middle;
+        }();
+        return ns;
+    }
+
     // A batch; nanoseconds per unit. Processors switch the upper lanes of their vector units off
     // when these have not been used for half a millisecond, and run at a quarter of their speed
     // for up to 150 microseconds when they switch them on: so each contender warms up unmeasured,
     // unless a call takes so long that it does not matter.
     static double batch(const entry &e) {
         const auto run = [&e](int calls) {
+            if (e.restore) {
+                double ns = 0;
+                for (int i = 0; i < calls; i++) {
+                    e.restore();
+                    const double start = cpu_ns();
+                    e.run();
+                    ns += std::max(1.0, cpu_ns() - start - clock_ns());
+                }
+                return ns;
+            }
             const double start = cpu_ns();
             for (int i = 0; i < calls; i++) e.run();
             return cpu_ns() - start;
@@ -226,6 +272,19 @@ std::vector<target> parse_targets(const std::vector<std::string> &names) {
     return targets;
 }
 
+// The sizes that were asked for. One alone also stands for an operation's own "<that size> to ...".
+std::vector<std::string> sizes_like(const std::vector<std::string> &own,
+                                    const std::vector<std::string> &asked) {
+    std::vector<std::string> chosen;
+    for (const std::string &size : asked) {
+        const size_t before = chosen.size();
+        for (const std::string &s : own)
+            if (s.rfind(size + " to ", 0) == 0) chosen.push_back(s);
+        if (chosen.size() == before) chosen.push_back(size);
+    }
+    return chosen;
+}
+
 int run(int argc, char **argv) {
     CLI::App app(
         "Measures the library against libyuv, swscale, OpenCV, its own scalar rows, and memcpy and "
@@ -242,7 +301,9 @@ int run(int argc, char **argv) {
     std::vector<std::string> sizes, target_names;
     bool quick = false, list = false;
     app.add_option("--filter", filter, "only operations whose name matches this expression");
-    app.add_option("--size", sizes, "only these sizes, such as 1920x1080 (any size may be named)");
+    app.add_option(
+        "--size", sizes,
+        "only these sizes, such as 1920x1080 or '1920x1080 to 1280x720' (any may be named)");
     app.add_option("--target", target_names,
                    "instruction sets (neon, sse41, avx2, avx512); otherwise avx2, avx512, neon");
     app.add_option("--rounds", s.rounds, "rounds per comparison; a third for large pictures")
@@ -271,17 +332,16 @@ int run(int argc, char **argv) {
           copy_comparisons, tile_comparisons, dither_comparisons, scmn_comparisons})
         for (comparison &c : area()) all.push_back(std::move(c));
     for (const comparison &c : all) {
-        const std::vector<std::string> &chosen = sizes.empty() ? c.sizes : sizes;
-        for (const std::string &size : chosen) {
+        for (const std::string &size : sizes.empty() ? c.sizes : sizes_like(c.sizes, sizes)) {
             const auto body = [&out, c, size, s](benchmark::State &state) {
                 rotation r(c.make(size), s);
                 for (auto _ : state) state.SetIterationTime(r.round());
                 for (const auto &[name, ns] : r.times()) state.counters[name] = ns;
                 out.fresh = r.lines(c.name, size);
             };
-            int width = 0, height = 0;
-            sscanf(size.c_str(), "%dx%d", &width, &height);
-            const bool large = double(width) * height > 4e6;
+            int w = 0, h = 0, to_w = 0, to_h = 0;
+            sscanf(size.c_str(), "%dx%d to %dx%d", &w, &h, &to_w, &to_h);
+            const bool large = std::max(double(w) * h, double(to_w) * to_h) > 4e6;
             benchmark::RegisterBenchmark((c.name + "/" + size).c_str(), body)
                 ->UseManualTime()
                 ->Iterations(large ? (s.rounds + 2) / 3 : s.rounds);

@@ -33,7 +33,7 @@ struct contender {
 
 // One operation at one size, ready to run. The closures keep alive what they work on.
 struct match {
-    double units;                  // pixels (or bytes) that a run deals with
+    double units;                  // pixels of the destination (or bytes) that a run deals with
     std::function<void()> ours;    // run once for every target
     std::vector<contender> peers;  // what `ours` is held against
     std::function<void()> limit;   // memory traffic of the same bytes; may be empty
@@ -45,14 +45,21 @@ struct match {
         std::string name;
         std::function<void()> run;  // may be empty
         double units = 0, goal = 0;
+        std::function<void()> restore = {};
     } twin = {};
+
+    // Puts back what all of these (but for the twin) work on in place: unmeasured, before every
+    // single run, so that a filter never meets its own result, on which it has less to do. May be
+    // empty.
+    std::function<void()> restore = {};
 };
 
 // An operation. make(size) prepares a match, and ends the program if a peer does not compute the
 // same as we do.
 struct comparison {
     std::string name;
-    std::vector<std::string> sizes;  // names of sizes, for make
+    std::vector<std::string>
+        sizes;  // names of sizes, for make, such as "64x48" or "64x48 to 32x24"
     std::function<match(const std::string &size)> make;
 };
 
@@ -60,6 +67,9 @@ struct comparison {
 // memset, or reads that leave the cache alone, of the others. Memory of both must exist.
 std::function<void()> memory_traffic(std::shared_ptr<void> keep, const uint8_t *read, size_t n,
                                      uint8_t *written, size_t m);
+
+// What reading and writing `n` bytes in place costs at least. Memory must exist.
+std::function<void()> memory_traffic_in_place(std::shared_ptr<void> keep, uint8_t *p, size_t n);
 
 // Ends the program with a message on stderr.
 [[noreturn]] void fail(const std::string &message);

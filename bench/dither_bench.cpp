@@ -4,6 +4,7 @@
 #include <libyuv.h>
 
 #include "bench/picture.h"
+#include "simgp/yuv2rgb.h"
 
 namespace bench {
 
@@ -38,6 +39,15 @@ std::vector<comparison> dither_comparisons() {
     // clang-format on
     // Dithers move pixels about, and libyuv's lifts the mean by half a step of 5 bits.
     for (conversion &c : all) c.tolerance = 8;
+
+    // How dithered grey is converted in the end: from the second half of each line to all of it.
+    conversion in_place{SIMGP_FMT_RGB565, SIMGP_FMT_RGB565, {0}, {}, "yuv400_to_rgb565 in place"};
+    in_place.ours = [](const simgp_img &p, const simgp_img &) {
+        uint8_t *const luma[] = {p.plane[0] + p.width[0]};
+        simgp_csc_yuv400_to_rgb565(luma, p.width, p.height, p.stride, p.stride, p.plane);
+    };
+    in_place.in_place = true;
+    all.push_back(in_place);
     return compare_all(all);
 }
 

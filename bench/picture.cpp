@@ -244,18 +244,20 @@ peer libyuv_peer(operation first, int between, operation second) {
             }};
 }
 
-std::vector<peer> swscale_peer(int from, int to, int extra_flags) {
+std::vector<peer> swscale_peer(int from, int to, int extra_flags, resizing how) {
     av_log_set_level(AV_LOG_ERROR);
     const AVPixelFormat a = shape_of(from).swscale, b = shape_of(to).swscale;
-    if (a == b || !sws_isSupportedInput(a) || !sws_isSupportedOutput(b)) return {};
+    if (a == b && how == resizing::none) return {};
+    if (!sws_isSupportedInput(a) || !sws_isSupportedOutput(b)) return {};
     const bool swap_src = v_before_u(from), swap_dst = v_before_u(to);
 
     const operation_maker make = [=](const simgp_img &src, const simgp_img &dst) {
         operation best;
         double least = 0;
         for (const int flags : {SWS_POINT, SWS_FAST_BILINEAR, SWS_BILINEAR}) {
+            if (flags == SWS_POINT && how == resizing::interpolates) continue;
             std::shared_ptr<SwsContext> context(
-                sws_getContext(src.width[0], src.height[0], a, src.width[0], src.height[0], b,
+                sws_getContext(src.width[0], src.height[0], a, dst.width[0], dst.height[0], b,
                                flags | extra_flags, nullptr, nullptr, nullptr),
                 sws_freeContext);
             if (!context) continue;
@@ -282,54 +284,97 @@ std::vector<peer> swscale_peer(int from, int to, int extra_flags) {
     return {{"swscale", make}};
 }
 
+namespace {
+
+// A source and a destination. Where these are one, the way back to what was painted.
+struct arena {
+    picture src, dst;
+    std::function<void()> restore;
+
+    void run(const operation &f) const {
+        if (restore) restore();
+        f(src, dst);
+    }
+};
+
+size destination_size(const conversion &c, const size &from) {
+    return c.to_size ? c.to_size(from) : from;
+}
+
+arena make_arena(const conversion &c, int from_format, const size &from, const size &to) {
+    const picture src(from_format, from.width, from.height);
+    paint(src);
+    const picture dst(c.to, to.width, to.height);
+    if (!c.in_place) return {src, dst, {}};
+    if (c.to != from_format || to.width != from.width || to.height != from.height)
+        fail(c.name + ": in place, and yet from one format or size to another");
+    return {dst, dst, [=] { memcpy(dst.memory.get(), src.memory.get(), src.bytes); }};
+}
+
+}  // namespace
+
 comparison compare(conversion c) {
     if (c.name.empty()) c.name = std::string(shape_of(c.from).name) + "_to_" + shape_of(c.to).name;
     if (!c.ours)
         c.ours = [name = c.name](const simgp_img &s, const simgp_img &d) {
             if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
         };
-    for (peer &p : swscale_peer(c.from, c.to)) c.peers.push_back(std::move(p));
+    for (peer &p : swscale_peer(c.from, c.to, 0, c.how)) c.peers.push_back(std::move(p));
+    if (c.sizes.empty()) c.sizes = {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"};
 
-    const auto ours = [ours = c.ours](int from, int to, int w, int h) {
-        const picture src(from, w, h), dst(to, w, h);
-        paint(src);
-        return [=] { ours(src, dst); };
-    };
-    const auto make = [c, ours](const std::string &size) {
-        int width = 0, height = 0;
-        if (sscanf(size.c_str(), "%dx%d", &width, &height) != 2) fail("no size: " + size);
-        const picture src(c.from, width, height), dst(c.to, width, height);
-        paint(src);
-        c.ours(src, dst);
+    const auto make = [c](const std::string &name) {
+        size from{}, to{};
+        const int numbers = sscanf(name.c_str(), "%dx%d to %dx%d", &from.width, &from.height,
+                                   &to.width, &to.height);
+        if (numbers != 2 && numbers != 4) fail("no size: " + name);
+        const bool any_size = c.how != resizing::none && !c.to_size;
+        const size usual_to = destination_size(c, from);
+        if (numbers == 2) to = usual_to;
+        if (!any_size && (to.width != usual_to.width || to.height != usual_to.height))
+            fail(c.name + " does not go from one size to the other: " + name);
+        const arena a = make_arena(c, c.from, from, to);
+        const picture ours(c.to, to.width, to.height);
+        a.run(c.ours);
+        memcpy(ours.memory.get(), a.dst.memory.get(), ours.bytes);
 
         match m{};
-        m.units = double(src.pixels());
-        m.ours = [ours = c.ours, src, dst] { ours(src, dst); };
-        const picture other(c.to, width, height);
+        m.units = double(a.dst.pixels());
+        m.restore = a.restore;
+        m.ours = [f = c.ours, a] { f(a.src, a.dst); };
+        arena b = a;  // of work in place the same: all have the same memory before them
+        if (!c.in_place) b.dst = picture(c.to, to.width, to.height);
         for (const peer &p : c.peers) {
-            const operation convert = p.make(src, other);
-            memset(other.memory.get(), 0xA5, other.bytes);
-            convert(src, other);
-            if (c.tolerance > 0) expect_alike(c.name + " by " + p.name, dst, other, c.tolerance);
-            m.peers.push_back({p.name, [=] { convert(src, dst); }});
+            const operation convert = p.make(b.src, b.dst);
+            memset(b.dst.memory.get(), 0xA5, b.dst.bytes);
+            b.run(convert);
+            if (c.tolerance > 0) expect_alike(c.name + " by " + p.name, ours, b.dst, c.tolerance);
+            m.peers.push_back({p.name, [=] { convert(b.src, b.dst); }});
         }
-        m.limit = memory_traffic(src.memory, src.plane[0], size_t(double(src.bytes) * c.part_read),
-                                 dst.memory.get(), dst.bytes);
+        m.limit = c.in_place
+                      ? memory_traffic_in_place(a.dst.memory, a.dst.memory.get(), a.dst.bytes)
+                      : memory_traffic(a.src.memory, a.src.plane[0],
+                                       size_t(double(a.src.bytes) * c.part_read),
+                                       a.dst.memory.get(), a.dst.bytes);
 
         // Where a goal asks for the speed of memory, it is that of pictures beyond the cache, and
         // the peer's that of those inside.
-        const bool in_cache = size == "320x240", usual = in_cache || size == "1920x1080";
+        const std::string start = name.substr(0, name.find(' '));
+        const bool in_cache = start == "320x240", usual = in_cache || start == "1920x1080";
         m.goals.scalar = usual ? c.goals.scalar : 0;
         m.goals.peer = (c.goals.limit > 0 ? in_cache : usual) ? c.goals.peer : 0;
-        m.goals.limit = size == "3840x2160" ? c.goals.limit : 0;
-        if (size == "1918x1078")
-            m.twin = {"1080p", ours(c.from, c.to, 1920, 1080), 1920 * 1080, 0.9};
+        m.goals.limit = start == "3840x2160" ? c.goals.limit : 0;
+        const auto twin = [&](const std::string &what, int format, const size &s, double goal) {
+            const arena t = make_arena(c, format, s, destination_size(c, s));
+            m.twin = {what, [f = c.ours, t] { f(t.src, t.dst); }, double(t.dst.pixels()), goal,
+                      t.restore};
+        };
+        if (name == "1918x1078")
+            twin("1080p", c.from, {1920, 1080}, 0.9);
         else if (c.twin_from >= 0)
-            m.twin = {shape_of(c.twin_from).name, ours(c.twin_from, c.to, width, height), m.units,
-                      usual ? 0.9 : 0};
+            twin(shape_of(c.twin_from).name, c.twin_from, from, usual ? 0.9 : 0);
         return m;
     };
-    return {c.name, {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"}, make};
+    return {c.name, c.sizes, make};
 }
 
 std::vector<comparison> compare_all(const std::vector<conversion> &all) {

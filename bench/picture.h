@@ -70,9 +70,17 @@ operation of_planes(Function *f, More... more) {
 peer libyuv_peer(operation f);
 peer libyuv_peer(operation first, int between, operation second);
 
-// swscale, with whichever of its fast modes takes least time. Nothing where it does not know the
-// formats.
-std::vector<peer> swscale_peer(int from, int to, int extra_flags = 0);
+// How an operation comes from one size to another.
+enum class resizing { none, drops_or_repeats, interpolates };
+
+// swscale, with whichever of its fast modes takes least time (that do no less than ours). Nothing
+// where it does not know the formats, or has nothing to do.
+std::vector<peer> swscale_peer(int from, int to, int extra_flags = 0,
+                               resizing how = resizing::none);
+
+struct size {
+    int width, height;
+};
 
 // The conversion from one format to another at the usual sizes, ours by `ours`.
 struct conversion {
@@ -84,6 +92,14 @@ struct conversion {
     double tolerance = 4;          // for peers, see expect_alike; 0: they are not held against ours
     double part_read = 1;          // of the source's bytes
     int twin_from = -1;            // the conversion from this format is to be no faster than 0.9
+
+    // The destination's size: as this says; or if the operation resizes otherwise, any that the
+    // name of a size has ("64x48 to 32x24"); or that of the source.
+    std::function<size(const size &from)> to_size = {};
+    resizing how = resizing::none;
+    std::vector<std::string> sizes = {};  // names; of itself the usual ones
+    // `ours` and the peers get one picture as source and destination, as it was painted, each time.
+    bool in_place = false;
 };
 comparison compare(conversion c);
 std::vector<comparison> compare_all(const std::vector<conversion> &all);

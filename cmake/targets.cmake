@@ -31,21 +31,29 @@ if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_L
 endif()
 message(STATUS "simgp: vector rows for: ${SIMGP_TARGETS}")
 
-# Areas, from the list that the code has.
-set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${PROJECT_SOURCE_DIR}/simd/areas.h)
-file(READ ${PROJECT_SOURCE_DIR}/simd/areas.h area_list)
-string(REGEX MATCHALL "X\\([a-z]+, [a-z0-9_]+\\)" area_list "${area_list}")
-set(SIMGP_AREAS "")
-foreach(area IN LISTS area_list)
-  string(REGEX REPLACE "X\\((.*), (.*)\\)" "\\1/\\2" area "${area}")
-  list(APPEND SIMGP_AREAS ${area})
+# The areas that have rows: families of inner loops with a header (rows/<area>.h), scalar rows
+# (<family>/<area>.cpp) and vector rows (<family>/vector/<area>.h). The code gets the list as the macro
+# SIMGP_AREAS(X).
+set(SIMGP_AREAS
+  scmn/keyframe
+  scmn/mem
+  simgp/dither
+  simgp/layout
+  simgp/rgb2yuv
+  simgp/tile
+  simgp/yuv2rgb)
+set(area_macro "#define SIMGP_AREAS(X)")
+foreach(area IN LISTS SIMGP_AREAS)
+  get_filename_component(stem ${area} NAME)
+  string(APPEND area_macro " X(${stem})")
 endforeach()
+file(CONFIGURE OUTPUT ${PROJECT_BINARY_DIR}/generated/areas.h CONTENT "${area_macro}\n")
 
 # One object library per target and area, listed in SIMGP_VECTOR_UNITS; `chooser` learns which targets exist.
 function(simgp_add_vector_unit name target area)
   get_filename_component(family ${area} DIRECTORY)
   get_filename_component(stem ${area} NAME)
-  add_library(${name} OBJECT ${PROJECT_SOURCE_DIR}/simd/unit.cpp)
+  add_library(${name} OBJECT ${PROJECT_SOURCE_DIR}/rows/unit.cpp)
   target_link_libraries(${name} PRIVATE simgp_library_flags)
   target_compile_definitions(${name} PRIVATE SIMD_TARGET=${target} SIMD_LAYER="simd/${target}.h"
                                              SIMD_AREA="${family}/vector/${stem}.h")

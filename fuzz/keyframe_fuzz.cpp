@@ -2,8 +2,8 @@
 // The bytes end at an inaccessible page.
 #include <string.h>
 
+#include "rows/choose.h"
 #include "scmn/keyframe.h"
-#include "simd/choose.h"
 #include "tests/guard.h"
 #include "tests/keyframe_rule.h"
 

@@ -63,8 +63,7 @@ struct scmn_bsw_ctx {
     scmn_bsw_byte_fn on_byte; /* or NULL */
 };
 
-/* The layouts are part of the binary interface: pointers are native, every other word has 32 bits.
- */
+/* The layouts are part of the binary interface: pointers are native, all else has 32 bits. */
 #if UINTPTR_MAX == 0xFFFFFFFFu
 SIMGP_STATIC_ASSERT(offsetof(scmn_bsr_ctx, cur) == 8, "scmn_bsr_ctx.cur moved");
 SIMGP_STATIC_ASSERT(offsetof(scmn_bsr_ctx, last) == 12, "scmn_bsr_ctx.last moved");
@@ -105,9 +104,9 @@ SIMGP_STATIC_ASSERT(sizeof(scmn_bsw_ctx) == 48, "scmn_bsw_ctx changed its size")
  *
  * Counts outside 0 to 32 are not checked and give no useful result, but do no harm. */
 
-/* Starts reading `size` bytes (0 or less: none) at buf, with the given refill or, for NULL, with
- * scmn_bsr_flush. Reading least significant bit first needs scmn_bsr_le_flush here. Nothing is read
- * yet. */
+/* Starts reading `size` bytes (0 or less: none, and buf may be NULL) at buf, with the given refill
+ * or, for NULL, with scmn_bsr_flush. Reading least significant bit first needs scmn_bsr_le_flush
+ * here. Nothing is read yet: buf must stay as long as the reader is used. It is never written. */
 SIMGP_API void scmn_bsr_init(scmn_bsr_ctx *ctx, const uint8_t *buf, int32_t size,
                              scmn_bsr_refill_fn refill);
 
@@ -117,8 +116,7 @@ SIMGP_API int32_t scmn_bsr_flush(scmn_bsr_ctx *ctx, int32_t nbytes);
 SIMGP_API int32_t scmn_bsr_le_flush(scmn_bsr_ctx *ctx, int32_t nbytes);
 
 /* Most significant bit first: the first bit of a byte is its bit 7, and the first bit read ends up
- * highest in the result. Of the bytes A5 0F, 4 bits give A, the next 8 give 50, the next 4 give F.
- */
+ * highest in the result: of the bytes A5 0F, 4 bits give A, then 8 give 50, then 4 give F. */
 
 /* The next n bits (0 to 32), right-aligned; 0xFFFFFFFF at the end. n = 0 gives 0 and consumes
  * nothing. */
@@ -131,15 +129,14 @@ SIMGP_API void scmn_bsr_skip(scmn_bsr_ctx *ctx, int32_t n);
  * Works at any bit position: what does not fit the cache comes from the byte at `cur`. The cache is
  * topped up on the way, so `cache`, `bits` and `cur` may change, but not what will be read. */
 SIMGP_API uint32_t scmn_bsr_peek(scmn_bsr_ctx *ctx, int32_t n);
-/* Passes over nskip bits and peeks at the next npeek (each 0 to 32); 0 if skipping meets the end.
- */
+/* Passes over nskip bits and peeks at the next npeek (each 0 to 32). Gives 0 if skipping meets the
+ * end. */
 SIMGP_API uint32_t scmn_bsr_skip_peek(scmn_bsr_ctx *ctx, int32_t nskip, int32_t npeek);
 /* Passes over the rest of the current byte; at the start of a byte does nothing. */
 SIMGP_API void scmn_bsr_skip_to_align8(scmn_bsr_ctx *ctx);
 
 /* Least significant bit first: the first bit of a byte is its bit 0, and the first bit read ends up
- * lowest in the result. Of the bytes A5 0F, 4 bits give 5, the next 8 give FA, the next 4 give 0.
- */
+ * lowest in the result: of the bytes A5 0F, 4 bits give 5, then 8 give FA, then 4 give 0. */
 
 /* The next n bits (0 to 32), right-aligned; 0xFFFFFFFF at the end. */
 SIMGP_API uint32_t scmn_bsr_le_read(scmn_bsr_ctx *ctx, int32_t n);
@@ -157,7 +154,8 @@ SIMGP_API int32_t scmn_bsr_clz_in_code(uint32_t x);
  * Most significant bit first. Nothing outside start .. last is touched. There is no flush: pad the
  * last byte, by writing free_bits more bits while free_bits is not 8, before you use the buffer. */
 
-/* Starts writing into `size` bytes (0 or less: none) at buf. The buffer is not touched yet. */
+/* Starts writing into `size` bytes (0 or less: none, and buf may be NULL) at buf, which must stay
+ * as long as the writer is used. on_byte may be NULL. The buffer is not touched yet. */
 SIMGP_API void scmn_bsw_init(scmn_bsw_ctx *ctx, uint8_t *buf, int32_t size,
                              scmn_bsw_byte_fn on_byte);
 

@@ -1,7 +1,7 @@
 #include "scmn/keyframe.h"
 
+#include "rows/choose.h"
 #include "scmn/tags.h"
-#include "simd/choose.h"
 
 namespace simgp::scalar {
 
@@ -11,7 +11,7 @@ ptrdiff_t find_code(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t cod
     return x;
 }
 
-void fill_keyframe(rows &t) { t.find_code = find_code; }
+void fill_keyframe(keyframe_rows &t) { t.find_code = find_code; }
 
 }  // namespace simgp::scalar
 
@@ -29,7 +29,7 @@ struct start_codes {
     // The next start code, which is then buf[k .. k + 2].
     bool next() {
         if (++k >= count) return false;
-        k += simgp::live_rows().find_code(buf + k, count - k, 0xFF, 0x01);
+        k += simgp::live_rows().keyframe.find_code(buf + k, count - k, 0xFF, 0x01);
         return k < count;
     }
 };
@@ -55,7 +55,7 @@ bool mpeg4_key(const uint8_t *buf, ptrdiff_t size) {
 bool h263_key(const uint8_t *buf, ptrdiff_t size) {
     const ptrdiff_t count = size - 6;
     if (count <= 0) return false;
-    const ptrdiff_t k = simgp::live_rows().find_code(buf, count, 0xFC, 0x80);
+    const ptrdiff_t k = simgp::live_rows().keyframe.find_code(buf, count, 0xFC, 0x80);
     if (k == count) return false;
     const uint8_t *b = buf + k;
     const int source_format = b[4] >> 2 & 7;

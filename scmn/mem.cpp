@@ -3,9 +3,9 @@
 #include <stdlib.h>
 #include <string.h>
 
+#include "rows/choose.h"
 #include "scmn/bits.h"
-#include "simd/choose.h"
-#include "simgp/planes.h"
+#include "simgp/lines.h"
 
 namespace simgp::scalar {
 
@@ -15,7 +15,7 @@ void fill_pattern(uint8_t *dst, uint32_t value, size_t size) {
     for (size_t i = 0; i < size; i += 4) memcpy(dst + i, bytes, 4);
 }
 
-void fill_mem(rows &t) { t.fill = fill_pattern; }
+void fill_mem(mem_rows &t) { t = {fill_pattern, nullptr}; }
 
 }  // namespace simgp::scalar
 
@@ -43,16 +43,16 @@ void scmn_mfree_fast_align32(void *p) { scmn_mfree_align32(p); }
 
 void scmn_blk_mcpy(void *dst, const void *src, int32_t dst_stride, int32_t src_stride,
                    int32_t width, int32_t height) {
-    simgp::copy_rows(static_cast<const uint8_t *>(src), src_stride, static_cast<uint8_t *>(dst),
-                     dst_stride, width, height);
+    simgp::copy_lines(simgp::lines_of(src, src_stride), simgp::lines_of(dst, dst_stride), width,
+                      height);
 }
 
-// `whole` bytes of the pattern, and a tail of its low byte. Neither needs to be positive. The row comes
-// last, so that nothing has to be kept for afterwards.
+// `whole` bytes of the pattern, and behind them `tail` bytes of its low byte; of 0 or less nothing. The
+// tail is written first: the call of the row is then the last thing, a jump.
 static inline void fill(void *dst, uint32_t value, ptrdiff_t whole, ptrdiff_t tail) {
     uint8_t *p = static_cast<uint8_t *>(dst);
     if (tail > 0) memset(p + whole, uint8_t(value), size_t(tail));
-    if (whole > 0) simgp::live_rows().fill(p, value, size_t(whole));
+    if (whole > 0) simgp::live_rows().mem.fill(p, value, size_t(whole));
 }
 
 static ptrdiff_t whole_blocks(ptrdiff_t count, ptrdiff_t block) {

@@ -17,8 +17,8 @@ SIMGP_BEGIN_DECLS
  * in the pointer-sized word right below the returned one. A sum above 4 GiB - 1 gives NULL, on
  * 64-bit machines too, so that the answer does not depend on the machine.
  *
- * The fast pair is the same pair under a second name; either release function takes blocks of both.
- */
+ * The fast pair is the same pair under a second name; either release function takes blocks of both,
+ * on any thread. */
 SIMGP_API void *scmn_malloc_align32(uint32_t size);
 SIMGP_API void *scmn_malloc_fast_align32(uint32_t size);
 
@@ -39,12 +39,12 @@ SIMGP_API void scmn_blk_mcpy(void *dst, const void *src, int32_t dst_stride, int
  *
  * Repeat the four bytes of `value`, lowest byte first, from dst on, in whole blocks:
  *
- *   function           bytes of whole blocks               tail
- *   scmn_mset_x128     128 x max(1, ceil(count / 128))     none: writes past count, to a whole block
- *   scmn_mset_x64      128 x floor(count / 128)            none: the last count % 128 bytes stay
- *   scmn_mset_x64a     64 x floor(count / 64)              the other count % 64 bytes
- *   scmn_mset_x32      32 x floor(count / 32)              none: the last count % 32 bytes stay
- *   scmn_mset_x32ax4   32 x floor(count / 32)              the other count % 32 bytes
+ *   function           bytes of whole blocks             tail
+ *   scmn_mset_x128     128 x max(1, ceil(count / 128))   none: writes past count, to a whole block
+ *   scmn_mset_x64      128 x floor(count / 128)          none: the last count % 128 bytes stay
+ *   scmn_mset_x64a     64 x floor(count / 64)            the other count % 64 bytes
+ *   scmn_mset_x32      32 x floor(count / 32)            none: the last count % 32 bytes stay
+ *   scmn_mset_x32ax4   32 x floor(count / 32)            the other count % 32 bytes
  *
  * The bytes of a tail all get the low byte of `value`, so an exact fill of any count needs a value
  * of four equal bytes. `count` is in bytes; of 0 or less nothing is written, except that
@@ -57,7 +57,8 @@ SIMGP_API void scmn_mset_x32(void *dst, uint32_t value, int32_t count);
 SIMGP_API void scmn_mset_x32ax4(void *dst, uint32_t value, int32_t count);
 
 /* Clears whole blocks of 64 words (256 bytes): floor(count / 64) of them, where `count` is in
- * 32-bit words and should be a multiple of 64. The last count % 64 words stay. */
+ * 32-bit words and should be a multiple of 64. The last count % 64 words stay; a count of 0 or less
+ * clears nothing. Any alignment of dst will do. */
 SIMGP_API void scmn_mclr_x64(void *dst, int32_t count);
 
 /* Logarithms --------------------------------------------------------------------------------------
@@ -70,7 +71,8 @@ SIMGP_API int32_t scmn_ceil_log2(uint32_t x);
 /* Build stamp -------------------------------------------------------------------------------------
  *
  * Date and time of the build, as "Dec 27 2010 14:17:40\n" with a space before days of one digit, in
- * a static buffer of 64 bytes that every call writes anew with the same text. A build with
+ * a static buffer of 64 bytes, ended by a 0, that every call writes anew with the same text, on any
+ * thread; the caller does not release it and should not write to it. A build with
  * SOURCE_DATE_EPOCH in its environment has that moment, in UTC. */
 SIMGP_API const char *scmn_version(void);
 

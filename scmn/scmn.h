@@ -23,14 +23,15 @@
  * What holds for every function:
  *
  * - The results are the same on every processor. Integers have 32 bits, pointers and the words that
- * hold pointers are native.
- * - Nothing outside the buffers that are given is read or written; no buffer needs padding or
- * alignment unless the function says so.
- * - Nothing is allocated but by the aligned allocator. No threads, nothing to start up or shut
- * down. All functions may run on any number of threads at once, on separate contexts and
- * destinations.
+ *   hold pointers are native.
+ * - Nothing outside the buffers that are given is read or written, unless the function says so; no
+ *   buffer needs padding or alignment.
+ * - Nothing is allocated but by the aligned allocator. No threads, no state that a caller can see,
+ *   nothing to start up or shut down. All functions may run on any number of threads at once, on
+ *   separate contexts and destinations.
  * - Failures are reported in the returned value and nowhere else. Arguments outside their range are
- * not checked, unless the function says what it does with them.
+ *   not checked, unless the function says what it does with them; no pointer may be NULL, unless it
+ *   says so.
  */
 #ifndef SCMN_SCMN_H
 #define SCMN_SCMN_H

@@ -48,34 +48,58 @@ enum {
     ((uint32_t)(uint8_t)(a) | (uint32_t)(uint8_t)(b) << 8 | (uint32_t)(uint8_t)(c) << 16 | \
      (uint32_t)(uint8_t)(d) << 24)
 
-/* The media type of a tag: a FourCC, or the number of a WAVE format (wFormatTag). Only the
- * spellings listed are known; upper and lower case are different.
+/* The media type (SCMN_MT_*) of a tag: a FourCC as SCMN_FOURCC makes it, or the number of a WAVE
+ * format (wFormatTag). Any 32-bit value may be given. Only the spellings listed are known; upper
+ * and lower case are different.
  *
- *   scmn_fcc2mt_aud   SCMN_MT_PCM           1              SCMN_MT_DTS           0x2001
- *                     SCMN_MT_ALAW          6              SCMN_MT_AMRNB         samr
- *                     SCMN_MT_MULAW         7              SCMN_MT_AMRWB         sawb
- *                     SCMN_MT_MPEGAUDIO     0x50           SCMN_MT_QCELP         sqcp dqcp
- *                     SCMN_MT_MP3           0x55           SCMN_MT_WMA           0x160 0x161
- *                     SCMN_MT_AAC           0xFF aac_ mp4a SCMN_MT_WMAPRO        0x162
- *                     SCMN_MT_AC3           0x2000         SCMN_MT_WMALOSSLESS   0x163
- *                                                          SCMN_MT_EVRC          evrc
- *                     (the _ of aac_ is a space), else SCMN_MT_AUD_UNKNOWN
- *   scmn_fcc2mt_vid   SCMN_MT_MPEG4         DX50 dx50 DIVX divx XVID xvid DIV4 div4 FMP4 MP4V mp4v
- * M4S2 m4s2 SCMN_MT_H263          H263 h263 d263 s263 SCMN_MT_H264          AVC1 avc1 avcC H264
- * h264 x264 SCMN_MT_WMV1          WMV1 wmv1 SCMN_MT_WMV2          WMV2 wmv2 SCMN_MT_WMV3 WMV3 wmv3
- *                     SCMN_MT_DIV3          DIV3 div3
- *                     else SCMN_MT_VID_UNKNOWN
- *   scmn_fcc2mt_drm   SCMN_MT_DRM           DIVX divx
- *                     else SCMN_MT_DRM_UNKNOWN
- *   scmn_fcc2mt       what scmn_fcc2mt_aud knows, else what scmn_fcc2mt_vid knows, else what
- *                     scmn_fcc2mt_drm knows, else SCMN_MT_NONE. DIVX is SCMN_MT_MPEG4 here.
+ * scmn_fcc2mt_aud, numbers of WAVE formats and FourCCs (the _ of aac_ is a space):
+ *
+ *   SCMN_MT_PCM           1
+ *   SCMN_MT_ALAW          6
+ *   SCMN_MT_MULAW         7
+ *   SCMN_MT_MPEGAUDIO     0x50
+ *   SCMN_MT_MP3           0x55
+ *   SCMN_MT_AAC           0xFF aac_ mp4a
+ *   SCMN_MT_AC3           0x2000
+ *   SCMN_MT_DTS           0x2001
+ *   SCMN_MT_AMRNB         samr
+ *   SCMN_MT_AMRWB         sawb
+ *   SCMN_MT_QCELP         sqcp dqcp
+ *   SCMN_MT_WMA           0x160 0x161
+ *   SCMN_MT_WMAPRO        0x162
+ *   SCMN_MT_WMALOSSLESS   0x163
+ *   SCMN_MT_EVRC          evrc
+ *   SCMN_MT_AUD_UNKNOWN   everything else
+ *
+ * scmn_fcc2mt_vid:
+ *
+ *   SCMN_MT_MPEG4         DX50 dx50 DIVX divx XVID xvid DIV4 div4 FMP4 MP4V mp4v M4S2 m4s2
+ *   SCMN_MT_H263          H263 h263 d263 s263
+ *   SCMN_MT_H264          AVC1 avc1 avcC H264 h264 x264
+ *   SCMN_MT_WMV1          WMV1 wmv1
+ *   SCMN_MT_WMV2          WMV2 wmv2
+ *   SCMN_MT_WMV3          WMV3 wmv3
+ *   SCMN_MT_DIV3          DIV3 div3
+ *   SCMN_MT_VID_UNKNOWN   everything else
+ *
+ * scmn_fcc2mt_drm:
+ *
+ *   SCMN_MT_DRM           DIVX divx
+ *   SCMN_MT_DRM_UNKNOWN   everything else
+ *
+ * scmn_fcc2mt: what scmn_fcc2mt_aud knows, else what scmn_fcc2mt_vid knows, else what
+ * scmn_fcc2mt_drm knows, else SCMN_MT_NONE. DIVX is SCMN_MT_MPEG4 here.
  *
  * Tags that mean something else in other places:
+ *
  *   DIV4   in AVI files is most often MS-MPEG4 version 3 at a low motion setting, the codec of
- * DIV3, not MPEG-4 part 2. Such a picture has no start codes, so scmn_is_vkeyfrm answers 0 to all
- * of them. mp4a   in MP4 files says that an MPEG-4 audio description follows; what it describes is
- * AAC nearly always, but may be MP3 or others. The object type in the description ('esds') decides.
+ *          DIV3, not MPEG-4 part 2. Such a picture has no start codes, so scmn_is_vkeyfrm answers 0
+ *          to all of them.
+ *   mp4a   in MP4 files says that an MPEG-4 audio description follows; what it describes is AAC
+ *          nearly always, but may be MP3 or others. The object type in the description ('esds')
+ *          decides.
  *   mp4v   in MP4 files likewise: MPEG-4 part 2 nearly always, but MPEG-1, MPEG-2 and JPEG exist.
+ *
  * A container that spells its tags differently has to be translated first: MP43 and MPG3 for DIV3,
  * say.
  *

@@ -7,6 +7,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "simd/limits.h"
+
 namespace simgp::avx2 {
 
 inline constexpr int bytes = 32;
@@ -32,8 +34,20 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
                                    _mm_unpackhi_epi8(a, b), 1);
 }
 
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
+    const auto block = [=](int j) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + j * step));
+    };
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
+}
+inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
+    _mm_storeu_si128(reinterpret_cast<__m128i *>(p), _mm256_castsi256_si128(v));
+    _mm_storeu_si128(reinterpret_cast<__m128i *>(p + step), _mm256_extracti128_si256(v, 1));
+}
+
 inline u8v set_u8(uint8_t x) { return _mm256_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm256_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return set_u16(uint16_t(b << 8 | a)); }
 inline u8v set_u32(uint32_t x) { return _mm256_set1_epi32(static_cast<int>(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) {
@@ -42,6 +56,12 @@ inline void store_stream(uint8_t *p, u8v v) {
 inline void stream_end() { _mm_sfence(); }
 
 inline u8v min_u8(u8v a, u8v b) { return _mm256_min_epu8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return _mm256_max_epu8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return _mm256_avg_epu8(a, b); }
+// One of the two differences is 0.
+inline u8v absdiff_u8(u8v a, u8v b) {
+    return _mm256_or_si256(_mm256_subs_epu8(a, b), _mm256_subs_epu8(b, a));
+}
 inline int first_zero(u8v v) {
     const unsigned zero =
         static_cast<unsigned>(_mm256_movemask_epi8(_mm256_cmpeq_epi8(v, _mm256_setzero_si256())));
@@ -53,19 +73,26 @@ inline u8v bit_or(u8v a, u8v b) { return _mm256_or_si256(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm256_xor_si256(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm256_slli_epi16(a, N);
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm256_srli_epi16(a, N);
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return _mm256_srai_epi16(a, N);
 }
 
 inline s16v add(s16v a, s16v b) { return _mm256_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm256_adds_epi16(a, b); }
+inline s16v sub(s16v a, s16v b) { return _mm256_sub_epi16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return _mm256_min_epi16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return _mm256_max_epi16(a, b); }
+inline u16v mul(u16v a, u16v b) { return _mm256_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm256_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm256_subs_epu8(a, b); }
@@ -94,13 +121,14 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
     return _mm256_cmpeq_epi8(_mm256_and_si256(s, bit), odd_bit);
 }
 
+inline u16v dot_pairs(u8v samples, u8v weights) { return _mm256_maddubs_epi16(samples, weights); }
+
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
-    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    static_assert(limits::centred_pair<A, B>);
     constexpr bool negative = A < 0 || B < 0;
     constexpr int a = negative ? -A : A, b = negative ? -B : B;
-    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
     const __m256i centred = _mm256_xor_si256(v, _mm256_set1_epi8(-128));
     const __m256i dot =
         _mm256_maddubs_epi16(_mm256_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
@@ -110,12 +138,14 @@ inline s16v pair_dot(u8v v) {
 // K v / 2 = (256 v)(128 K) >> 16.
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm256_add_epi16(
         _mm256_mulhi_epu16(_mm256_and_si256(v, set_u16(0xFF00)), set_u16(128 * K)),
         set_u16(static_cast<uint16_t>(C)));
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm256_add_epi16(_mm256_mulhi_epu16(_mm256_slli_epi16(v, 8), set_u16(128 * K)),
                             set_u16(static_cast<uint16_t>(C)));
 }
@@ -132,11 +162,44 @@ inline u16v odd(u8v v) { return _mm256_srli_epi16(v, 8); }
 inline u8v join(u16v even, u16v odd) { return _mm256_or_si256(even, _mm256_slli_epi16(odd, 8)); }
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     const __m256i halves =
         _mm256_packus_epi16(_mm256_srai_epi16(even, N), _mm256_srai_epi16(odd, N));
     return _mm256_shuffle_epi8(
         halves, _mm256_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15,  //
                                  0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15));
+}
+
+inline u16v widen_low(u8v v) { return _mm256_unpacklo_epi8(v, _mm256_setzero_si256()); }
+inline u16v widen_high(u8v v) { return _mm256_unpackhi_epi8(v, _mm256_setzero_si256()); }
+inline u8v narrow(s16v low, s16v high) { return _mm256_packus_epi16(low, high); }
+
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm256_unpacklo_epi8(a, b);
+    if constexpr (N == 2) return _mm256_unpacklo_epi16(a, b);
+    if constexpr (N == 4) return _mm256_unpacklo_epi32(a, b);
+    if constexpr (N == 8) return _mm256_unpacklo_epi64(a, b);
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm256_unpackhi_epi8(a, b);
+    if constexpr (N == 2) return _mm256_unpackhi_epi16(a, b);
+    if constexpr (N == 4) return _mm256_unpackhi_epi32(a, b);
+    if constexpr (N == 8) return _mm256_unpackhi_epi64(a, b);
+}
+inline u8v shuffle(u8v v, u8v index) { return _mm256_shuffle_epi8(v, index); }
+// Each block reversed, then the blocks exchanged.
+inline u8v reverse_blocks(u8v v, __m128i order) {
+    return _mm256_permute4x64_epi64(shuffle(v, _mm256_broadcastsi128_si256(order)), 0x4E);
+}
+inline u8v reverse_u8(u8v v) {
+    return reverse_blocks(v, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
+}
+inline u8v reverse_u16(u8v v) {
+    return reverse_blocks(v, _mm_setr_epi8(14, 15, 12, 13, 10, 11, 8, 9, 6, 7, 4, 5, 2, 3, 0, 1));
 }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {
@@ -157,14 +220,6 @@ inline u8v by8_to_natural(u8v v) { return _mm256_permute4x64_epi64(v, 0xD8); }
 struct pair_u8 {
     u8v even, odd;
 };
-// The 16 bytes at p and those at q.
-inline __m256i load_blocks(const uint8_t *p, const uint8_t *q) {
-    const auto block = [](const uint8_t *at) {
-        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(at));
-    };
-    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(p)), block(q), 1);
-}
-
 // In-block: the even bytes of each block go to its lower half, the odd ones to its upper half; then
 // halves of two vectors meet. What is loaded where decides the order.
 inline pair_u8 split_blocks(__m256i a, __m256i b) {
@@ -176,7 +231,7 @@ inline pair_u8 split_blocks(__m256i a, __m256i b) {
 }
 inline pair_u8 load_split(const uint8_t *p) { return split_blocks(load(p), load(p + bytes)); }
 inline pair_u8 load_split_natural(const uint8_t *p) {
-    return split_blocks(load_blocks(p, p + 32), load_blocks(p + 16, p + 48));
+    return split_blocks(load_blocks(p, 32), load_blocks(p + 16, 32));
 }
 inline pair_u8 load_split_by4(const uint8_t *p) {
     return split_blocks(_mm256_permute4x64_epi64(load(p), 0xD8),
@@ -240,6 +295,7 @@ inline constexpr zip3_index zip3;
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
                               s16v c_even, s16v c_odd) {
+    static_assert(limits::narrowing_shift<C>);
     const __m256i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
     const __m256i c =
         _mm256_packus_epi16(_mm256_srai_epi16(c_even, C), _mm256_srai_epi16(c_odd, C));
@@ -249,14 +305,9 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
         return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(zip3.ab[k])),
                                _mm256_shuffle_epi8(c, load(zip3.c[k])));
     };
-    const auto store_blocks = [=](int k, __m256i v) {
-        _mm_storeu_si128(reinterpret_cast<__m128i *>(p + 16 * k), _mm256_castsi256_si128(v));
-        _mm_storeu_si128(reinterpret_cast<__m128i *>(p + 48 + 16 * k),
-                         _mm256_extracti128_si256(v, 1));
-    };
-    store_blocks(0, part(ab_lo, 0));
-    store_blocks(1, part(ab_mid, 1));
-    store_blocks(2, part(ab_hi, 2));
+    store_blocks(p, 48, part(ab_lo, 0));
+    store_blocks(p + 16, 48, part(ab_mid, 1));
+    store_blocks(p + 32, 48, part(ab_hi, 2));
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
@@ -284,7 +335,7 @@ struct rgb_v {
 };
 
 inline rgb_v load_565(const uint8_t *p) {
-    const __m256i v0 = load_blocks(p, p + 32), v1 = load_blocks(p + 16, p + 48),
+    const __m256i v0 = load_blocks(p, 32), v1 = load_blocks(p + 16, 32),
                   low = _mm256_set1_epi32(0xFFFF);
     const __m256i even = _mm256_packus_epi32(_mm256_and_si256(v0, low), _mm256_and_si256(v1, low));
     const __m256i odd = _mm256_packus_epi32(_mm256_srli_epi32(v0, 16), _mm256_srli_epi32(v1, 16));
@@ -312,7 +363,7 @@ inline __m256i channel_order(int first) {
 // bytes; the last begins early, to end with the pixels.
 inline rgb_v load_888(const uint8_t *p) {
     const auto four = [&](ptrdiff_t at, __m256i order) {
-        return _mm256_shuffle_epi8(load_blocks(p + at, p + at + 48), order);
+        return _mm256_shuffle_epi8(load_blocks(p + at, 48), order);
     };
     const __m256i order = channel_order(0);
     const __m256i v0 = four(0, order), v1 = four(12, order), v2 = four(24, order);
@@ -326,18 +377,19 @@ inline rgb_v load_888(const uint8_t *p) {
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline __m256i dot(__m256i ac, __m256i b) {
-    static_assert(A >= -128 && A <= 127 && C >= -128 && C <= 127 && A + C >= -128 && A + C <= 127);
     const __m256i pair =
         _mm256_maddubs_epi16(ac, _mm256_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
     return _mm256_add_epi16(pair, _mm256_mullo_epi16(b, _mm256_set1_epi16(B)));
 }
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     return _mm256_add_epi8(
         join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     return _mm256_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 
@@ -356,8 +408,8 @@ inline void store_565(uint8_t *p, __m256i a, __m256i b, __m256i c, __m256i d) {
     store(p + bytes, _mm256_packus_epi32(words_565(c), words_565(d)));
 }
 inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
-    store_565(p, load_blocks(q, q + 32), load_blocks(q + 16, q + 48), load_blocks(q + 64, q + 96),
-              load_blocks(q + 80, q + 112));
+    store_565(p, load_blocks(q, 32), load_blocks(q + 16, 32), load_blocks(q + 64, 32),
+              load_blocks(q + 80, 32));
 }
 inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
     // The last block begins early, to end with the pixels.
@@ -368,11 +420,11 @@ inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
     };
     const __m256i all = _mm256_broadcastsi128_si256(order(0)),
                   last = _mm256_inserti128_si256(all, order(4), 1);
-    const auto eight = [](const uint8_t *a, const uint8_t *b, __m256i o) {
-        return _mm256_shuffle_epi8(load_blocks(a, b), o);
+    const auto eight = [](const uint8_t *from, ptrdiff_t step, __m256i o) {
+        return _mm256_shuffle_epi8(load_blocks(from, step), o);
     };
-    store_565(p, eight(q, q + 24, all), eight(q + 12, q + 36, all), eight(q + 48, q + 72, all),
-              eight(q + 60, q + 80, last));
+    store_565(p, eight(q, 24, all), eight(q + 12, 24, all), eight(q + 48, 24, all),
+              eight(q + 60, 20, last));
 }
 
 }  // namespace simgp::avx2

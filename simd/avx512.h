@@ -7,6 +7,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "simd/limits.h"
+
 namespace simgp::avx512 {
 
 inline constexpr int bytes = 64;
@@ -32,8 +34,31 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return _mm512_or_si512(widen(p), _mm512_slli_epi16(widen(q), 8));
 }
 
+// Inserted from memory, a block needs no permutation: hence one after the other.
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
+    const auto block = [=](int j) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + j * step));
+    };
+    __m512i v = _mm512_castsi128_si512(block(0));
+    v = _mm512_inserti32x4(v, block(1), 1);
+    v = _mm512_inserti32x4(v, block(2), 2);
+    return _mm512_inserti32x4(v, block(3), 3);
+}
+// Extracted to memory from the lower or the upper half, a block needs no permutation either.
+inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
+    const auto put = [=](int j, __m128i block) {
+        _mm_storeu_si128(reinterpret_cast<__m128i *>(p + j * step), block);
+    };
+    const __m256i low = _mm512_castsi512_si256(v), high = _mm512_extracti64x4_epi64(v, 1);
+    put(0, _mm256_castsi256_si128(low));
+    put(1, _mm256_extracti128_si256(low, 1));
+    put(2, _mm256_castsi256_si128(high));
+    put(3, _mm256_extracti128_si256(high, 1));
+}
+
 inline u8v set_u8(uint8_t x) { return _mm512_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm512_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return set_u16(uint16_t(b << 8 | a)); }
 inline u8v set_u32(uint32_t x) { return _mm512_set1_epi32(static_cast<int>(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) {
@@ -42,6 +67,12 @@ inline void store_stream(uint8_t *p, u8v v) {
 inline void stream_end() { _mm_sfence(); }
 
 inline u8v min_u8(u8v a, u8v b) { return _mm512_min_epu8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return _mm512_max_epu8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return _mm512_avg_epu8(a, b); }
+// One of the two differences is 0.
+inline u8v absdiff_u8(u8v a, u8v b) {
+    return _mm512_or_si512(_mm512_subs_epu8(a, b), _mm512_subs_epu8(b, a));
+}
 inline int first_zero(u8v v) {
     const uint64_t zero = _mm512_testn_epi8_mask(v, v);
     return zero ? __builtin_ctzll(zero) : bytes;
@@ -52,19 +83,26 @@ inline u8v bit_or(u8v a, u8v b) { return _mm512_or_si512(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm512_xor_si512(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm512_slli_epi16(a, N);
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm512_srli_epi16(a, N);
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return _mm512_srai_epi16(a, N);
 }
 
 inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }
+inline s16v sub(s16v a, s16v b) { return _mm512_sub_epi16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return _mm512_min_epi16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return _mm512_max_epi16(a, b); }
+inline u16v mul(u16v a, u16v b) { return _mm512_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm512_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm512_subs_epu8(a, b); }
@@ -84,13 +122,14 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
     return static_cast<uint32_t>(sum) ^ x ^ y ^ ~odd;
 }
 
+inline u16v dot_pairs(u8v samples, u8v weights) { return _mm512_maddubs_epi16(samples, weights); }
+
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
-    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    static_assert(limits::centred_pair<A, B>);
     constexpr bool negative = A < 0 || B < 0;
     constexpr int a = negative ? -A : A, b = negative ? -B : B;
-    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
     const __m512i centred = _mm512_xor_si512(v, _mm512_set1_epi8(-128));
     const __m512i dot =
         _mm512_maddubs_epi16(_mm512_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
@@ -100,12 +139,14 @@ inline s16v pair_dot(u8v v) {
 // K v / 2 = (256 v)(128 K) >> 16.
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm512_add_epi16(
         _mm512_mulhi_epu16(_mm512_and_si512(v, set_u16(0xFF00)), set_u16(128 * K)),
         set_u16(static_cast<uint16_t>(C)));
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm512_add_epi16(_mm512_mulhi_epu16(_mm512_slli_epi16(v, 8), set_u16(128 * K)),
                             set_u16(static_cast<uint16_t>(C)));
 }
@@ -122,11 +163,46 @@ inline u16v odd(u8v v) { return _mm512_srli_epi16(v, 8); }
 inline u8v join(u16v even, u16v odd) { return _mm512_or_si512(even, _mm512_slli_epi16(odd, 8)); }
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     const __m512i halves =
         _mm512_packus_epi16(_mm512_srai_epi16(even, N), _mm512_srai_epi16(odd, N));
     return _mm512_shuffle_epi8(halves, _mm512_broadcast_i32x4(_mm_setr_epi8(
                                            0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15)));
 }
+
+inline u16v widen_low(u8v v) { return _mm512_unpacklo_epi8(v, _mm512_setzero_si512()); }
+inline u16v widen_high(u8v v) { return _mm512_unpackhi_epi8(v, _mm512_setzero_si512()); }
+inline u8v narrow(s16v low, s16v high) { return _mm512_packus_epi16(low, high); }
+
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm512_unpacklo_epi8(a, b);
+    if constexpr (N == 2) return _mm512_unpacklo_epi16(a, b);
+    if constexpr (N == 4) return _mm512_unpacklo_epi32(a, b);
+    if constexpr (N == 8) return _mm512_unpacklo_epi64(a, b);
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm512_unpackhi_epi8(a, b);
+    if constexpr (N == 2) return _mm512_unpackhi_epi16(a, b);
+    if constexpr (N == 4) return _mm512_unpackhi_epi32(a, b);
+    if constexpr (N == 8) return _mm512_unpackhi_epi64(a, b);
+}
+inline u8v shuffle(u8v v, u8v index) { return _mm512_shuffle_epi8(v, index); }
+struct reverse_index {
+    alignas(64) uint8_t u8[64], u16[64];
+    constexpr reverse_index() : u8(), u16() {
+        for (int i = 0; i < 64; i++) {
+            u8[i] = static_cast<uint8_t>(63 - i);
+            u16[i] = static_cast<uint8_t>((63 - i) ^ 1);
+        }
+    }
+};
+inline constexpr reverse_index reverse_order;
+inline u8v reverse_u8(u8v v) { return _mm512_permutexvar_epi8(load(reverse_order.u8), v); }
+inline u8v reverse_u16(u8v v) { return _mm512_permutexvar_epi8(load(reverse_order.u16), v); }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {
     constexpr int select = 0xCA;  // first ? second : third, bit by bit
@@ -236,6 +312,7 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = 
 
 template <int N>
 inline __m512i pack(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     return _mm512_packus_epi16(_mm512_srai_epi16(even, N), _mm512_srai_epi16(odd, N));
 }
 template <int A, int B, int C>
@@ -323,18 +400,19 @@ inline rgb_v load_888(const uint8_t *p) {
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline __m512i dot(__m512i ac, __m512i b) {
-    static_assert(A >= -128 && A <= 127 && C >= -128 && C <= 127 && A + C >= -128 && A + C <= 127);
     const __m512i pair =
         _mm512_maddubs_epi16(ac, _mm512_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
     return _mm512_add_epi16(pair, _mm512_mullo_epi16(b, _mm512_set1_epi16(B)));
 }
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     return _mm512_add_epi8(
         join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     return _mm512_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 

@@ -18,6 +18,8 @@
 #include <stdint.h>
 #include <string.h>
 
+#include "simd/limits.h"
+
 #ifndef SIMD_LANES_BYTES
 #define SIMD_LANES_BYTES 32
 #define SIMD_LANES_NAMESPACE lanes
@@ -83,9 +85,22 @@ inline u8v set_u8(uint8_t x) {
 inline u16v set_u16(uint16_t x) {
     return make<u16v>([&](int) { return x; });
 }
+// Bytes a and b in turn.
+inline u8v set_pair(uint8_t a, uint8_t b) {
+    return make<u8v>([&](int i) { return i & 1 ? b : a; });
+}
 // The four bytes of x, lowest first, over and over.
 inline u8v set_u32(uint32_t x) {
     return make<u8v>([&](int i) { return x >> i % 4 * 8 & 255; });
+}
+
+// Block by block: block j from or to the 16 bytes at p + j step. Blocks that are stored must not
+// overlap.
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
+    return make<u8v>([&](int i) { return p[i / 16 * step + i % 16]; });
+}
+inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
+    for (int i = 0; i < bytes; i++) p[i / 16 * step + i % 16] = v.lane[i];
 }
 
 // A store to an address that is a multiple of `bytes`, past the caches where the machine can do
@@ -93,18 +108,31 @@ inline u8v set_u32(uint32_t x) {
 inline void store_stream(uint8_t *p, u8v v) { store(p, v); }
 inline void stream_end() {}
 
-// The smaller of each pair of bytes; the index of the first byte that is 0, `bytes` if there is
-// none.
+// The smaller and the larger of each pair of bytes, their mean rounded up, and their distance.
 inline u8v min_u8(u8v a, u8v b) {
     return make<u8v>([&](int i) { return a.lane[i] < b.lane[i] ? a.lane[i] : b.lane[i]; });
 }
+inline u8v max_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] > b.lane[i] ? a.lane[i] : b.lane[i]; });
+}
+inline u8v avg_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return (a.lane[i] + b.lane[i] + 1) >> 1; });
+}
+inline u8v absdiff_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) {
+        const int d = a.lane[i] - b.lane[i];
+        return d < 0 ? -d : d;
+    });
+}
+
+// The index of the first byte that is 0, `bytes` if there is none.
 inline int first_zero(u8v v) {
     int i = 0;
     while (i < bytes && v.lane[i] != 0) i++;
     return i;
 }
 
-// Bits.
+// Bits. Counts of shifts are 1 ... 15.
 inline u8v bit_and(u8v a, u8v b) {
     return make<u8v>([&](int i) { return a.lane[i] & b.lane[i]; });
 }
@@ -122,23 +150,40 @@ inline u16v bit_or(u16v a, u16v b) {
 }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return make<u16v>([&](int i) { return uint16_t(a.lane[i] << N); });
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return make<u16v>([&](int i) { return a.lane[i] >> N; });
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return make<s16v>([&](int i) { return a.lane[i] >> N; });
 }
 
-// Signed 16-bit sums, wrapping and saturating.
+// Signed 16-bit sums and differences, wrapping, and sums, saturating.
 inline s16v add(s16v a, s16v b) {
     return make<s16v>([&](int i) { return int16_t(a.lane[i] + b.lane[i]); });
 }
+inline s16v sub(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return int16_t(a.lane[i] - b.lane[i]); });
+}
 inline s16v add_sat(s16v a, s16v b) {
     return make<s16v>([&](int i) { return clamp_to(-32768, 32767, a.lane[i] + b.lane[i]); });
+}
+// The smaller and the larger of signed lanes.
+inline s16v min_s16(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return a.lane[i] < b.lane[i] ? a.lane[i] : b.lane[i]; });
+}
+inline s16v max_s16(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return a.lane[i] > b.lane[i] ? a.lane[i] : b.lane[i]; });
+}
+// The low 16 bits of the products, which are the same for signed lanes.
+inline u16v mul(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return uint16_t(unsigned(a.lane[i]) * b.lane[i]); });
 }
 
 // Sums and differences of bytes, saturating.
@@ -185,10 +230,20 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &s) {
     });
 }
 
+// Lane i = samples[2i] weights[2i] + samples[2i + 1] weights[2i + 1]. Weights are 0 ... 127, and
+// those of a pair at most 128 together: the sums are at most 128 * 255 = 32640 and fit signed lanes.
+inline u16v dot_pairs(u8v samples, u8v weights) {
+    return make<u16v>([&](int i) {
+        return samples.lane[2 * i] * weights.lane[2 * i] +
+               samples.lane[2 * i + 1] * weights.lane[2 * i + 1];
+    });
+}
+
 // A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the
-// same sign and at most 255 in size, and the sum of the two products fits 16 bits.
+// same sign, and A + B is at most 255 in size.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
+    static_assert(limits::centred_pair<A, B>);
     return make<s16v>([&](int i) {
         return int16_t(A * (v.lane[2 * i] - 128) + B * (v.lane[2 * i + 1] - 128) + C);
     });
@@ -197,10 +252,12 @@ inline s16v pair_dot(u8v v) {
 // the low byte.
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i + 1] >> 1) + C); });
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i] >> 1) + C); });
 }
 // 256 (low byte - 128) of each byte pair.
@@ -224,11 +281,58 @@ inline u16v odd(u8v v) {
 inline u8v join(u16v even, u16v odd) {
     return make<u8v>([&](int i) { return (i & 1 ? odd : even).lane[i / 2]; });
 }
-// Byte 2i = clamp(even lane i >> N), byte 2i + 1 = clamp(odd lane i >> N), to 0 ... 255.
+// Byte 2i = clamp(even lane i >> N), byte 2i + 1 = clamp(odd lane i >> N), to 0 ... 255; N is
+// 1 ... 8.
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     return make<u8v>(
         [&](int i) { return clamp_to(0, 255, (i & 1 ? odd : even).lane[i / 2] >> N); });
+}
+
+// Within blocks: lanes from the lower or the upper 8 bytes of a block, and back, clamped to
+// 0 ... 255: the lower 8 bytes of a block from `low`, the upper ones from `high`.
+inline u16v widen_low(u8v v) {
+    return make<u16v>([&](int i) { return v.lane[i / 8 * 16 + i % 8]; });
+}
+inline u16v widen_high(u8v v) {
+    return make<u16v>([&](int i) { return v.lane[i / 8 * 16 + 8 + i % 8]; });
+}
+inline u8v narrow(s16v low, s16v high) {
+    return make<u8v>([&](int i) {
+        const int block = i / 16, byte = i % 16;
+        return clamp_to(0, 255, (byte < 8 ? low : high).lane[block * 8 + byte % 8]);
+    });
+}
+
+// Within blocks: granules of N bytes of the lower, or of the upper, halves of a's and b's block in
+// turn; N is 1, 2, 4 or 8.
+template <int N>
+inline u8v zip_half(u8v a, u8v b, int half) {
+    static_assert(limits::granule<N>);
+    return make<u8v>([&](int i) {
+        const int block = i / 16, granule = i % 16 / N;
+        return (granule & 1 ? b : a).lane[block * 16 + half * 8 + granule / 2 * N + i % N];
+    });
+}
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    return zip_half<N>(a, b, 0);
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    return zip_half<N>(a, b, 1);
+}
+// Within blocks: byte i is byte index[i] of the same block of v; indices are 0 ... 15.
+inline u8v shuffle(u8v v, u8v index) {
+    return make<u8v>([&](int i) { return v.lane[i / 16 * 16 + index.lane[i]]; });
+}
+// Across the whole vector: its bytes, or its byte pairs, last to first.
+inline u8v reverse_u8(u8v v) {
+    return make<u8v>([&](int i) { return v.lane[bytes - 1 - i]; });
+}
+inline u8v reverse_u16(u8v v) {
+    return make<u8v>([&](int i) { return v.lane[(bytes - 1 - i) ^ 1]; });
 }
 
 // The 565 word of three channels with 7 fractional bits, high to low; negative channels count as 0.
@@ -239,15 +343,15 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
     });
 }
 
-// Orders of pixels, see above.
+// Changes of the order of pixels. From natural order: part k of block j, a granule of Granule bytes,
+// is granule k blocks + j of v.
 template <int Granule>
 inline u8v natural_to(u8v v) {
-    constexpr int parts = 16 / Granule;
+    static_assert(limits::granule<Granule>);
     return make<u8v>([&](int i) {
         const int block = i / 16, part = i % 16 / Granule;
         return v.lane[(part * blocks + block) * Granule + i % Granule];
     });
-    static_assert(parts * Granule == 16);
 }
 inline u8v natural_to_by8(u8v v) { return natural_to<8>(v); }
 inline u8v natural_to_by4(u8v v) { return natural_to<4>(v); }
@@ -258,8 +362,8 @@ inline u8v by8_to_natural(u8v v) {
     });
 }
 
-// 2 bytes bytes, split: byte 2i and 2i + 1 of memory are byte i of even and odd. load_split gives
-// by8 order, the others that of their names.
+// Twice `bytes` bytes of memory, split: bytes 2i and 2i + 1 are byte i of even and of odd.
+// load_split gives by8 order, the others that of their names.
 struct pair_u8 {
     u8v even, odd;
 };
@@ -344,9 +448,10 @@ inline rgb_v load_888(const uint8_t *p) {
 }
 
 // ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, their sum is at
-// most 256, and A + C <= 127.
+// most 256, A + C <= 127, and B <= 255.
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     return make<u8v>([&](int i) {
         return ((A * v.c[0].lane[i] + B * v.c[1].lane[i] + C * v.c[2].lane[i]) >> 8) + D;
     });
@@ -355,6 +460,7 @@ inline u8v dot_high(rgb_v v) {
 // -128 ... 127, B in -255 ... 255.
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     return make<u16v>([&](int i) {
         return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
     });

@@ -7,6 +7,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "simd/limits.h"
+
 namespace simgp::neon {
 
 inline constexpr int bytes = 16;
@@ -28,14 +30,21 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return vcombine_u8(zip.val[0], zip.val[1]);
 }
 
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
+inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
+
 inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
 inline u16v set_u16(uint16_t x) { return vdupq_n_u16(x); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return as_u8(set_u16(uint16_t(b << 8 | a))); }
 inline u8v set_u32(uint32_t x) { return vreinterpretq_u8_u32(vdupq_n_u32(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) { store(p, v); }
 inline void stream_end() {}
 
 inline u8v min_u8(u8v a, u8v b) { return vminq_u8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return vmaxq_u8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return vrhaddq_u8(a, b); }
+inline u8v absdiff_u8(u8v a, u8v b) { return vabdq_u8(a, b); }
 inline int first_zero(u8v v) {
     // Four bits for each byte, in one 64-bit word.
     const uint8x8_t zero = vshrn_n_u16(as_u16(vceqq_u8(v, vdupq_n_u8(0))), 4);
@@ -50,19 +59,26 @@ inline u16v bit_and(u16v a, u16v b) { return vandq_u16(a, b); }
 inline u16v bit_or(u16v a, u16v b) { return vorrq_u16(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return vshlq_n_u16(a, N);
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return vshrq_n_u16(a, N);
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return vshrq_n_s16(a, N);
 }
 
 inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }
+inline s16v sub(s16v a, s16v b) { return vsubq_s16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
+inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return vqsubq_u8(a, b); }
@@ -99,9 +115,21 @@ inline u16v even(u8v v) { return vandq_u16(as_u16(v), vdupq_n_u16(255)); }
 inline u16v odd(u8v v) { return vshrq_n_u16(as_u16(v), 8); }
 inline u8v join(u16v even, u16v odd) { return as_u8(vsliq_n_u16(even, odd, 8)); }
 
+inline u16v dot_pairs(u8v samples, u8v weights) {
+    const u16v low = vmull_u8(vget_low_u8(samples), vget_low_u8(weights));
+#ifdef __aarch64__
+    return vpaddq_u16(low, vmull_high_u8(samples, weights));
+#else
+    const u16v high = vmull_u8(vget_high_u8(samples), vget_high_u8(weights));
+    return vcombine_u16(vpadd_u16(vget_low_u16(low), vget_high_u16(low)),
+                        vpadd_u16(vget_low_u16(high), vget_high_u16(high)));
+#endif
+}
+
 // The offsets of 128 go into the constant, and the products are accumulated on it.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
+    static_assert(limits::centred_pair<A, B>);
     s16v sum = vdupq_n_s16(static_cast<int16_t>(C - 128 * (A + B)));
     if constexpr (A != 0) sum = vmlaq_n_s16(sum, as_s16(even(v)), A);
     if constexpr (B != 0) sum = vmlaq_n_s16(sum, as_s16(odd(v)), B);
@@ -114,10 +142,12 @@ inline s16v half_product(u16v v) {
 }
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return half_product<K, C>(odd(v));
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return half_product<K, C>(even(v));
 }
 inline s16v low_minus_128_shl8(u8v v) {
@@ -129,8 +159,59 @@ inline s16v high_minus_128_shl8(u8v v) {
 
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     const uint8x8x2_t zip = vzip_u8(vqshrun_n_s16(even, N), vqshrun_n_s16(odd, N));
     return vcombine_u8(zip.val[0], zip.val[1]);
+}
+
+inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
+inline u16v widen_high(u8v v) { return vmovl_u8(vget_high_u8(v)); }
+inline u8v narrow(s16v low, s16v high) { return vcombine_u8(vqmovun_s16(low), vqmovun_s16(high)); }
+
+// 32-bit ARM interleaves whole vectors with one instruction; of a pair zip_low and zip_high of the
+// same vectors the compiler makes one.
+#ifdef __aarch64__
+#define SIMD_ZIP(low_or_high, lane, a, b) vzip##low_or_high##q_##lane(a, b)
+#else
+#define SIMD_ZIP(low_or_high, lane, a, b) vzipq_##lane(a, b).val[low_or_high - 1]
+#endif
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return SIMD_ZIP(1, u8, a, b);
+    if constexpr (N == 2) return as_u8(SIMD_ZIP(1, u16, as_u16(a), as_u16(b)));
+    if constexpr (N == 4)
+        return vreinterpretq_u8_u32(
+            SIMD_ZIP(1, u32, vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
+    if constexpr (N == 8) return vcombine_u8(vget_low_u8(a), vget_low_u8(b));
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return SIMD_ZIP(2, u8, a, b);
+    if constexpr (N == 2) return as_u8(SIMD_ZIP(2, u16, as_u16(a), as_u16(b)));
+    if constexpr (N == 4)
+        return vreinterpretq_u8_u32(
+            SIMD_ZIP(2, u32, vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
+    if constexpr (N == 8) return vcombine_u8(vget_high_u8(a), vget_high_u8(b));
+}
+#undef SIMD_ZIP
+inline u8v shuffle(u8v v, u8v index) {
+#ifdef __aarch64__
+    return vqtbl1q_u8(v, index);
+#else
+    const uint8x8x2_t table = {{vget_low_u8(v), vget_high_u8(v)}};
+    return vcombine_u8(vtbl2_u8(table, vget_low_u8(index)), vtbl2_u8(table, vget_high_u8(index)));
+#endif
+}
+// Each half reversed, then the halves exchanged.
+inline u8v reverse_u8(u8v v) {
+    const u8v halves = vrev64q_u8(v);
+    return vextq_u8(halves, halves, 8);
+}
+inline u8v reverse_u16(u8v v) {
+    const u8v halves = as_u8(vrev64q_u16(as_u16(v)));
+    return vextq_u8(halves, halves, 8);
 }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {
@@ -158,13 +239,20 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
 
-inline void store_zip8(uint8_t *p, u8v even, u8v odd) { vst2q_u8(p, uint8x16x2_t{{even, odd}}); }
+// Some compilers have macros for stores of several vectors, which take no braces: hence the names.
+inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
+    const uint8x16x2_t v = {{even, odd}};
+    vst2q_u8(p, v);
+}
 inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
     const uint16x8x2_t zip = vzipq_u16(even, odd);
     vst1q_u8(p, as_u8(zip.val[0]));
     vst1q_u8(p + bytes, as_u8(zip.val[1]));
 }
-inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) { vst3q_u8(p, uint8x16x3_t{{a, b, c}}); }
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
+    const uint8x16x3_t v = {{a, b, c}};
+    vst3q_u8(p, v);
+}
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
                               s16v c_even, s16v c_odd) {
@@ -172,7 +260,8 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
                narrow_join<C>(c_even, c_odd));
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
-    vst4q_u8(p, uint8x16x4_t{{a, b, c, d}});
+    const uint8x16x4_t v = {{a, b, c, d}};
+    vst4q_u8(p, v);
 }
 
 inline u8v join_high(u16v a, u16v b) { return as_u8(vsriq_n_u16(b, a, 8)); }
@@ -197,6 +286,7 @@ inline u16v add_product(u16v sum, uint8x8_t x) {
 }
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     const auto half = [](uint8x8_t c0, uint8x8_t c1, uint8x8_t c2) {
         const u16v sum = vmull_u8(c0, vdup_n_u8(A));
         return vshrn_n_u16(add_product<C>(add_product<B>(sum, c1), c2), 8);
@@ -208,6 +298,7 @@ inline u8v dot_high(rgb_v v) {
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     const auto evens = [](u8v c) { return vmovn_u16(as_u16(c)); };
     u16v sum = vdupq_n_u16(static_cast<uint16_t>(D));
     sum = add_product<A>(sum, evens(v.val[0]));
@@ -216,7 +307,8 @@ inline u16v even_dot(rgb_v v) {
 }
 inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
     const u8v low = vsriq_n_u8(vshlq_n_u8(b, 3), c, 3);
-    vst2q_u8(p, uint8x16x2_t{{low, vsriq_n_u8(a, b, 5)}});
+    const uint8x16x2_t v = {{low, vsriq_n_u8(a, b, 5)}};
+    vst2q_u8(p, v);
 }
 inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
     const uint8x16x3_t v = vld3q_u8(q);

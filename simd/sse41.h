@@ -7,6 +7,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "simd/limits.h"
+
 namespace simgp::sse41 {
 
 inline constexpr int bytes = 16;
@@ -28,14 +30,24 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
                              _mm_loadl_epi64(reinterpret_cast<const __m128i *>(q)));
 }
 
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
+inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
+
 inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm_set1_epi16(static_cast<int16_t>(x)); }
+inline u8v set_pair(uint8_t a, uint8_t b) { return set_u16(uint16_t(b << 8 | a)); }
 inline u8v set_u32(uint32_t x) { return _mm_set1_epi32(static_cast<int>(x)); }
 
 inline void store_stream(uint8_t *p, u8v v) { _mm_stream_si128(reinterpret_cast<__m128i *>(p), v); }
 inline void stream_end() { _mm_sfence(); }
 
 inline u8v min_u8(u8v a, u8v b) { return _mm_min_epu8(a, b); }
+inline u8v max_u8(u8v a, u8v b) { return _mm_max_epu8(a, b); }
+inline u8v avg_u8(u8v a, u8v b) { return _mm_avg_epu8(a, b); }
+// One of the two differences is 0.
+inline u8v absdiff_u8(u8v a, u8v b) {
+    return _mm_or_si128(_mm_subs_epu8(a, b), _mm_subs_epu8(b, a));
+}
 inline int first_zero(u8v v) {
     const unsigned zero =
         static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(v, _mm_setzero_si128())));
@@ -47,19 +59,26 @@ inline u8v bit_or(u8v a, u8v b) { return _mm_or_si128(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm_xor_si128(a, b); }
 template <int N>
 inline u16v shl(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm_slli_epi16(a, N);
 }
 template <int N>
 inline u16v shr(u16v a) {
+    static_assert(limits::shift<N>);
     return _mm_srli_epi16(a, N);
 }
 template <int N>
 inline s16v sar(s16v a) {
+    static_assert(limits::shift<N>);
     return _mm_srai_epi16(a, N);
 }
 
 inline s16v add(s16v a, s16v b) { return _mm_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm_adds_epi16(a, b); }
+inline s16v sub(s16v a, s16v b) { return _mm_sub_epi16(a, b); }
+inline s16v min_s16(s16v a, s16v b) { return _mm_min_epi16(a, b); }
+inline s16v max_s16(s16v a, s16v b) { return _mm_max_epi16(a, b); }
+inline u16v mul(u16v a, u16v b) { return _mm_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm_subs_epu8(a, b); }
@@ -87,13 +106,14 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
     return _mm_cmpeq_epi8(_mm_and_si128(s, bit), odd_bit);
 }
 
+inline u16v dot_pairs(u8v samples, u8v weights) { return _mm_maddubs_epi16(samples, weights); }
+
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>
 inline s16v pair_dot(u8v v) {
-    static_assert((A >= 0 && B >= 0) || (A <= 0 && B <= 0));
+    static_assert(limits::centred_pair<A, B>);
     constexpr bool negative = A < 0 || B < 0;
     constexpr int a = negative ? -A : A, b = negative ? -B : B;
-    static_assert(a <= 255 && b <= 255 && a + b <= 255);  // 255 * 128 fits 16 bits
     const __m128i centred = _mm_xor_si128(v, _mm_set1_epi8(-128));
     const __m128i dot =
         _mm_maddubs_epi16(_mm_set1_epi16(static_cast<int16_t>(b << 8 | a)), centred);
@@ -103,11 +123,13 @@ inline s16v pair_dot(u8v v) {
 // K v / 2 = (256 v)(128 K) >> 16.
 template <int K, int C>
 inline s16v half_product_high(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm_add_epi16(_mm_mulhi_epu16(_mm_and_si128(v, set_u16(0xFF00)), set_u16(128 * K)),
                          set_u16(static_cast<uint16_t>(C)));
 }
 template <int K, int C>
 inline s16v half_product_low(u8v v) {
+    static_assert(limits::half_factor<K>);
     return _mm_add_epi16(_mm_mulhi_epu16(_mm_slli_epi16(v, 8), set_u16(128 * K)),
                          set_u16(static_cast<uint16_t>(C)));
 }
@@ -124,9 +146,38 @@ inline u16v odd(u8v v) { return _mm_srli_epi16(v, 8); }
 inline u8v join(u16v even, u16v odd) { return _mm_or_si128(even, _mm_slli_epi16(odd, 8)); }
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
+    static_assert(limits::narrowing_shift<N>);
     const __m128i halves = _mm_packus_epi16(_mm_srai_epi16(even, N), _mm_srai_epi16(odd, N));
     return _mm_shuffle_epi8(halves,
                             _mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15));
+}
+
+inline u16v widen_low(u8v v) { return _mm_unpacklo_epi8(v, _mm_setzero_si128()); }
+inline u16v widen_high(u8v v) { return _mm_unpackhi_epi8(v, _mm_setzero_si128()); }
+inline u8v narrow(s16v low, s16v high) { return _mm_packus_epi16(low, high); }
+
+template <int N>
+inline u8v zip_low(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm_unpacklo_epi8(a, b);
+    if constexpr (N == 2) return _mm_unpacklo_epi16(a, b);
+    if constexpr (N == 4) return _mm_unpacklo_epi32(a, b);
+    if constexpr (N == 8) return _mm_unpacklo_epi64(a, b);
+}
+template <int N>
+inline u8v zip_high(u8v a, u8v b) {
+    static_assert(limits::granule<N>);
+    if constexpr (N == 1) return _mm_unpackhi_epi8(a, b);
+    if constexpr (N == 2) return _mm_unpackhi_epi16(a, b);
+    if constexpr (N == 4) return _mm_unpackhi_epi32(a, b);
+    if constexpr (N == 8) return _mm_unpackhi_epi64(a, b);
+}
+inline u8v shuffle(u8v v, u8v index) { return _mm_shuffle_epi8(v, index); }
+inline u8v reverse_u8(u8v v) {
+    return shuffle(v, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
+}
+inline u8v reverse_u16(u8v v) {
+    return shuffle(v, _mm_setr_epi8(14, 15, 12, 13, 10, 11, 8, 9, 6, 7, 4, 5, 2, 3, 0, 1));
 }
 
 inline u16v pack565(s16v hi, s16v mid, s16v lo) {
@@ -203,6 +254,7 @@ inline constexpr zip3_index zip3;
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
                               s16v c_even, s16v c_odd) {
+    static_assert(limits::narrowing_shift<C>);
     const __m128i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
     const __m128i c = _mm_packus_epi16(_mm_srai_epi16(c_even, C), _mm_srai_epi16(c_odd, C));
     const __m128i ab_lo = _mm_unpacklo_epi8(a, b), ab_hi = _mm_unpackhi_epi8(a, b);
@@ -280,18 +332,19 @@ inline rgb_v load_888(const uint8_t *p) {
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline __m128i dot(__m128i ac, __m128i b) {
-    static_assert(A >= -128 && A <= 127 && C >= -128 && C <= 127 && A + C >= -128 && A + C <= 127);
     const __m128i pair =
         _mm_maddubs_epi16(ac, _mm_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
     return _mm_add_epi16(pair, _mm_mullo_epi16(b, _mm_set1_epi16(B)));
 }
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
     return _mm_add_epi8(
         join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
     return _mm_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 

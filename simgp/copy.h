@@ -21,15 +21,17 @@ SIMGP_BEGIN_DECLS
  * Returns SIMGP_OK after the copy, SIMGP_ERR_PARAM if the formats differ, SIMGP_ERR_UNSUPPORTED for
  * every other format, the tiled, packed, 24-bit and 32-bit ones among them. Both are decided from
  * the formats alone, before anything is written. A plane whose width or height is 0 or less is left
- * alone. */
+ * alone. Reads and writes the samples and nothing between the lines. Source and destination must
+ * not overlap. Any number of calls may run at once on separate destinations. */
 SIMGP_API int32_t simgp_cpy(const simgp_img *src, const simgp_img *dst);
 
-/* One plane of `height` rows of `width` samples of 1, 2, 3 or 4 bytes. Strides are in bytes and may
- * be negative; simgp_cpy_16b takes an odd stride for the next lower even number.
+/* One plane of `height` rows of `width` samples of 1, 2, 3 or 4 bytes, in the order in which they
+ * lie; the parameters are explained at simgp_plane_fn (img.h). Strides are in bytes and may be
+ * negative; simgp_cpy_16b takes an odd stride for the next lower even number.
  *
  * Reads and writes the samples and never what lies between the rows; planes without gaps are copied
  * as one block. A width or height of 0 or less copies nothing. Source and destination must not
- * overlap. */
+ * overlap. Any number of calls may run at once on separate destinations. */
 SIMGP_API simgp_plane_fn simgp_cpy_8b;
 SIMGP_API simgp_plane_fn simgp_cpy_16b;
 SIMGP_API simgp_plane_fn simgp_cpy_24b;

@@ -4,8 +4,8 @@
 
 #include <string.h>
 
-#include "simd/choose.h"
 #include "simgp/copy.h"
+#include "simgp/dispatch.h"
 #include "simgp/walk.h"
 
 namespace simgp {
@@ -31,7 +31,7 @@ void dither(const uint8_t *src, const uint8_t *above, uint8_t *cur, uint8_t *bel
 
 }  // namespace
 
-void fill_dither(rows &t) { t.dither = dither; }
+void fill_dither(dither_rows &t) { t.dither = dither; }
 
 }  // namespace scalar
 
@@ -41,21 +41,23 @@ namespace {
 // are copied when they are dithered for the first time, so three rows of the copy are in use at a
 // time: y - 1, y and y + 1. Needs height >= 3 and width >= 5.
 template <class Lines>
-void finish_row(const plane_lines &from, const Lines &to, ptrdiff_t width, ptrdiff_t height,
+void finish_row(const const_lines &from, const Lines &to, ptrdiff_t width, ptrdiff_t height,
                 ptrdiff_t y) {
     if (y == 0) {
         for (int k = 0; k < 2; k++) memcpy(to.line(k), from.line(k), size_t(width));
     } else if (y <= height - 2) {
-        live_rows().dither(from.line(y + 1), to.line(y - 1), to.line(y), to.line(y + 1), width);
+        live_rows().dither.dither(from.line(y + 1), to.line(y - 1), to.line(y), to.line(y + 1),
+                                  width);
     }
 }
 
 bool is_dithered(ptrdiff_t width, ptrdiff_t height) { return height >= 3 && width >= 5; }
 
-// The luma of a picture of `rows` rows, dithered row by row, as the conversion asks for it.
+// The luma of a picture of `height` rows as a source of lines: each row is dithered when it is
+// fetched.
 //
 // Four rows are kept at a time, in the last two rows of the destination, two in each. Of H >=
-// `rows` rows with stride D, |D| >= 2 W, and h = |D| / 2, luma row y lies
+// `height` rows with stride D, |D| >= 2 W, and h = |D| / 2, luma row y lies
 //   H - y = 1, 5, 9, ...   at byte (H - 1) D + h      3, 7, 11, ...   at (H - 2) D + h
 //           2, 6, 10, ...  at (H - 1) D               4, 8, 12, ...   at (H - 2) D
 // No output row before H - 2 touches them. Output row H - 2 falls on luma rows H - 4 and H - 3,
@@ -65,69 +67,70 @@ bool is_dithered(ptrdiff_t width, ptrdiff_t height) { return height >= 3 && widt
 // pixels at or beyond it are written, and that is all.
 class dithered_luma {
   public:
-    dithered_luma(const csc_args &a, ptrdiff_t rows)
+    dithered_luma(const csc_args &a, ptrdiff_t height)
         : from_(src_lines(a, 0)),
           width_(a.src_widths[0]),
-          rows_(rows),
-          dst_(dst_lines(a, 0)),
-          dst_height_(a.src_heights[0]) {}
+          height_(height),
+          to_{dst_lines(a, 0), a.src_heights[0]} {}
 
-    // Row y, after those before it; row y - 1 is still there.
-    uint8_t *line(ptrdiff_t y) {
-        if (!is_dithered(width_, rows_)) return from_.line(y);
-        for (; final_ <= y; final_++) finish_row(from_, kept{*this}, width_, rows_, final_);
-        return kept{*this}.line(y);
+    const uint8_t *fetch(ptrdiff_t y) {
+        if (!is_dithered(width_, height_)) return from_.line(y);
+        for (; final_ <= y; final_++) finish_row(from_, to_, width_, height_, final_);
+        return to_.line(y);
     }
 
   private:
-    struct kept {
-        const dithered_luma &luma;
+    struct kept_lines {
+        lines dst;
+        ptrdiff_t dst_height;
+
         uint8_t *line(ptrdiff_t y) const {
-            const ptrdiff_t distance = luma.dst_height_ - 1 - y;  // from the last row
-            const ptrdiff_t step = luma.dst_.stride < 0 ? -luma.dst_.stride : luma.dst_.stride;
-            return luma.dst_.line(luma.dst_height_ - 1 - (distance >> 1 & 1)) +
-                   (distance & 1 ? 0 : step / 2);
+            const ptrdiff_t distance = dst_height - 1 - y;  // from the last row
+            const ptrdiff_t step = dst.stride < 0 ? -dst.stride : dst.stride;
+            return dst.line(dst_height - 1 - (distance >> 1 & 1)) + (distance & 1 ? 0 : step / 2);
         }
     };
 
-    plane_lines from_;
-    ptrdiff_t width_, rows_;
-    plane_lines dst_;
-    ptrdiff_t dst_height_;
+    const_lines from_;
+    ptrdiff_t width_, height_;
+    kept_lines to_;
     ptrdiff_t final_ = 0;  // the rows before are
 };
 
-// How a kernel gives chroma lines to rows, see first_line_alone.
-enum class odd_heights { as_usual, first_line_alone };
-
-template <class Luma>
-void convert(const csc_args &a, Luma &&luma, const yuv_planes &planes, rgb_packing packing,
-             odd_heights rule) {
-    walk_yuv_to_rgb(a, luma, planes, live_rows(), packing,
-                    rule == odd_heights::first_line_alone ? first_line_alone(a) : 0);
+// The rule of the conversion without dithering.
+consteval yuv_rule rule_between(const format &from, const format &to) {
+    yuv_rule found = yuv_rule::usual;
+#define LOOK(name, from_format, to_format, rule) \
+    if (&from == &formats::from_format && &to == &formats::to_format) found = yuv_rule::rule;
+    SIMGP_YUV_TO_RGB_KERNELS(LOOK)
+#undef LOOK
+    return found;
 }
 
-// In full height.
-void dither_whole(const csc_args &a, const yuv_planes &planes, rgb_packing packing) {
-    convert(a, dithered_luma(a, a.src_heights[0]), planes, packing, odd_heights::as_usual);
+template <const format &From, const format &To, class Luma>
+void luma_to_rgb(const csc_args &a, Luma &&luma) {
+    convert_to_rgb<From, To, rule_between(From, To)>(a, luma);
 }
 
-// The last 4 rows, the tail, are converted like a picture of their own, without dithering; so is
-// what has less than 4 rows.
-void dither_body(const csc_args &a, const yuv_planes &planes, rgb_packing packing,
-                 odd_heights rule) {
+// Grey is dithered in full height. Of other pictures the last 4 rows, the tail, are converted like a
+// picture of their own, without dithering; so is what has less than 4 rows.
+template <const format &From, const format &To>
+void dither_and_convert(const csc_args &a) {
+    if constexpr (From.u < 0) return luma_to_rgb<From, To>(a, dithered_luma(a, a.src_heights[0]));
+
     constexpr int32_t tail = 4;
-    if (a.src_heights[0] < tail) return convert(a, src_lines(a, 0), planes, packing, rule);
+    if (a.src_heights[0] < tail) return luma_to_rgb<From, To>(a, src_lines(a, 0));
 
     const int32_t body = a.src_heights[0] - tail;
     csc_args top = a;
     top.src_heights = &body;
-    convert(top, dithered_luma(a, body), planes, packing, rule);
+    luma_to_rgb<From, To>(top, dithered_luma(a, body));
 
-    const auto last_lines = [&](int plane, int32_t lines) {
-        return src_lines(a, plane).line(ptrdiff_t(a.src_heights[plane]) - lines);
+    const auto last_lines = [&](int plane, int32_t height) {
+        return lines_of(a.src_planes[plane], a.src_strides[plane])
+            .line(ptrdiff_t(a.src_heights[plane]) - height);
     };
-    const int32_t tail_chroma = planes.serves_two_rows ? tail / 2 : tail;
+    constexpr int32_t tail_chroma = tail >> From.y_shift[1];
     uint8_t *const src_planes[] = {last_lines(0, tail), last_lines(1, tail_chroma),
                                    last_lines(2, tail_chroma)};
     uint8_t *const dst_planes[] = {dst_lines(a, 0).line(body)};
@@ -135,38 +138,24 @@ void dither_body(const csc_args &a, const yuv_planes &planes, rgb_packing packin
     bottom.src_planes = src_planes;
     bottom.src_heights = &tail;
     bottom.dst_planes = dst_planes;
-    convert(bottom, src_lines(bottom, 0), planes, packing, rule);
+    luma_to_rgb<From, To>(bottom, src_lines(bottom, 0));
 }
 
-// YV12 by way of a YUV420 kernel: planes and strides of U and V change places.
-void exchange_chroma(const csc_args &a, simgp_csc_fn *kernel) {
-    uint8_t *const planes[] = {a.src_planes[0], a.src_planes[2], a.src_planes[1]};
-    const int32_t strides[] = {a.src_strides[0], a.src_strides[2], a.src_strides[1]};
-    kernel(planes, a.src_widths, a.src_heights, strides, a.dst_strides, a.dst_planes);
-}
-SIMGP_CSC_KERNEL(yv12_to_rgb565_dither, exchange_chroma(args, simgp_csc_yuv420_to_rgb565_dither))
-SIMGP_CSC_KERNEL(yv12_to_bgr565_dither, exchange_chroma(args, simgp_csc_yuv420_to_bgr565_dither))
+#define DEFINE(name, from, to) \
+    SIMGP_CSC_KERNEL(name, dither_and_convert<formats::from, formats::to>(args))
 
-struct pair {
-    int16_t from, to;
-    simgp_csc_fn *kernel;
-};
+// Offered by format alone, not by name.
+#define YV12_KERNELS(X)                    \
+    X(yv12_to_rgb565_dither, YV12, RGB565) \
+    X(yv12_to_bgr565_dither, YV12, BGR565)
+YV12_KERNELS(DEFINE)
 
-// clang-format off
-constexpr pair dithered_pairs[] = {
-    {SIMGP_FMT_YUV400,  SIMGP_FMT_RGB565, simgp_csc_yuv400_to_rgb565_dither},
-    {SIMGP_FMT_YUV420,  SIMGP_FMT_RGB565, simgp_csc_yuv420_to_rgb565_dither},
-    {SIMGP_FMT_YUV420,  SIMGP_FMT_BGR565, simgp_csc_yuv420_to_bgr565_dither},
-    {SIMGP_FMT_YUV422N, SIMGP_FMT_RGB565, simgp_csc_yuv422n_to_rgb565_dither},
-    {SIMGP_FMT_YUV422N, SIMGP_FMT_BGR565, simgp_csc_yuv422n_to_bgr565_dither},
-    {SIMGP_FMT_YUV422W, SIMGP_FMT_RGB565, simgp_csc_yuv422w_to_rgb565_dither},
-    {SIMGP_FMT_YUV422W, SIMGP_FMT_BGR565, simgp_csc_yuv422w_to_bgr565_dither},
-    {SIMGP_FMT_YUV444,  SIMGP_FMT_RGB565, simgp_csc_yuv444_to_rgb565_dither},
-    {SIMGP_FMT_YUV444,  SIMGP_FMT_BGR565, simgp_csc_yuv444_to_bgr565_dither},
-    {SIMGP_FMT_YV12,    SIMGP_FMT_RGB565, yv12_to_rgb565_dither},
-    {SIMGP_FMT_YV12,    SIMGP_FMT_BGR565, yv12_to_bgr565_dither},
+constexpr conversion conversions[] = {
+    // clang-format off
+    SIMGP_DITHER_KERNELS(SIMGP_CONVERSION)
+    YV12_KERNELS(SIMGP_CONVERSION)
+    // clang-format on
 };
-// clang-format on
 
 // YUV420 to YUV420.
 void dither_planes(const simgp_img &src, const simgp_img &dst) {
@@ -181,40 +170,21 @@ void dither_planes(const simgp_img &src, const simgp_img &dst) {
 
 using namespace simgp;
 
+SIMGP_DITHER_KERNELS(DEFINE)
+
 void simgp_dit_8b(const void *src, int32_t width, int32_t height, int32_t src_stride,
                   int32_t dst_stride, void *dst) {
     if (!is_dithered(width, height))
         return simgp_cpy_8b(src, width, height, src_stride, dst_stride, dst);
-    const plane_lines from{static_cast<uint8_t *>(const_cast<void *>(src)), src_stride};
-    const plane_lines to{static_cast<uint8_t *>(dst), dst_stride};
+    const const_lines from = lines_of(src, src_stride);
+    const lines to = lines_of(dst, dst_stride);
     for (ptrdiff_t y = 0; y < height; y++) finish_row(from, to, width, height, y);
 }
-
-// clang-format off
-#define KERNEL(from, to, rule) \
-    SIMGP_CSC_KERNEL(simgp_csc_##from##_to_##to##_dither, dither_body(args, planes_##from, rgb_packing::to, odd_heights::rule))
-
-SIMGP_CSC_KERNEL(simgp_csc_yuv400_to_rgb565_dither, dither_whole(args, planes_yuv400, rgb_packing::rgb565))
-KERNEL(yuv420, rgb565, first_line_alone)
-KERNEL(yuv420, bgr565, as_usual)
-KERNEL(yuv422n, rgb565, as_usual)
-KERNEL(yuv422n, bgr565, as_usual)
-KERNEL(yuv422w, rgb565, as_usual)
-KERNEL(yuv422w, bgr565, as_usual)
-KERNEL(yuv444, rgb565, as_usual)
-KERNEL(yuv444, bgr565, as_usual)
-#undef KERNEL
-// clang-format on
 
 int32_t simgp_csc_dither(const simgp_img *src, const simgp_img *dst) {
     if (src->format == SIMGP_FMT_YUV420 && dst->format == SIMGP_FMT_YUV420) {
         dither_planes(*src, *dst);
         return SIMGP_OK;
     }
-    for (const pair &p : dithered_pairs) {
-        if (p.from != src->format || p.to != dst->format) continue;
-        p.kernel(src->plane, src->width, src->height, src->stride, dst->stride, dst->plane);
-        return SIMGP_OK;
-    }
-    return SIMGP_ERR_UNSUPPORTED;
+    return convert_by(conversions, *src, *dst);
 }

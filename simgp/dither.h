@@ -10,26 +10,26 @@ SIMGP_BEGIN_DECLS
  * smooth gradients do not turn into bands when the low bits are dropped afterwards. Where a nudge
  * goes depends on how the samples around compare, so the result is the same on every run.
  *
- *   src, dst                 first sample of the first row
+ *   src, dst                 first sample of the first row; no alignment is needed
  *   width, height            samples in a row, rows; of 0 or less nothing is written
  *   src_stride, dst_stride   bytes from one row to the next; may be negative
  *
  * The result is that of this procedure, which works in place and in this order:
  *
- *   copy the plane; if height < 3 or width < 5, that is all
- *   for y = 1, 2, ... height - 2, with above, cur, below the rows y - 1, y, y + 1 of the copy
- *       for x = 2, 4, ... up to and with width - 3
- *           p = cur[x - 1], q = cur[x]
- *           cur[x + 2] += p > q ? 2 : -2
- *           below[x] and below[x + 1] += above[x] > q ? 1 : -1
+ *     copy the plane; if height < 3 or width < 5, that is all
+ *     for y = 1, 2, ... height - 2, with above, cur, below the rows y - 1, y, y + 1 of the copy
+ *         for x = 2, 4, ... up to and including width - 3
+ *             p = cur[x - 1], q = cur[x]
+ *             cur[x + 2] += p > q ? 2 : -2
+ *             below[x] and below[x + 1] += above[x] > q ? 1 : -1
  *
  * with sums limited to 0 ... 255. So row 0 and columns 0 and 1 stay as they are, and the last
  * column too if the width is even. An 8 x 4 plane of 100 becomes
  *
- *   100 100 100 100 100 100 100 100
- *   100 100 100 100  98 100 102 100
- *   100 100  99  99 103 101  98 100
- *   100 100 101 101  99  99 100 100
+ *     100 100 100 100 100 100 100 100
+ *     100 100 100 100  98 100 102 100
+ *     100 100  99  99 103 101  98 100
+ *     100 100 101 101  99  99 100 100
  *
  * Reads the width x height samples of src, reads and writes those of dst, and nothing else. The two
  * must not share memory. Any number of calls may run at once on separate destinations. */
@@ -42,11 +42,13 @@ SIMGP_API simgp_plane_fn simgp_dit_8b;
  *   YUV420                                      to YUV420: dithers plane 0, copies planes 1 and 2,
  *                                               each with its own width[] and height[] of src
  *
- * Returns SIMGP_OK, or SIMGP_ERR_UNSUPPORTED for every other pair, with nothing written. To RGB, it
- * calls the kernels below, whose notes hold. */
+ * Returns SIMGP_OK, or SIMGP_ERR_UNSUPPORTED for every other pair, two equal formats included, with
+ * nothing written. To RGB, it calls the kernels below, whose notes hold; YV12 takes those of
+ * YUV420, with the chroma planes exchanged. Source and destination must not share memory. */
 SIMGP_API int32_t simgp_csc_dither(const simgp_img *src, const simgp_img *dst);
 
-/* Dithering and conversion in one call, with the arguments of the plain kernels (yuv2rgb.h).
+/* Dithering and conversion in one call, with the arguments of the plain kernels (yuv2rgb.h; they
+ * are explained at simgp_csc_fn in img.h). Source and destination must not share memory.
  *
  * Nothing is allocated: dithered luma waits for its conversion in the last two rows of the
  * destination. With H = src_heights[0], W = src_widths[0] and D = dst_strides[0], the destination

@@ -1,5 +1,4 @@
-/* The image descriptor, pixel formats, rotation codes, result codes, and the types of the kernels.
- */
+/* The image descriptor, pixel formats, rotation codes, result codes, the types of the kernels. */
 #ifndef SIMGP_IMG_H
 #define SIMGP_IMG_H
 
@@ -15,7 +14,7 @@ SIMGP_BEGIN_DECLS
  * The drawings show bytes in memory order, lowest address first, so they hold on every machine.
  * Y0 Y1 are the first two pixels of a line; a 16-bit word stands with its low byte first, as it
  * lies in memory. "W/2" and "H/2" of chroma planes are rounded up: a 5 x 3 picture in 4:2:0 has
- * chroma planes of 3 x 2 samples.
+ * chroma planes of 3 x 2 samples. Samples of YUV are unsigned bytes.
  */
 enum {
     /* One plane of luma; no chroma.
@@ -58,9 +57,10 @@ enum {
      *   plane 0: Y,  W x H      plane 1: U, W x H/2      plane 2: V, W x H/2 */
     SIMGP_FMT_YUV422W = 8,
 
-    /* NV12 cut into tiles of 64 bytes x 32 rows, as hardware video decoders write it; the strides
-     * of a tiled picture are not used. plane 0: tiles of Y                      plane 1: tiles of
-     * U0 V0 U1 V1 ...                */
+    /* NV12 cut into tiles of 64 bytes x 32 rows, as hardware video decoders write it; tile.h says
+     * in which order they lie. The strides of a tiled picture are not used.
+     *   plane 0: tiles of Y0 Y1 Y2 Y3 ...                            W bytes x H
+     *   plane 1: tiles of U0 V0 U1 V1 ...                            W bytes x H/2 rounded down */
     SIMGP_FMT_T64X32 = 11,
 
     /* Packed 4:2:2: two pixels in four bytes.
@@ -69,8 +69,8 @@ enum {
     /*   plane 0: Y0 U0 Y1 V0   Y2 U1 Y3 V1 ...                       2 W bytes x H */
     SIMGP_FMT_YUYV = 101,
 
-    /* 16-bit RGB, one little-endian word a pixel.
-     *   byte 0:  G2 G1 G0 B4 B3 B2 B1 B0   (bit 7 ... bit 0)
+    /* 16-bit RGB, one little-endian word a pixel; bit 7 of each byte first.
+     *   byte 0:  G2 G1 G0 B4 B3 B2 B1 B0
      *   byte 1:  R4 R3 R2 R1 R0 G5 G4 G3 */
     SIMGP_FMT_RGB565 = 200,
     /*   byte 0:  G2 G1 G0 R4 R3 R2 R1 R0
@@ -154,21 +154,33 @@ SIMGP_STATIC_ASSERT(sizeof(simgp_img) == 120, "simgp_img changed its size");
  * they return nothing, check nothing, and trust what they are given.
  */
 
-/* A conversion of a whole picture. The arrays are those of two descriptors:
- *   src_planes, src_widths, src_heights, src_strides   plane[], width[], height[], stride[] of the
- * source dst_strides, dst_planes                            stride[], plane[] of the destination
- * Only the entries of planes that the formats have are read. The picture is src_widths[0] x
- * src_heights[0] pixels; a width or height of 0 or less writes nothing. Source and destination must
- * not share memory unless the function says so. */
+/* A conversion of a whole picture. The arrays are those of two descriptors, with entry k for plane
+ * k, and only the entries of planes that the formats have are read:
+ *
+ *   src_planes    plane[] of the source: the first byte of each plane, which is only read
+ *   src_widths    width[] of the source: samples in a line, or pairs
+ *   src_heights   height[] of the source: lines
+ *   src_strides   stride[] of the source: bytes from one line to the next; may be negative
+ *   dst_strides   stride[] of the destination
+ *   dst_planes    plane[] of the destination: the first byte of each plane, which is written
+ *
+ * The picture is src_widths[0] x src_heights[0] pixels; a width or height of 0 or less writes
+ * nothing. Planes need no alignment. Source and destination must not share memory unless the
+ * function says so. */
 typedef void simgp_csc_fn(uint8_t *const *src_planes, const int32_t *src_widths,
                           const int32_t *src_heights, const int32_t *src_strides,
                           const int32_t *dst_strides, uint8_t *const *dst_planes);
 
 /* Work on one plane.
- *   src, dst                 first byte of the first row; no alignment is needed
+ *
+ *   src                      first byte of the first row; only read
  *   width                    samples in a row; the function says what a sample is
- *   height                   rows
- *   src_stride, dst_stride   bytes from one row to the next */
+ *   height                   rows of the source
+ *   src_stride, dst_stride   bytes from one row to the next; may be negative
+ *   dst                      first byte of the first row; written, and read where the function says
+ *
+ * A width or height of 0 or less does nothing; the pointers are not used then. No pointer needs
+ * to be aligned. Source and destination must not share memory. */
 typedef void simgp_plane_fn(const void *src, int32_t width, int32_t height, int32_t src_stride,
                             int32_t dst_stride, void *dst);
 

@@ -1,10 +1,10 @@
 // Conversions between layouts of YUV: the scalar rows, which define the results, and the kernels.
 #include "simgp/layout.h"
 
-#include "simd/choose.h"
+#include "rows/choose.h"
+#include "rows/conversions.h"
 #include "simgp/copy.h"
-#include "simgp/planes.h"
-#include "simgp/walk.h"
+#include "simgp/kernel.h"
 
 namespace simgp {
 namespace scalar {
@@ -26,7 +26,7 @@ void unpack(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
 
 }  // namespace
 
-void fill_layout(rows &t) {
+void fill_layout(layout_rows &t) {
     t.pack = pack;
     t.unpack = unpack;
 }
@@ -34,16 +34,6 @@ void fill_layout(rows &t) {
 }  // namespace scalar
 
 namespace {
-
-// The lines of a plane that is only read.
-struct source_lines {
-    const uint8_t *first;
-    ptrdiff_t stride;
-
-    source_lines(const uint8_t *plane, ptrdiff_t bytes) : first(plane), stride(bytes) {}
-    source_lines(const plane_lines &p) : first(p.first), stride(p.stride) {}
-    const uint8_t *line(ptrdiff_t y) const { return first + y * stride; }
-};
 
 // Rows without gaps in all three planes are one.
 void join_rows(ptrdiff_t &pairs, ptrdiff_t &height, ptrdiff_t stride_a, ptrdiff_t stride_b,
@@ -53,54 +43,67 @@ void join_rows(ptrdiff_t &pairs, ptrdiff_t &height, ptrdiff_t stride_a, ptrdiff_
     height = 1;
 }
 
-void pack_plane(const source_lines &a, const source_lines &b, const plane_lines &dst,
-                ptrdiff_t pairs, ptrdiff_t height) {
+void pack_plane(const const_lines &a, const const_lines &b, const lines &dst, ptrdiff_t pairs,
+                ptrdiff_t height) {
     if (pairs < 1 || height < 1) return;
     join_rows(pairs, height, a.stride, b.stride, dst.stride);
-    pack_row *const row = live_rows().pack;
+    pack_row *const row = live_rows().layout.pack;
     for (ptrdiff_t y = 0; y < height; y++) row(a.line(y), b.line(y), dst.line(y), pairs);
 }
 
 // `bytes` of a source row; the last of an odd number belongs to a.
-void unpack_plane(const source_lines &src, const plane_lines &a, const plane_lines &b,
-                  ptrdiff_t bytes, ptrdiff_t height) {
+void unpack_plane(const const_lines &src, const lines &a, const lines &b, ptrdiff_t bytes,
+                  ptrdiff_t height) {
     if (bytes < 1 || height < 1) return;
     ptrdiff_t pairs = bytes / 2;
     if (bytes % 2 == 0) join_rows(pairs, height, a.stride, b.stride, src.stride);
-    unpack_row *const row = live_rows().unpack;
+    unpack_row *const row = live_rows().layout.unpack;
     for (ptrdiff_t y = 0; y < height; y++) {
         if (pairs > 0) row(src.line(y), a.line(y), b.line(y), pairs);
         if (bytes % 2) a.line(y)[pairs] = src.line(y)[2 * pairs];
     }
 }
 
-// Source plane `from` to destination plane `to`.
-void move(const csc_args &a, simgp_plane_fn *kernel, int from, int to) {
-    kernel(a.src_planes[from], a.src_widths[from], a.src_heights[from], a.src_strides[from],
-           a.dst_strides[to], a.dst_planes[to]);
+void keep_every_second_row(const plane_args &a) {
+    copy_lines({a.src.first, 2 * a.src.stride}, a.dst, a.width, a.height / 2);
 }
 
-// The three kinds of conversion. Luma is copied by all of them.
-//
-// Source plane 1 to destination plane d1, source plane 2 to d2.
-void planes(const csc_args &a, simgp_plane_fn *chroma, int d1, int d2) {
-    move(a, simgp_cpy_8b, 0, 0);
-    move(a, chroma, 1, d1);
-    move(a, chroma, 2, d2);
+void repeat_rows(const plane_args &a) {
+    if (a.width < 1) return;
+    for (ptrdiff_t y = 0; y < a.height; y++)
+        for (ptrdiff_t twice = 0; twice < 2; twice++)
+            memcpy(a.dst.line(2 * y + twice), a.src.line(y), size_t(a.width));
 }
 
-// Source planes `first` and `second` to the pairs of destination plane 1.
-void pairs_from(const csc_args &a, int first, int second) {
-    move(a, simgp_cpy_8b, 0, 0);
-    pack_plane(src_lines(a, first), src_lines(a, second), dst_lines(a, 1), a.src_widths[1],
-               a.src_heights[1]);
-}
-
-// The pairs of source plane 1 to destination planes `first` and `second`.
-void pairs_to(const csc_args &a, int first, int second) {
-    move(a, simgp_cpy_8b, 0, 0);
-    unpack_plane(src_lines(a, 1), dst_lines(a, first), dst_lines(a, second),
-                 2 * ptrdiff_t(a.src_widths[1]), a.src_heights[1]);
+// Luma is copied. Chroma is moved between planes, or pairs and planes, the heights of which may
+// differ by a factor of two.
+template <const format &From, const format &To>
+void between_layouts(const csc_args &a) {
+    const auto move = [&](simgp_plane_fn *kernel, int from, int to) {
+        kernel(a.src_planes[from], a.src_widths[from], a.src_heights[from], a.src_strides[from],
+               a.dst_strides[to], a.dst_planes[to]);
+    };
+    move(simgp_cpy_8b, 0, 0);
+    constexpr bool from_pairs = From.u == From.v, to_pairs = To.u == To.v;
+    constexpr int from_shift = From.y_shift[1], to_shift = To.y_shift[1];
+    if constexpr (from_pairs) {
+        static_assert(!to_pairs && from_shift == to_shift);
+        constexpr bool u_first = From.layout == yuv_layout::uv;
+        unpack_plane(src_lines(a, From.u), dst_lines(a, u_first ? To.u : To.v),
+                     dst_lines(a, u_first ? To.v : To.u), 2 * ptrdiff_t(a.src_widths[From.u]),
+                     a.src_heights[From.u]);
+    } else if constexpr (to_pairs) {
+        static_assert(from_shift == to_shift);
+        constexpr bool u_first = To.layout == yuv_layout::uv;
+        pack_plane(src_lines(a, u_first ? From.u : From.v), src_lines(a, u_first ? From.v : From.u),
+                   dst_lines(a, To.u), a.src_widths[1], a.src_heights[1]);
+    } else {
+        simgp_plane_fn *const chroma = from_shift < to_shift   ? simgp_csc_1x2_to_1x1
+                                       : from_shift > to_shift ? simgp_csc_1x1_to_1x2
+                                                               : simgp_cpy_8b;
+        move(chroma, From.u, To.u);
+        move(chroma, From.v, To.v);
+    }
 }
 
 }  // namespace
@@ -108,21 +111,8 @@ void pairs_to(const csc_args &a, int first, int second) {
 
 using namespace simgp;
 
-void simgp_csc_1x2_to_1x1(const void *src, int32_t width, int32_t height, int32_t src_stride,
-                          int32_t dst_stride, void *dst) {
-    copy_rows(static_cast<const uint8_t *>(src), 2 * ptrdiff_t(src_stride),
-              static_cast<uint8_t *>(dst), dst_stride, width, height / 2);
-}
-
-void simgp_csc_1x1_to_1x2(const void *src, int32_t width, int32_t height, int32_t src_stride,
-                          int32_t dst_stride, void *dst) {
-    if (width < 1) return;
-    const uint8_t *from = static_cast<const uint8_t *>(src);
-    uint8_t *to = static_cast<uint8_t *>(dst);
-    for (ptrdiff_t y = 0; y < height; y++)
-        for (ptrdiff_t twice = 0; twice < 2; twice++)
-            memcpy(to + (2 * y + twice) * dst_stride, from + y * src_stride, size_t(width));
-}
+SIMGP_PLANE_KERNEL(simgp_csc_1x2_to_1x1, keep_every_second_row(args))
+SIMGP_PLANE_KERNEL(simgp_csc_1x1_to_1x2, repeat_rows(args))
 
 void simgp_csc_8b8b_pck(const uint8_t *src_a, const uint8_t *src_b, int32_t width, int32_t height,
                         int32_t stride_a, int32_t stride_b, int32_t dst_stride, uint8_t *dst) {
@@ -134,20 +124,6 @@ void simgp_csc_8b8b_unpck(const uint8_t *src, int32_t width, int32_t height, int
     unpack_plane({src, src_stride}, {dst_a, stride_a}, {dst_b, stride_b}, width, height);
 }
 
-// clang-format off
-#define KERNEL(from, to, ...) SIMGP_CSC_KERNEL(simgp_csc_##from##_to_##to, __VA_ARGS__)
-
-KERNEL(yuv420,  yv12,    planes(args, simgp_cpy_8b, 2, 1))
-KERNEL(yuv420,  yuv422n, planes(args, simgp_csc_1x1_to_1x2, 1, 2))
-KERNEL(yuv420,  nv12,    pairs_from(args, 1, 2))
-KERNEL(yuv420,  nv21,    pairs_from(args, 2, 1))
-KERNEL(yuv422n, yuv420,  planes(args, simgp_csc_1x2_to_1x1, 1, 2))
-KERNEL(yuv422n, yv12,    planes(args, simgp_csc_1x2_to_1x1, 2, 1))
-KERNEL(yv16,    yuv420,  planes(args, simgp_csc_1x2_to_1x1, 2, 1))
-KERNEL(yv16,    yv12,    planes(args, simgp_csc_1x2_to_1x1, 1, 2))
-KERNEL(nv12,    yuv420,  pairs_to(args, 1, 2))
-KERNEL(nv12,    yv12,    pairs_to(args, 2, 1))
-KERNEL(nv21,    yuv420,  pairs_to(args, 2, 1))
-KERNEL(nv21,    yv12,    pairs_to(args, 1, 2))
-#undef KERNEL
-// clang-format on
+#define DEFINE(name, from, to) \
+    SIMGP_CSC_KERNEL(name, between_layouts<formats::from, formats::to>(args))
+SIMGP_LAYOUT_KERNELS(DEFINE)

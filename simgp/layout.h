@@ -8,9 +8,9 @@ SIMGP_BEGIN_DECLS
 
 /* Whole pictures ----------------------------------------------------------------------------------
  *
- * Luma is copied: src_heights[0] rows of src_widths[0] samples. Chroma moves by the kernel that the
- * table names, with the widths, heights and strides of the source's chroma planes and the strides
- * of the destination's:
+ * The parameters are explained at simgp_csc_fn (img.h). Luma is copied: src_heights[0] rows of
+ * src_widths[0] samples. Chroma moves by the kernel that the table names, with the widths, heights
+ * and strides of the source's chroma planes and the strides of the destination's:
  *
  *   from      to        chroma
  *   YUV420    YV12      copied (simgp_cpy_8b), planes exchanged
@@ -28,11 +28,12 @@ SIMGP_BEGIN_DECLS
  *
  * Nothing is averaged or interpolated: 4:2:2 to 4:2:0 keeps chroma rows 0, 2, 4, ..., 4:2:0 to
  * 4:2:2 gives rows 2y and 2y + 1 the samples of row y. A picture of odd height H has (H + 1) / 2
- * chroma rows in 4:2:0. From 4:2:2, only the first H / 2 of them are written. To 4:2:2, H + 1 chroma
- * rows are written: the destination must have room for twice the source's chroma rows.
+ * chroma rows in 4:2:0. From 4:2:2, only the first H / 2 of them are written. To 4:2:2, H + 1
+ * chroma rows are written: the destination must have room for twice the source's chroma rows.
  *
- * Any size works, of 0 or less nothing is written; strides may be negative. Only visible samples
- * are read and written. Source and destination must not share memory. */
+ * Any size works, of 0 or less nothing is written. No pointer or stride needs to be aligned;
+ * strides may be negative. Only visible samples are read and written. Source and destination must
+ * not share memory. Any number of calls may run at once on separate destinations. */
 SIMGP_API simgp_csc_fn simgp_csc_yuv420_to_yv12;
 SIMGP_API simgp_csc_fn simgp_csc_yuv420_to_yuv422n;
 SIMGP_API simgp_csc_fn simgp_csc_yuv420_to_nv12;
@@ -48,8 +49,10 @@ SIMGP_API simgp_csc_fn simgp_csc_nv21_to_yv12;
 
 /* Planes ------------------------------------------------------------------------------------------
  *
- * Strides are in bytes and may be negative. A width or height of 0 or less does nothing. Only the
- * named bytes are read and written. Sources and destinations must not overlap. */
+ * Strides are in bytes and may be negative; each belongs to the plane of its name. No pointer needs
+ * to be aligned. A width or height of 0 or less does nothing. Only the named bytes are read and
+ * written. Sources and destinations must not overlap. Any number of calls may run at once on
+ * separate destinations. The parameters of simgp_plane_fn are explained in img.h. */
 
 /* Keeps every second row: source rows 0, 2, 4, ... of `width` bytes become rows 0, 1, 2, ... of the
  * destination. `height` counts source rows; height / 2 rows are written, so the last one of an odd

@@ -11,9 +11,10 @@ SIMGP_BEGIN_DECLS
  * group of four bytes:
  *
  *   UYVY   U Y0 V Y1        128, 16, 128, 235 is a black and a white pixel
- *   YUYV   Y0 U Y1 V         81, 90,  81, 240 are two pure red pixels
+ *   YUYV   Y0 U Y1 V        81, 90, 81, 240 are two pure red pixels
  *
- * Planes
+ * The parameters are explained at simgp_csc_fn (img.h); only entry 0 of each array is read.
+ *
  *   source        src_planes[0], H lines of W pixels, 2 W bytes each, src_strides[0] bytes apart.
  *   destination   dst_planes[0], H lines of W pixels, dst_strides[0] bytes apart.
  *

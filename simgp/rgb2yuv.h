@@ -16,7 +16,9 @@ SIMGP_BEGIN_DECLS
  * it. Pure red becomes Y = 81, U = 90, V = 240. Channels of an RGB565 word are widened by shifting
  * alone, so its white is 248, 252, 248: Y = 231, U = 127, V = 127.
  *
- * Planes
+ * The parameters are explained at simgp_csc_fn (img.h); of the widths and heights only entry 0 is
+ * read.
+ *
  *   source        src_planes[0], H lines of W pixels. 24-bit lines lie src_strides[0] bytes apart;
  *                 RGB565 lines that many rounded down to an even number; RGBA8888 lines that many
  *                 rounded down to a multiple of 4. Alpha is dropped.
@@ -45,8 +47,8 @@ SIMGP_API simgp_csc_fn simgp_csc_rgb565_to_nv12;
 SIMGP_API simgp_csc_fn simgp_csc_rgb565_to_nv21;
 
 /* The word (R >> 3) << 11 | (G >> 2) << 5 | B >> 3 of each pixel, low byte first: the low bits of
- * the channels are dropped. Planes as above; the destination is dst_planes[0], H lines of W words,
- * dst_strides[0] bytes apart, rounded down to an even number. */
+ * the channels are dropped. The source is the same, with the same rules; the destination is
+ * dst_planes[0], H lines of W words, dst_strides[0] bytes apart, rounded down to an even number. */
 SIMGP_API simgp_csc_fn simgp_csc_rgb888_to_rgb565;
 SIMGP_API simgp_csc_fn simgp_csc_rgba8888_to_rgb565;
 

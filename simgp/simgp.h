@@ -16,17 +16,24 @@
  * What holds for every function:
  *
  * - Each result is defined by a scalar integer formula, given at the function, and is the same to
- * the byte on every processor, for every width, stride and alignment. The vector units make it
- * fast, they never change it.
+ *   the byte on every processor, for every width, stride and alignment. The vector units make it
+ *   fast, they never change it.
  * - Any size works. No plane needs padding or alignment, and no byte outside the visible samples is
- * read or written, unless the function says so.
+ *   read or written, unless the function says so. A width or height of 0 or less does nothing.
+ * - Strides are in bytes, from the first byte of a line to that of the next, and may be negative.
+ *   The plane's pointer is then that of the line that is processed first, the one with the highest
+ *   address.
  * - Source and destination must not share memory, unless the function says so.
- * - Nothing is allocated, unless the function is there to allocate. No threads, no global state, no
- *   configuration, nothing to start up or shut down. All functions may run on any number of threads
- * at once, on separate destinations.
+ * - Nothing is allocated, unless the function is there to allocate. No threads, no state that a
+ *   caller can see, no configuration, nothing to start up or shut down. All functions may run on
+ *   any number of threads at once, on separate destinations.
  * - Functions that take descriptors check the formats and nothing else, before they write anything.
- * The kernels below them, which may be called directly, check nothing. Sizes, strides and pointers
- * are yours to get right: offsets are computed in ptrdiff_t, so pictures may be as large as memory.
+ *   The kernels below them, which may be called directly, check nothing. Sizes, strides and
+ *   pointers are yours to get right: offsets are computed in ptrdiff_t, so pictures may be as large
+ *   as memory.
+ *
+ * Most kernels are declared by a type, which explains their parameters: simgp_csc_fn works on whole
+ * pictures, simgp_plane_fn on one plane (both in img.h).
  *
  * Names give the operation and then the formats in the direction of the data:
  * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dit

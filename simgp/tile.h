@@ -29,30 +29,34 @@ SIMGP_BEGIN_DECLS
  * are neither read nor written, except as said below of an odd W or H. */
 
 /* Where byte x of row y lies, in bytes from the start of a tiled plane of `width` bytes x `height`
- * rows. For a chroma plane, width is W and height is H / 2. x lies in 0 ... width - 1 and y in 0
- * ... height - 1; the plane must be smaller than 2 GiB. */
+ * rows. For a chroma plane, width is W and height is H / 2. x lies in 0 ... width - 1 and y in
+ * 0 ... height - 1, which is not checked; the plane must be smaller than 2 GiB. */
 SIMGP_API int32_t simgp_get_tile_offset(int32_t width, int32_t height, int32_t x, int32_t y);
 
 /* Planes --------------------------------------------------------------------------------------
  *
- * Strides are in bytes and may be negative. A width or height of 0 or less writes nothing. Source
- * and destination must not share memory. */
+ * Strides are in bytes and may be negative. No pointer needs to be aligned. A width or height of 0
+ * or less writes nothing. Source and destination must not share memory. Any number of calls may run
+ * at once on separate destinations. */
 
-/* Copies a tiled plane of `width` bytes x `height` rows to rows of `width` bytes, dst_stride apart.
- */
+/* Copies a tiled plane of `width` bytes x `height` rows, at src, to rows of `width` bytes,
+ * dst_stride apart, at dst. */
 SIMGP_API void simgp_csc_copy_tiles_to_linear(const uint8_t *src, int32_t width, int32_t height,
                                               int32_t dst_stride, uint8_t *dst);
 
 /* Takes a tiled plane of byte pairs, `width` bytes x `height` rows, apart: bytes 0, 2, 4, ... of a
- * row go to dst_u, bytes 1, 3, 5, ... to dst_v. An odd width gives one U more than V. */
+ * row go to dst_u, whose rows lie stride_u apart, bytes 1, 3, 5, ... to dst_v, stride_v apart. An
+ * odd width gives one U more than V. */
 SIMGP_API void simgp_csc_unpack_tiles_to_linear(const uint8_t *src, int32_t width, int32_t height,
                                                 int32_t stride_u, uint8_t *dst_u, int32_t stride_v,
                                                 uint8_t *dst_v);
 
 /* Whole pictures --------------------------------------------------------------------------------
  *
- * Of the widths and heights, entry 0 is read. Any size works, of 0 or less nothing is written; the
- * strides of linear pictures may be negative. Source and destination must not share memory. */
+ * The parameters are explained at simgp_csc_fn (img.h). Of the widths and heights, entry 0 is read,
+ * of the strides those of linear pictures; they may be negative. Any size works, of 0 or less
+ * nothing is written. No pointer needs to be aligned. Source and destination must not share memory.
+ * Any number of calls may run at once on separate destinations. */
 
 /* To NV12: both planes as simgp_csc_copy_tiles_to_linear does, the second of W bytes x H / 2 rows.
  * An odd W or H leaves the last chroma byte of each row, or the last chroma row, unwritten. */

@@ -2,11 +2,12 @@
 #ifndef SIMGP_TILE_OFFSET_H
 #define SIMGP_TILE_OFFSET_H
 
-#include <stddef.h>
+#include "rows/tile.h"
 
 namespace simgp {
 
 // Where byte x of row y of a tiled plane of width bytes x height rows lies, from its start.
+static_assert(tile_width == 1 << 6 && tile_height == 1 << 5 && tile_bytes == 1 << 11);
 inline ptrdiff_t tile_offset(ptrdiff_t width, ptrdiff_t height, ptrdiff_t x, ptrdiff_t y) {
     // The tile's place in its group: the column's parity, and the upper or the lower pair, which
     // change places from group to group.

@@ -1,102 +1,89 @@
-// The walk over planes and rows that all conversion kernels share.
+// The walks over planes and rows that conversion kernels share.
+//
+// A *source of lines* has fetch(y), which gives line y. It is asked in rising order, and what it gave
+// last stays valid when it is asked again. The lines of a plane are such a source, and so is whatever
+// makes its lines when they are wanted, as dithering does.
 #ifndef SIMGP_WALK_H
 #define SIMGP_WALK_H
 
-#include "simgp/img.h"
-#include "simgp/rows.h"
+#include "rows/choose.h"
+#include "simgp/kernel.h"
 
 namespace simgp {
 
-// The six arguments of a conversion kernel.
-struct csc_args {
-    uint8_t *const *src_planes;
-    const int32_t *src_widths, *src_heights, *src_strides, *dst_strides;
-    uint8_t *const *dst_planes;
+// Whether some kernel needs a row, so that the tables have it.
+consteval bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, yuv_matrix matrix) {
+    bool found = false;
+#define LOOK(name, from, to, rule)                                                           \
+    found |= formats::from.layout == layout && serves_two_rows(formats::from) == two_rows && \
+             formats::to.packing == packing && matrix_of(yuv_rule::rule) == matrix;
+    SIMGP_YUV_TO_RGB_KERNELS(LOOK)
+    SIMGP_PACKED_TO_RGB_KERNELS(LOOK)
+#undef LOOK
+    return found;
+}
+
+// The row, or the row for a pair of rows, from YUV to RGB.
+template <const format &From, const format &To, yuv_rule Rule>
+auto *yuv_to_rgb_row_of(const row_table &live) {
+    constexpr yuv_matrix matrix = matrix_of(Rule);
+    static_assert(is_needed(From.layout, serves_two_rows(From), To.packing, matrix),
+                  "rows/conversions.h has no kernel with such a row");
+    const size_t m = size_t(matrix), l = size_t(From.layout), p = size_t(To.packing);
+    if constexpr (serves_two_rows(From))
+        return live.yuv2rgb.pair[m][l][p];
+    else
+        return live.yuv2rgb.row[m][l][p];
+}
+
+// 1 where the first chroma line serves one row alone, else 0 (see yuv_rule).
+constexpr int lead_of(yuv_rule rule, ptrdiff_t width, ptrdiff_t height) {
+    return rule == yuv_rule::first_line_alone && width & 3 ? int(height & 1) : 0;
+}
+
+// Columns x ... x + width - 1 of a picture of `height` rows, as a walk sees them: the sources' lines
+// begin at column x, those of the destination at column 0.
+struct walk_span {
+    ptrdiff_t x, width, height;
 };
 
-// The lines of a plane; of one that is not there, null.
-struct plane_lines {
-    uint8_t *first;
-    ptrdiff_t stride;
-
-    uint8_t *line(ptrdiff_t y) const { return first ? first + y * stride : nullptr; }
-};
-
-inline plane_lines src_lines(const csc_args &a, int plane) {
-    if (plane < 0) return {nullptr, 0};
-    return {a.src_planes[plane], a.src_strides[plane]};
-}
-inline plane_lines dst_lines(const csc_args &a, int plane) {
-    if (plane < 0) return {nullptr, 0};
-    return {a.dst_planes[plane], a.dst_strides[plane]};
-}
-
-// Where a YUV format keeps its chroma: the layout of its rows, the planes of U and V (-1: none;
-// pairs lie in the plane of U), and log2 of the rows that share a chroma line.
-struct yuv_planes {
-    yuv_layout layout;
-    int8_t u, v;
-    bool serves_two_rows;
-};
-inline constexpr yuv_planes planes_yuv400{yuv_layout::grey, -1, -1, false};
-inline constexpr yuv_planes planes_yuv420{yuv_layout::half, 1, 2, true};
-inline constexpr yuv_planes planes_yv12{yuv_layout::half, 2, 1, true};
-inline constexpr yuv_planes planes_yuv422n{yuv_layout::half, 1, 2, false};
-inline constexpr yuv_planes planes_yuv422w{yuv_layout::full, 1, 2, true};
-inline constexpr yuv_planes planes_yuv444{yuv_layout::full, 1, 2, false};
-inline constexpr yuv_planes planes_nv12{yuv_layout::uv, 1, -1, true};
-inline constexpr yuv_planes planes_nv21{yuv_layout::vu, 1, -1, true};
-
-// Four kernels let row 0 of an odd-height picture have the first chroma line to itself, unless the
-// width is a multiple of 4: row y then takes line (y + 1) >> 1.
-inline int first_line_alone(const csc_args &a) {
-    return a.src_widths[0] & 3 ? a.src_heights[0] & 1 : 0;
-}
-
-// Calls `row` for every row from top to bottom, or `pair` for pairs of rows where chroma serves
-// two. Row y then takes chroma line (y + lead) >> 1. `luma` gives the lines of luma in this order.
-template <class Luma>
-void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes,
-                     yuv_to_rgb_row *row) {
-    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
-    if (width < 1) return;
-    const plane_lines u = src_lines(a, planes.u), v = src_lines(a, planes.v);
-    const plane_lines out = dst_lines(a, 0);
-    for (ptrdiff_t y = 0; y < height; y++)
-        row(luma.line(y), u.line(y), v.line(y), out.line(y), width);
-}
-template <class Luma>
-void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes,
-                     yuv_to_rgb_row_pair *pair, int lead) {
-    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
-    if (width < 1) return;
-    const plane_lines u = src_lines(a, planes.u), v = src_lines(a, planes.v);
-    const plane_lines out = dst_lines(a, 0);
-    for (ptrdiff_t y = 0; y < height;) {
-        const ptrdiff_t chroma = (y + lead) >> 1;
-        // The row below, or the row again where it has its chroma line to itself.
-        const ptrdiff_t below = y + 1 < height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
-        const uint8_t *const first = luma.line(y), *const second = luma.line(below);
-        pair(first, second, u.line(chroma), v.line(chroma), out.line(y), out.line(below), width);
-        y = below + 1;
+// Converts the rows of a span from top to bottom, in pairs where chroma lines serve two. Row y then
+// takes chroma line (y + lead) >> 1.
+template <const format &From, const format &To, yuv_rule Rule, class Luma, class U, class V>
+void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_span &span, int lead) {
+    auto *const row = yuv_to_rgb_row_of<From, To, Rule>(live_rows());
+    if (span.width < 1) return;
+    const ptrdiff_t at = span.x * To.bytes[0];
+    if constexpr (!serves_two_rows(From)) {
+        for (ptrdiff_t y = 0; y < span.height; y++)
+            row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y) + at, span.width);
+    } else {
+        for (ptrdiff_t y = 0; y < span.height;) {
+            const ptrdiff_t chroma = (y + lead) >> 1;
+            // The row below, or the row again where it has its chroma line to itself.
+            const ptrdiff_t below =
+                y + 1 < span.height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
+            const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
+            row(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y) + at,
+                dst.line(below) + at, span.width);
+            y = below + 1;
+        }
     }
 }
 
-// The same with the rows of `live` that the formats need.
-template <class Luma>
-void walk_yuv_to_rgb(const csc_args &a, Luma &&luma, const yuv_planes &planes, const rows &live,
-                     rgb_packing packing, int lead) {
-    const size_t from = size_t(planes.layout), to = size_t(packing);
-    if (planes.serves_two_rows)
-        walk_yuv_to_rgb(a, luma, planes, live.yuv_to_rgb_pair[from][to], lead);
-    else
-        walk_yuv_to_rgb(a, luma, planes, live.yuv_to_rgb[from][to]);
+// The same for the whole picture of a kernel, its luma from wherever it comes.
+template <const format &From, const format &To, yuv_rule Rule, class Luma>
+void convert_to_rgb(const csc_args &a, Luma &&luma) {
+    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
+    walk_yuv_to_rgb<From, To, Rule>(luma, src_lines(a, From.u),
+                                    src_lines(a, From.u == From.v ? -1 : From.v), dst_lines(a, 0),
+                                    {0, width, height}, lead_of(Rule, width, height));
 }
 
 // Calls row(in, out, width) for every row of a picture of one plane on either side, whose pixels
 // have so many bytes. Lines of an even width that lie end to end are one long row.
 template <class Row>
-void walk_one_plane(const csc_args &a, const plane_lines &in, int in_bytes, const plane_lines &out,
+void walk_one_plane(const csc_args &a, const const_lines &in, int in_bytes, const lines &out,
                     int out_bytes, Row row) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1 || height < 1) return;
@@ -106,16 +93,5 @@ void walk_one_plane(const csc_args &a, const plane_lines &in, int in_bytes, cons
 }
 
 }  // namespace simgp
-
-// Heads the definition of an exported conversion kernel, whose body then finds the arguments in
-// `args`.
-#define SIMGP_CSC_KERNEL(name, ...)                                                              \
-    void name(uint8_t *const *src_planes, const int32_t *src_widths, const int32_t *src_heights, \
-              const int32_t *src_strides, const int32_t *dst_strides,                            \
-              uint8_t *const *dst_planes) {                                                      \
-        const simgp::csc_args args{src_planes,  src_widths,  src_heights,                        \
-                                   src_strides, dst_strides, dst_planes};                        \
-        __VA_ARGS__;                                                                             \
-    }
 
 #endif

@@ -1,5 +1,5 @@
 // The choice of the instruction set.
-#include "simd/choose.h"
+#include "rows/choose.h"
 
 #include <atomic>
 #include <cstdlib>
@@ -21,7 +21,7 @@ target best_available() {
 TEST(choice, threads_that_race_for_the_first_call_agree) {
     constexpr int count = 8;
     std::atomic<int> ready = 0;
-    const simgp::rows *seen[count];
+    const simgp::row_table *seen[count];
     std::vector<std::thread> threads;
     for (int i = 0; i < count; i++)
         threads.emplace_back([&, i] {
@@ -29,9 +29,9 @@ TEST(choice, threads_that_race_for_the_first_call_agree) {
             seen[i] = &simgp::live_rows();
         });
     for (std::thread &t : threads) t.join();
-    for (const simgp::rows *rows : seen) {
+    for (const simgp::row_table *rows : seen) {
         EXPECT_EQ(rows, &simgp::rows_of(best_available()));
-        EXPECT_NE(rows->yuv_to_rgb[size_t(simgp::yuv_layout::half)][0], nullptr);
+        EXPECT_NE(rows->yuv2rgb.row[0][size_t(simgp::yuv_layout::half)][0], nullptr);
     }
 }
 
@@ -62,7 +62,7 @@ TEST(choice, every_target_has_its_own_rows) {
     const auto &all = rig::all_targets();
     for (size_t i = 0; i < all.size(); i++)
         for (size_t k = 0; k < i; k++)
-            EXPECT_NE(all[i].rows->vu_to_rgb565_coarse_pair, all[k].rows->vu_to_rgb565_coarse_pair)
+            EXPECT_NE(all[i].rows->layout.pack, all[k].rows->layout.pack)
                 << all[i].name << ", " << all[k].name;
 }
 

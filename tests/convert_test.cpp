@@ -1,100 +1,73 @@
 // simgp-convert as its users meet it: the program is run on files and pipes in a folder of its own.
 #include <gtest/gtest.h>
-#include <sys/wait.h>
+#include <stdlib.h>
+#include <string.h>
 
 #include <algorithm>
 #include <array>
-#include <cstdlib>
-#include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <set>
-#include <sstream>
 #include <string>
 
+#include "tests/program.h"
 #include "tools/picture.h"
-#include "tools/rgb.h"
 #include "tools/source.h"
 
 namespace {
 
 namespace fs = std::filesystem;
-using tools::Format;
-using tools::Kind;
-using tools::Picture;
+using tools::picture;
+using tools::pixel_format;
 
-std::string read_file(const fs::path &path) {
-    std::ifstream file(path, std::ios::binary);
-    std::ostringstream text;
-    text << file.rdbuf();
-    return text.str();
-}
-
-void write_file(const fs::path &path, const std::string &text) {
-    std::ofstream(path, std::ios::binary) << text;
-}
-
-class Convert : public testing::Test {
+class convert_test : public testing::Test {
   protected:
-    void SetUp() override {
-        std::string name = fs::temp_directory_path() / "simgp-convert-test.XXXXXX";
-        ASSERT_NE(mkdtemp(name.data()), nullptr);
-        folder_ = name;
-        fs::create_directory(work());
-    }
-    void TearDown() override { fs::remove_all(folder_); }
+    convert_test() { fs::create_directory(at("")); }
 
-    fs::path work() const { return folder_ / "work"; }
-    fs::path at(const std::string &name) const { return work() / name; }
-
-    /// Runs a shell command line in the folder, the program's name written as $C.
-    int shell(const std::string &line) {
-        const std::string command = "cd '" + work().string() + "' && C=" + SIMGP_CONVERT +
-                                    " && { " + line + "; } >../out 2>../err";
-        const int status = std::system(("bash -c " + quoted(command)).c_str());
-        out_ = read_file(folder_ / "out");
-        err_ = read_file(folder_ / "err");
-        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    // Files of the program lie apart from what it prints.
+    std::string at(const std::string &name) const { return place / ("work/" + name); }
+    std::string read(const std::string &name) const { return place.read("work/" + name); }
+    void write(const std::string &name, const std::string &bytes) const {
+        place.write("work/" + name, bytes);
     }
-    int run(const std::string &arguments) { return shell("$C " + arguments); }
-    void good(const std::string &arguments) {
-        ASSERT_EQ(run(arguments), 0) << arguments << "\n" << err_;
-    }
-
-    std::set<std::string> files() const {
+    std::set<std::string> files(const std::string &folder = "") const {
         std::set<std::string> names;
-        for (const auto &entry : fs::directory_iterator(work()))
+        for (const auto &entry : fs::directory_iterator(at(folder)))
             names.insert(entry.path().filename());
         return names;
     }
 
-    static std::string quoted(const std::string &text) {
-        std::string result = "'";
-        for (char c : text) result += c == '\'' ? std::string("'\\''") : std::string(1, c);
-        return result + "'";
+    // Runs a line of bash in the folder, the program's name written as $C.
+    int shell(const std::string &line) {
+        place.write("line", "cd '" + at("") + "' && C=" SIMGP_CONVERT " && { " + line + "; }");
+        got = program::run(place, "bash '" + place / "line" + "'");
+        return got.status;
+    }
+    int run(const std::string &arguments) { return shell("$C " + arguments); }
+    void good(const std::string &arguments) {
+        ASSERT_EQ(run(arguments), 0) << arguments << "\n" << got.err;
     }
 
-    /// The picture of a PNG in the folder.
-    Picture png(const std::string &name) const {
+    // The picture of a PNG in the folder.
+    picture png(const std::string &name) const {
         auto source = tools::open_source({at(name), "", ""});
-        Picture picture;
-        source->next(picture);
-        return picture;
+        picture p;
+        source->next(p);
+        return p;
     }
 
-    fs::path folder_;
-    std::string out_, err_;
+    program::folder place;
+    program::outcome got;
 };
 
-std::vector<const Format *> formats(bool rgb) {
-    std::vector<const Format *> list;
-    for (const Format &format : tools::formats())
+std::vector<const pixel_format *> formats(bool rgb) {
+    std::vector<const pixel_format *> list;
+    for (const pixel_format &format : tools::formats())
         if (format.is_rgb() == rgb) list.push_back(&format);
     return list;
 }
 
-/// The largest difference between two RGB pictures of the same size, and where it is.
-int difference(const Picture &a, const Picture &b, std::string *where = nullptr) {
+// The largest difference between two RGB pictures of the same size, and where it is.
+int difference(const picture &a, const picture &b, std::string *where = nullptr) {
     EXPECT_EQ(a.width(), b.width());
     EXPECT_EQ(a.height(), b.height());
     if (a.width() != b.width() || a.height() != b.height()) return 256;
@@ -102,7 +75,7 @@ int difference(const Picture &a, const Picture &b, std::string *where = nullptr)
     for (int y = 0; y < a.height(); ++y)
         for (int x = 0; x < a.width(); ++x)
             for (int c = 0; c < 3; ++c) {
-                const int apart = std::abs(*a.sample(c, x, y) - *b.sample(c, x, y));
+                const int apart = abs(*a.sample(c, x, y) - *b.sample(c, x, y));
                 if (apart <= worst) continue;
                 worst = apart;
                 if (where)
@@ -121,13 +94,13 @@ constexpr std::array<std::array<int, 3>, 8> bar_colours = {{{255, 255, 255},
                                                             {0, 0, 255},
                                                             {0, 0, 0}}};
 
-/// The bars stand where they should, left to right, in their colours.
-void expect_bars(const Picture &picture, int tolerance, bool grey, const std::string &what) {
+// The bars stand where they should, left to right, in their colours.
+void expect_bars(const picture &p, int tolerance, bool grey, const std::string &what) {
     for (int bar = 0; bar < 8; ++bar) {
-        const int x = (2 * bar + 1) * picture.width() / 16;
+        const int x = (2 * bar + 1) * p.width() / 16;
         for (int c = 0; c < 3; ++c) {
             if (grey && bar != 0 && bar != 7) continue;
-            EXPECT_NEAR(*picture.sample(c, x, 0), bar_colours[bar][c], tolerance)
+            EXPECT_NEAR(*p.sample(c, x, 0), bar_colours[bar][c], tolerance)
                 << what << ": bar " << bar << ", channel " << c;
         }
     }
@@ -136,8 +109,8 @@ void expect_bars(const Picture &picture, int tolerance, bool grey, const std::st
 // Every format goes out to a raw file and comes back from it with the right colours, at sizes that
 // are odd and not multiples of a tile: a wrong plane order, offset, stride or channel shows.
 // Grey shows its luma as it is, so that black is 16 there and white 235.
-TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
-    for (const Format *format : formats(false))
+TEST_F(convert_test, raw_files_of_every_yuv_format_keep_the_bars) {
+    for (const pixel_format *format : formats(false))
         for (const char *size : {"128x64", "97x51"}) {
             const std::string name(format->name), file = name + size + "." + name;
             good(std::string("testcard:") + size + "@3 --format " + name + " -o " + file);
@@ -145,7 +118,7 @@ TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
             expect_bars(png(file + ".png"), name == "yuv400" ? 20 : 9, name == "yuv400", file);
             // Nothing to convert: the same bytes again, all three frames of them.
             good(file + " --size " + size + " -o again." + name);
-            EXPECT_EQ(read_file(at(file)), read_file(at("again." + name))) << file;
+            EXPECT_EQ(read(file), read("again." + name)) << file;
         }
     EXPECT_EQ(fs::file_size(at("yuv420128x64.yuv420")), 3u * 128 * 64 * 3 / 2);
     EXPECT_EQ(fs::file_size(at("uyvy97x51.uyvy")), 3u * 97 * 2 * 51);
@@ -153,39 +126,39 @@ TEST_F(Convert, RawFilesOfEveryYuvFormatKeepTheBars) {
     // The last pixel of an odd line has no V of its own.
     good("uyvy97x51.uyvy --size 97x51 -n 1 --to yuv444 -o last.y4m");
     good("last.y4m -o last.png -q");
-    const Picture last = png("last.png");
+    const picture last = png("last.png");
     for (int c = 0; c < 3; ++c) EXPECT_LE(*last.sample(c, 96, 0), 8);
     // 97 x 51: one pair of tile rows of one group; chroma of 25 rows: one single tile row.
     EXPECT_EQ(fs::file_size(at("t64x3297x51.t64x32")), 3u * (8192 + 8192));
 }
 
-TEST_F(Convert, EveryRgbFormatHasTheBarsAndWidensToFullWhite) {
-    for (const Format *format : formats(true)) {
+TEST_F(convert_test, every_rgb_format_has_the_bars_and_widens_to_full_white) {
+    for (const pixel_format *format : formats(true)) {
         const std::string name(format->name);
         good("testcard:97x51 -q --to " + name + " -o " + name + ".png");
-        const Picture picture = png(name + ".png");
-        expect_bars(picture, format->kind == Kind::rgb16 ? 8 : 2, false, name);
-        for (int c = 0; c < 3; ++c) EXPECT_EQ(*picture.sample(c, 1, 0), 255) << name;
+        const picture p = png(name + ".png");
+        expect_bars(p, format->is_rgb16() ? 8 : 2, false, name);
+        for (int c = 0; c < 3; ++c) EXPECT_EQ(*p.sample(c, 1, 0), 255) << name;
         // The same pixels as PPM, after the header, and as raw bytes of the format.
         good("testcard:97x51 -q --to " + name + " -o " + name + ".ppm");
-        const std::string header = "P6\n97 51\n255\n", ppm = read_file(at(name + ".ppm"));
+        const std::string header = "P6\n97 51\n255\n", ppm = read(name + ".ppm");
         ASSERT_EQ(ppm.size(), header.size() + 97 * 51 * 3);
         EXPECT_EQ(ppm.substr(0, header.size()), header);
-        EXPECT_EQ(std::memcmp(ppm.data() + header.size(), picture.row(0, 0), 97 * 3), 0) << name;
+        EXPECT_EQ(memcmp(ppm.data() + header.size(), p.line(0, 0), 97 * 3), 0) << name;
     }
     good("testcard:16x8 -o one.argb8888");
-    EXPECT_EQ(read_file(at("one.argb8888")).substr(0, 4), "\xff\xff\xff\xff");
-    EXPECT_EQ(read_file(at("one.argb8888")).substr(40, 4), std::string("\xff\xff\x00\x00", 4));
+    EXPECT_EQ(read("one.argb8888").substr(0, 4), "\xff\xff\xff\xff");
+    EXPECT_EQ(read("one.argb8888").substr(40, 4), std::string("\xff\xff\x00\x00", 4));
 }
 
 // What the two matrices allow: a PNG goes to every YUV format and comes back. The picture has soft
 // colours, of which subsampling takes little, and odd sizes, so that the last column and line need
 // chroma of their own; at a height of 65 that line is more than the chroma tiles hold.
-TEST_F(Convert, PicturesGoIntoEveryYuvFormatAndComeBack) {
+TEST_F(convert_test, pictures_go_into_every_yuv_format_and_come_back) {
     constexpr int width = 75;
     for (int height : {67, 65}) {
         const std::string size = "75x" + std::to_string(height);
-        Picture soft({&tools::format_named("rgb888"), width, height});
+        picture soft({&tools::format_named("rgb888"), width, height});
         std::string bytes;
         for (int y = 0; y < height; ++y) {
             for (int x = 0; x < width; ++x) {
@@ -193,12 +166,12 @@ TEST_F(Convert, PicturesGoIntoEveryYuvFormatAndComeBack) {
                 *soft.sample(1, x, y) = uint8_t(200 - y);
                 *soft.sample(2, x, y) = uint8_t(90 + x / 2 + y / 2);
             }
-            bytes.append(reinterpret_cast<char *>(soft.row(0, y)), width * 3);
+            bytes.append(reinterpret_cast<char *>(soft.line(0, y)), width * 3);
         }
-        write_file(at("soft.rgb888"), bytes);
+        write("soft.rgb888", bytes);
         good("soft.rgb888 --size " + size + " -o soft.png");
         ASSERT_EQ(difference(png("soft.png"), soft), 0);
-        for (const Format *format : formats(false)) {
+        for (const pixel_format *format : formats(false)) {
             const std::string name(format->name);
             good("soft.png -o soft." + name);
             good("soft." + name + " --size " + size + " -q -o back.png");
@@ -213,27 +186,26 @@ TEST_F(Convert, PicturesGoIntoEveryYuvFormatAndComeBack) {
     }
 }
 
-TEST_F(Convert, Y4mOfEveryLayoutComesFromFilesAndPipes) {
+TEST_F(convert_test, y4m_of_every_layout_comes_from_files_and_pipes) {
     for (const char *format : {"yuv400", "yuv420", "yuv422n", "yuv444"}) {
         const std::string name(format);
         good("testcard:33x17@4 --format " + name + " -o " + name + ".y4m");
-        ASSERT_EQ(shell("cat " + name + ".y4m | $C - -o - --as y4m > pipe.y4m"), 0) << err_;
-        EXPECT_EQ(read_file(at(name + ".y4m")), read_file(at("pipe.y4m"))) << name;
+        ASSERT_EQ(shell("cat " + name + ".y4m | $C - -o - --as y4m > pipe.y4m"), 0) << got.err;
+        EXPECT_EQ(read(name + ".y4m"), read("pipe.y4m")) << name;
     }
     // Parameters of frames, comments, the tags for rate and aspect: read, and kept where they
     // matter.
-    const std::string video = read_file(at("yuv420.y4m"));
+    const std::string video = read("yuv420.y4m");
     const size_t header = video.find('\n') + 1;
-    write_file(at("tags.y4m"),
-               "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420mpeg2 XCOMMENT=none\nFRAME Ip\n" +
-                   video.substr(header + 6));
+    write("tags.y4m", "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420mpeg2 XCOMMENT=none\nFRAME Ip\n" +
+                          video.substr(header + 6));
     good("tags.y4m -o kept.y4m");
-    const std::string kept = read_file(at("kept.y4m"));
+    const std::string kept = read("kept.y4m");
     EXPECT_EQ(kept.substr(0, kept.find('\n')), "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420jpeg");
     EXPECT_EQ(kept.substr(kept.find('\n') + 1), video.substr(header));
 }
 
-TEST_F(Convert, SeveralFramesBecomeNumberedFilesOrASheet) {
+TEST_F(convert_test, several_frames_become_numbered_files_or_a_sheet) {
     good("testcard:64x48@12 -o a%%-%03d.png");
     std::set<std::string> expected;
     for (int k = 0; k < 12; ++k)
@@ -242,59 +214,57 @@ TEST_F(Convert, SeveralFramesBecomeNumberedFilesOrASheet) {
     EXPECT_GT(difference(png("a%-000.png"), png("a%-011.png")), 100) << "the card does not move";
 
     good("testcard:64x48@12 -n 6 -o sheet.png --sheet --columns 3");
-    const Picture sheet = png("sheet.png");
+    const picture sheet = png("sheet.png");
     EXPECT_EQ(sheet.width(), 3 * (64 + 8) + 8);
     // The first picture stands in its frame unchanged, below its label.
-    const Picture first = png("a%-000.png");
+    const picture first = png("a%-000.png");
     const int top = (sheet.height() - 8) / 2 - 48;
     for (int y = 0; y < 48; ++y)
-        ASSERT_EQ(std::memcmp(sheet.sample(0, 8, top + y), first.row(0, y), 64 * 3), 0)
-            << "line " << y;
+        ASSERT_EQ(memcmp(sheet.sample(0, 8, top + y), first.line(0, y), 64 * 3), 0) << "line " << y;
 
     good("testcard:64x48@200 -o long.ppm --sheet");
-    EXPECT_LT(read_file(at("long.ppm")).size(), 64 * (64 + 8) * (48 + 19) * 3u + 50000);
+    EXPECT_LT(read("long.ppm").size(), 64 * (64 + 8) * (48 + 19) * 3u + 50000);
 }
 
-TEST_F(Convert, DitheringIsTheLibrarysOwn) {
+TEST_F(convert_test, dithering_is_the_librarys_own) {
     good("testcard:64x48 -o plain.rgb565");
     good("testcard:64x48 -o dithered.rgb565 --dither");
-    EXPECT_NE(read_file(at("plain.rgb565")), read_file(at("dithered.rgb565")));
+    EXPECT_NE(read("plain.rgb565"), read("dithered.rgb565"));
     auto card = tools::open_source({"testcard:64x48", "", ""});
-    Picture frame, screen({&tools::format_named("rgb565"), 64, 48});
+    picture frame, screen({&tools::format_named("rgb565"), 64, 48});
     card->next(frame);
     const simgp_img src = frame.descriptor(), dst = screen.descriptor();
     ASSERT_EQ(simgp_csc_dither(&src, &dst), SIMGP_OK);
-    EXPECT_EQ(read_file(at("dithered.rgb565")),
-              std::string(reinterpret_cast<char *>(screen.row(0, 0)), 64 * 48 * 2));
+    EXPECT_EQ(read("dithered.rgb565"),
+              std::string(reinterpret_cast<char *>(screen.line(0, 0)), 64 * 48 * 2));
     // Where the library does not dither from a format, the road goes over one from which it does.
     good("testcard:64x48 --format nv12 -o over.bgr565 --dither -v");
-    EXPECT_NE(err_.find("nv12 -> yuv420 -> bgr565 (dithered)"), std::string::npos) << err_;
+    EXPECT_NE(got.err.find("nv12 -> yuv420 -> bgr565 (dithered)"), std::string::npos) << got.err;
     // Without --to, a format that can be dithered is chosen; luma alone can be, too.
     good("testcard:64x48 -o seen.png --dither -v");
-    EXPECT_NE(err_.find("yuv420 -> rgb565 (dithered)"), std::string::npos) << err_;
+    EXPECT_NE(got.err.find("yuv420 -> rgb565 (dithered)"), std::string::npos) << got.err;
     good("testcard:64x48 -o luma.y4m --dither -v");
-    EXPECT_NE(err_.find("yuv420 -> yuv420 (dithered)"), std::string::npos) << err_;
+    EXPECT_NE(got.err.find("yuv420 -> yuv420 (dithered)"), std::string::npos) << got.err;
 }
 
 // Each fault: one line that names what and where, the exit status, and no file that was not there.
-TEST_F(Convert, BadInputEndsInOneClearLineAndNoFile) {
+TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
     good("testcard:64x48@3 -o good.y4m");
     good("testcard:64x48@3 -o good.nv21 --format nv21");
     good("testcard:64x48 -o good.png");
-    const std::string y4m = read_file(at("good.y4m")), png = read_file(at("good.png"));
-    const std::string nv21 = read_file(at("good.nv21"));
+    const std::string y4m = read("good.y4m"), png = read("good.png");
+    const std::string nv21 = read("good.nv21");
     const size_t frame = 64 * 48 * 3 / 2;
-    write_file(at("cut.y4m"), y4m.substr(0, y4m.size() - 100));
-    write_file(at("cut.nv21"), nv21.substr(0, frame + 1));
-    write_file(at("cut.png"), png.substr(0, png.size() / 2));
-    write_file(at("huge.png"),
-               png.substr(0, 16) + std::string("\x7f\xff\xff\xff", 4) + png.substr(20));
-    write_file(at("empty"), "");
-    write_file(at("text"), "This is no picture at all.");
+    write("cut.y4m", y4m.substr(0, y4m.size() - 100));
+    write("cut.nv21", nv21.substr(0, frame + 1));
+    write("cut.png", png.substr(0, png.size() / 2));
+    write("huge.png", png.substr(0, 16) + std::string("\x7f\xff\xff\xff", 4) + png.substr(20));
+    write("empty", "");
+    write("text", "This is no picture at all.");
     const size_t second = y4m.find("FRAME", y4m.find("FRAME") + 5);
-    write_file(at("lost.y4m"), y4m.substr(0, second) + "x" + y4m.substr(second));
+    write("lost.y4m", y4m.substr(0, second) + "x" + y4m.substr(second));
     auto header = [&](const std::string &name, const std::string &tags) {
-        write_file(at(name), "YUV4MPEG2 " + tags + "\nFRAME\n" + std::string(100, 'x'));
+        write(name, "YUV4MPEG2 " + tags + "\nFRAME\n" + std::string(100, 'x'));
     };
     header("deep.y4m", "W4 H4 C420p10");
     header("tag.y4m", "W4 H4 Z7");
@@ -304,8 +274,8 @@ TEST_F(Convert, BadInputEndsInOneClearLineAndNoFile) {
     header("zero.y4m", "W0 H4");
     header("negative.y4m", "W4 H-4");
     header("nowidth.y4m", "H4");
-    write_file(at("none.y4m"), "YUV4MPEG2 W4 H4\n");
-    write_file(at("endless.y4m"), "YUV4MPEG2 W4 H4 X" + std::string(5000, 'x'));
+    write("none.y4m", "YUV4MPEG2 W4 H4\n");
+    write("endless.y4m", "YUV4MPEG2 W4 H4 X" + std::string(5000, 'x'));
     const std::set<std::string> before = files();
 
     const struct {
@@ -360,64 +330,63 @@ TEST_F(Convert, BadInputEndsInOneClearLineAndNoFile) {
     for (const auto &c : cases) {
         SCOPED_TRACE(c.arguments);
         EXPECT_EQ(run(c.arguments), c.status);
-        EXPECT_NE(err_.find(c.message), std::string::npos) << err_;
-        EXPECT_EQ(err_.rfind("simgp-convert: ", 0), 0u) << err_;
-        EXPECT_EQ(std::count(err_.begin(), err_.end(), '\n'), 1) << err_;
-        EXPECT_EQ(out_, "");
+        EXPECT_NE(got.err.find(c.message), std::string::npos) << got.err;
+        EXPECT_EQ(got.err.rfind("simgp-convert: ", 0), 0u) << got.err;
+        EXPECT_EQ(std::count(got.err.begin(), got.err.end(), '\n'), 1) << got.err;
+        EXPECT_EQ(got.out, "");
         EXPECT_EQ(files(), before);
     }
 }
 
-TEST_F(Convert, AFailureKeepsWhatWasThere) {
+TEST_F(convert_test, a_failure_keeps_what_was_there) {
     good("testcard:64x48@3 -o good.y4m");
-    const std::string y4m = read_file(at("good.y4m"));
-    write_file(at("cut.y4m"), y4m.substr(0, y4m.size() - 1));
-    write_file(at("old.raw"), "precious");
+    const std::string y4m = read("good.y4m");
+    write("cut.y4m", y4m.substr(0, y4m.size() - 1));
+    write("old.raw", "precious");
     EXPECT_EQ(run("cut.y4m -o old.raw"), 1);
-    EXPECT_EQ(read_file(at("old.raw")), "precious");
+    EXPECT_EQ(read("old.raw"), "precious");
     // Complete pictures stay, and the message says so.
     EXPECT_EQ(run("cut.y4m -o p%d.png"), 1);
-    EXPECT_NE(err_.find("(2 complete pictures stay)"), std::string::npos) << err_;
+    EXPECT_NE(got.err.find("(2 complete pictures stay)"), std::string::npos) << got.err;
     EXPECT_EQ(files(),
               (std::set<std::string>{"cut.y4m", "good.y4m", "old.raw", "p0.png", "p1.png"}));
     // A file may be converted onto itself.
     good("good.y4m -o good.y4m --to yuv422n");
-    EXPECT_EQ(read_file(at("good.y4m")).find("C422\n") != std::string::npos, true);
+    EXPECT_EQ(read("good.y4m").find("C422\n") != std::string::npos, true);
 }
 
-TEST_F(Convert, BrokenPipesFullDisksAndInterruptionsEndCleanly) {
+TEST_F(convert_test, broken_pipes_full_disks_and_interruptions_end_cleanly) {
     EXPECT_EQ(shell("$C testcard:320x240@100 -o - | head -c 10 >/dev/null; exit ${PIPESTATUS[0]}"),
               1);
-    EXPECT_NE(err_.find("standard output: Broken pipe"), std::string::npos) << err_;
+    EXPECT_NE(got.err.find("standard output: Broken pipe"), std::string::npos) << got.err;
     if (fs::exists("/dev/full")) {
         EXPECT_EQ(run("testcard:320x240@2 -o /dev/full"), 1);
-        EXPECT_NE(err_.find("/dev/full: No space left"), std::string::npos) << err_;
+        EXPECT_NE(got.err.find("/dev/full: No space left"), std::string::npos) << got.err;
     }
     EXPECT_NE(shell("$C testcard:640x480@1000000 -o long.raw & sleep 0.3; ls -A; kill %1; wait %1"),
               0);
-    EXPECT_NE(out_.find(".long.raw."), std::string::npos) << "it was over too soon";
+    EXPECT_NE(got.out.find(".long.raw."), std::string::npos) << "it was over too soon";
     EXPECT_EQ(files(), std::set<std::string>{});
 }
 
-TEST_F(Convert, TheDemonstrationLeavesItsPictures) {
+TEST_F(convert_test, the_demonstration_leaves_its_pictures) {
     good("--demo pictures testcard:320x240@3");
-    std::set<std::string> names;
-    for (const auto &entry : fs::directory_iterator(at("pictures"))) {
-        names.insert(entry.path().filename());
-        EXPECT_NE(out_.find(entry.path().filename()), std::string::npos);
-        EXPECT_GT(png("pictures/" + entry.path().filename().string()).width(), 800);
+    EXPECT_EQ(files("pictures"),
+              (std::set<std::string>{"every-rgb-format.png", "every-yuv-to-rgb.png",
+                                     "tiles-and-dithering.png"}));
+    for (const std::string &name : files("pictures")) {
+        EXPECT_NE(got.out.find(name), std::string::npos);
+        EXPECT_GT(png("pictures/" + name).width(), 800);
     }
-    EXPECT_EQ(names, (std::set<std::string>{"every-rgb-format.png", "every-yuv-to-rgb.png",
-                                            "tiles-and-dithering.png"}));
 }
 
-TEST_F(Convert, TheListNamesTheLibrarysConversions) {
+TEST_F(convert_test, the_list_names_the_librarys_conversions) {
     good("--list");
     for (const char *line :
          {"  yuv400    -> rgb565*\n", "  t64x32    -> yuv420 nv12 rgb565 bgra8888\n",
           "  rgba8888  -> rgb565\n"})
-        EXPECT_NE(out_.find(line), std::string::npos) << line << out_;
-    EXPECT_EQ(out_.find("\n  bgr565 "), std::string::npos) << "bgr565 converts to nothing";
+        EXPECT_NE(got.out.find(line), std::string::npos) << line << got.out;
+    EXPECT_EQ(got.out.find("\n  bgr565 "), std::string::npos) << "bgr565 converts to nothing";
 }
 
 }  // namespace

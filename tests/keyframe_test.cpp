@@ -90,8 +90,9 @@ TEST(keyframe, search_finds_the_first_code) {
                 uint8_t *b = buffer.data();
                 for (ptrdiff_t i = 0; i < count + 2; i++) b[i] = zeros ? 0 : uint8_t(1 + i % 255);
                 if (at < count) b[at] = b[at + 1] = 0, b[at + 2] = 0x83;
-                ASSERT_EQ(target.rows->find_code(b, count, 0xFC, 0x80), at) << "of " << count;
-                ASSERT_EQ(target.rows->find_code(b, count, 0xFF, 0x82), count);
+                ASSERT_EQ(target.rows->keyframe.find_code(b, count, 0xFC, 0x80), at)
+                    << "of " << count;
+                ASSERT_EQ(target.rows->keyframe.find_code(b, count, 0xFF, 0x82), count);
             }
     });
 }

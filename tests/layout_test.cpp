@@ -3,48 +3,25 @@
 #include <cstring>
 
 #include "simgp/simgp.h"
+#include "tests/conversions.h"
 #include "tests/rig.h"
 
 namespace {
 
-// Where a picture keeps sample x of chroma row y; `v`: of V, else of U.
-uint8_t *chroma(int format, const rig::picture &p, bool v, int x, int y) {
-    switch (format) {
-        case SIMGP_FMT_NV12:
-            return p.row(1, y) + 2 * x + (v ? 1 : 0);
-        case SIMGP_FMT_NV21:
-            return p.row(1, y) + 2 * x + (v ? 0 : 1);
-        case SIMGP_FMT_YV12:
-        case SIMGP_FMT_YV16:
-            return p.row(v ? 1 : 2, y) + x;
-        default:
-            return p.row(v ? 2 : 1, y) + x;
-    }
-}
-
-bool full_height(int format) { return format == SIMGP_FMT_YUV422N || format == SIMGP_FMT_YV16; }
-
-struct kernel {
-    const char *name;
-    simgp_csc_fn *run;
-    int from, to;
-};
-#define KERNEL(name, from, to) \
-    { #name, simgp_csc_##name, SIMGP_FMT_##from, SIMGP_FMT_##to }
-const kernel kernels[] = {
-    KERNEL(yuv420_to_yv12, YUV420, YV12),       KERNEL(yuv420_to_yuv422n, YUV420, YUV422N),
-    KERNEL(yuv420_to_nv12, YUV420, NV12),       KERNEL(yuv420_to_nv21, YUV420, NV21),
-    KERNEL(yuv422n_to_yuv420, YUV422N, YUV420), KERNEL(yuv422n_to_yv12, YUV422N, YV12),
-    KERNEL(yv16_to_yuv420, YV16, YUV420),       KERNEL(yv16_to_yv12, YV16, YV12),
-    KERNEL(nv12_to_yuv420, NV12, YUV420),       KERNEL(nv12_to_yv12, NV12, YV12),
-    KERNEL(nv21_to_yuv420, NV21, YUV420),       KERNEL(nv21_to_yv12, NV21, YV12),
-};
+using rig::channel;
+using rig::conversion;
 
 TEST(layout, every_kernel_at_every_size_on_every_target) {
-    for (const kernel &k : kernels)
+    for (const conversion &k : rig::conversions_of(rig::family::layout)) {
+        const rig::format &from = rig::format_of(k.from), &to = rig::format_of(k.to);
+        const int above = from.at(channel::u).down, below = to.at(channel::u).down;
+        ASSERT_EQ(from.at(channel::u).across, to.at(channel::u).across) << k.name;
         rig::check_jobs(k.name, {.max_width = 2 * 130}, [&](int w, int h) {
-            const bool halved = full_height(k.from), doubled = full_height(k.to);
-            const int chroma_rows = halved ? h / 2 : doubled ? (h + 1) / 2 * 2 : (h + 1) / 2;
+            const bool halved = above < below;
+            const bool doubled = above > below;
+            const int chroma_rows = halved    ? h / 2
+                                    : doubled ? (h + 1) / 2 * 2
+                                              : (h + above - 1) / above;
             rig::job j{rig::shapes_of(k.from, w, h), rig::shapes_of(k.to, w, h), {}, {}};
             if (doubled)  // room for both rows of the last one
                 for (size_t i : {1, 2}) j.dst[i] = rig::samples((w + 1) / 2, chroma_rows);
@@ -55,16 +32,15 @@ TEST(layout, every_kernel_at_every_size_on_every_target) {
             };
             j.reference = [=](const rig::picture &src, const rig::picture &dst) {
                 for (int y = 0; y < h; y++) std::copy_n(src.row(0, y), w, dst.row(0, y));
-                for (int y = 0; y < chroma_rows; y++)
-                    for (int x = 0; x < (w + 1) / 2; x++)
-                        for (bool v : {false, true})
-                            *chroma(k.to, dst, v, x, y) = *chroma(k.from, src, v, x,
-                                                                  halved    ? 2 * y
-                                                                  : doubled ? y / 2
-                                                                            : y);
+                for (int row = 0; row < chroma_rows; row++)  // a row is for pixels from below * row
+                    for (int x = 0; x < w; x++)
+                        for (channel c : {channel::u, channel::v})
+                            *sample(dst, to, c, x, below * row) =
+                                *sample(src, from, c, x, below * row);
             };
             return j;
         });
+    }
 }
 
 // Planes
@@ -101,6 +77,21 @@ TEST(layout, two_planes_are_interleaved) {
                                     dst.row(0, y)[x] = src.row(x % 2, y)[x / 2];
                         }};
     });
+}
+
+TEST(layout, planes_of_half_and_twice_the_rows) {
+    const auto repeat = [](int times) {  // times / 2 rows for each row of the source
+        return [=](const rig::picture &src, const rig::picture &dst) {
+            for (int y = 0; y < dst.parts[0].shape().rows; y++)
+                std::copy_n(src.row(0, 2 * y / times), src.widths[0], dst.row(0, y));
+        };
+    };
+    rig::check_plane_fn(
+        "simgp_csc_1x2_to_1x1", simgp_csc_1x2_to_1x1, 1,
+        [](int w, int h) { return rig::samples(w, h / 2); }, {}, repeat(1));
+    rig::check_plane_fn(
+        "simgp_csc_1x1_to_1x2", simgp_csc_1x1_to_1x2, 1,
+        [](int w, int h) { return rig::samples(w, 2 * h); }, {}, repeat(4));
 }
 
 TEST(layout, rows_are_halved_and_doubled) {

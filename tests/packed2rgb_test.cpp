@@ -2,33 +2,18 @@
 #include <string.h>
 
 #include "simgp/simgp.h"
+#include "tests/conversions.h"
 #include "tests/rig.h"
 
 namespace {
 
-// Each beside the planar kernel with the same output.
-struct kernel {
-    const char *name;
-    simgp_csc_fn *run, *planar;
-    int from, to;
-};
+using rig::channel;
+using rig::conversion;
 
-#define KERNEL(name, from, to, planar) \
-    { #name, simgp_csc_##name, simgp_csc_##planar, SIMGP_FMT_##from, SIMGP_FMT_##to }
-const kernel kernels[] = {
-    KERNEL(yuyv_to_rgb565, YUYV, RGB565, yuv420_to_rgb565),
-    KERNEL(yuyv_to_rgb888, YUYV, RGB888, yuv420_to_rgb888),
-    KERNEL(uyvy_to_rgb565, UYVY, RGB565, yuv420_to_rgb565),
-    KERNEL(uyvy_to_bgr565, UYVY, BGR565, yuv420_to_bgr565),
-    KERNEL(uyvy_to_rgb888, UYVY, RGB888, yuv420_to_rgb888),
-    KERNEL(uyvy_to_bgr888, UYVY, BGR888, yuv420_to_bgr888),
-    KERNEL(uyvy_to_rgba8888, UYVY, RGBA8888, yuv420_to_rgba8888),
-    KERNEL(uyvy_to_bgra8888, UYVY, BGRA8888, yuv420_to_bgra8888),
-    KERNEL(uyvy_to_argb8888, UYVY, ARGB8888, yuv420_to_argb8888),
-};
+const std::vector<conversion> kernels = rig::conversions_of(rig::family::packed_to_rgb);
 
 TEST(packed2rgb, vector_rows_equal_scalar_rows) {
-    for (const kernel &k : kernels) rig::check_csc(k.name, k.run, k.from, k.to);
+    for (const conversion &k : kernels) rig::check_csc(k.name, k.run, k.from, k.to);
 }
 
 // Rows, unpacked by hand, must give what the planar kernel gives. Of an odd width the last chroma
@@ -36,7 +21,11 @@ TEST(packed2rgb, vector_rows_equal_scalar_rows) {
 // row of them where the width is odd.
 TEST(packed2rgb, packed_rows_equal_planar_rows) {
     rig::rng random(rig::seed());
-    for (const kernel &k : kernels)
+    const rig::format &planes = rig::format_of(SIMGP_FMT_YUV420);
+    for (const conversion &k : kernels) {
+        const rig::format &from = rig::format_of(k.from);
+        const conversion *const from_planes = rig::conversion_between(SIMGP_FMT_YUV420, k.to);
+        ASSERT_NE(from_planes, nullptr) << k.name;
         for (int width = 1; width <= 150; width += 1 + random.below(3)) {
             SCOPED_TRACE(testing::Message() << k.name << ", width " << width);
             rig::picture src(rig::shapes_of(k.from, width, 2));
@@ -45,16 +34,17 @@ TEST(packed2rgb, packed_rows_equal_planar_rows) {
                 row(rig::shapes_of(k.to, width, 1));
             const auto shapes = rig::shapes_of(k.to, width, 2);
             rig::picture expected(shapes), got(shapes);
-            const int first_luma = k.from == SIMGP_FMT_UYVY, first_chroma = !first_luma;
             for (int y = 0; y < 2; y++) {
-                const uint8_t *const in = src.row(0, y);
-                for (int x = 0; x < width; x++) planar.row(0, 0)[x] = in[2 * x + first_luma];
-                for (int i = 0; i < (width + 1) / 2; i++) {
-                    const uint8_t *u = in + 4 * i + first_chroma;
-                    planar.row(1, 0)[i] = *u;
-                    planar.row(2, 0)[i] = 2 * i + 1 < width ? u[2] : i ? u[-2] : 128;
+                const auto in = [&](channel c, int x) { return *sample(src, from, c, x, y); };
+                for (int x = 0; x < width; x++) {
+                    *sample(planar, planes, channel::y, x, 0) = in(channel::y, x);
+                    if (x % 2) continue;
+                    *sample(planar, planes, channel::u, x, 0) = in(channel::u, x);
+                    *sample(planar, planes, channel::v, x, 0) = x + 1 < width ? in(channel::v, x)
+                                                                : x ? in(channel::v, x - 2)
+                                                                    : uint8_t(128);
                 }
-                rig::call(k.planar, planar, row);
+                rig::call(from_planes->run, planar, row);
                 memcpy(expected.row(0, y), row.row(0, 0), size_t(shapes[0].row_bytes));
             }
             rig::for_each_target([&](const rig::target_rows &) {
@@ -63,6 +53,7 @@ TEST(packed2rgb, packed_rows_equal_planar_rows) {
                 EXPECT_EQ(rig::difference(expected, got), "");
             });
         }
+    }
 }
 
 std::vector<uint8_t> convert(simgp_csc_fn *kernel, int to, std::vector<uint8_t> group) {

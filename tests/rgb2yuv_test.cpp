@@ -2,26 +2,16 @@
 #include <string.h>
 
 #include "simgp/simgp.h"
+#include "tests/conversions.h"
 #include "tests/rig.h"
 
 namespace {
 
-struct kernel {
-    const char *name;
-    simgp_csc_fn *run;
-    int from, to;
-};
+using rig::channel;
+using rig::conversion;
+using rig::rgb;
 
-#define KERNEL(name, from, to) \
-    { #name, simgp_csc_##name, SIMGP_FMT_##from, SIMGP_FMT_##to }
-const kernel kernels[] = {
-    KERNEL(rgb888_to_yuv420, RGB888, YUV420), KERNEL(rgb888_to_yv12, RGB888, YV12),
-    KERNEL(rgb888_to_nv12, RGB888, NV12),     KERNEL(rgb888_to_nv21, RGB888, NV21),
-    KERNEL(bgr888_to_yuv420, BGR888, YUV420), KERNEL(bgr888_to_yv12, BGR888, YV12),
-    KERNEL(rgb565_to_yuv420, RGB565, YUV420), KERNEL(rgb565_to_yv12, RGB565, YV12),
-    KERNEL(rgb565_to_nv12, RGB565, NV12),     KERNEL(rgb565_to_nv21, RGB565, NV21),
-    KERNEL(rgb888_to_rgb565, RGB888, RGB565), KERNEL(rgba8888_to_rgb565, RGBA8888, RGB565),
-};
+const std::vector<conversion> kernels = rig::conversions_of(rig::family::from_rgb);
 
 // The planes with what is read or written: chroma rounded down, strides of whole pixels.
 std::vector<rig::plane_shape> exact_shapes(int format, int width, int height) {
@@ -33,75 +23,51 @@ std::vector<rig::plane_shape> exact_shapes(int format, int width, int height) {
     return shapes;
 }
 
-struct colour {
-    int r, g, b;
-};
 struct yuv {
     int y, u, v;
 };
 int floor_256(int sum) { return (sum + 256 * 256) / 256 - 256; }
-yuv formula(const colour &c) {
+yuv formula(const rgb &c) {
     return {floor_256(66 * c.r + 129 * c.g + 25 * c.b) + 16,
             floor_256(-38 * c.r - 74 * c.g + 112 * c.b + 128) + 128,
             floor_256(112 * c.r - 94 * c.g - 18 * c.b + 128) + 128};
 }
 
-// Pixel x of a row.
-colour read(int format, const uint8_t *row, int x) {
-    const int word = row[2 * x] + 256 * row[2 * x + 1];
-    switch (format) {
-        case SIMGP_FMT_RGB565:
-            return {word / 2048 * 8, word / 32 % 64 * 4, word % 32 * 8};
-        case SIMGP_FMT_RGB888:
-            return {row[3 * x], row[3 * x + 1], row[3 * x + 2]};
-        case SIMGP_FMT_BGR888:
-            return {row[3 * x + 2], row[3 * x + 1], row[3 * x]};
-        default:
-            return {row[4 * x], row[4 * x + 1], row[4 * x + 2]};
-    }
-}
-
 // What every kernel must write: chroma comes from the top left pixel of each block.
-void reference(int from, int to, const rig::picture &src, const rig::picture &dst) {
+void reference(const conversion &k, const rig::picture &src, const rig::picture &dst) {
+    const rig::format &from = rig::format_of(k.from), &to = rig::format_of(k.to);
     const int width = src.widths[0], height = src.heights[0];
     for (int y = 0; y < height; y++)
         for (int x = 0; x < width; x++) {
-            const colour c = read(from, src.row(0, y), x);
-            if (to == SIMGP_FMT_RGB565) {
-                const int word = c.r / 8 * 2048 + c.g / 4 * 32 + c.b / 8;
-                dst.row(0, y)[2 * x] = uint8_t(word % 256);
-                dst.row(0, y)[2 * x + 1] = uint8_t(word / 256);
+            const rgb c = get_rgb(from, pixel(src, from, x, y));
+            if (to.is_rgb()) {
+                put_rgb(to, c, pixel(dst, to, x, y));
                 continue;
             }
             const yuv e = formula(c);
-            dst.row(0, y)[x] = uint8_t(e.y);
+            *sample(dst, to, channel::y, x, y) = uint8_t(e.y);
             if (y % 2 || x % 2 || y + 1 == height || x + 1 == width) continue;
-            const bool planar = to == SIMGP_FMT_YUV420 || to == SIMGP_FMT_YV12;
-            const bool v_first = to == SIMGP_FMT_YV12 || to == SIMGP_FMT_NV21;
-            uint8_t *const first = planar ? dst.row(1, y / 2) + x / 2 : dst.row(1, y / 2) + x;
-            uint8_t *const second = planar ? dst.row(2, y / 2) + x / 2 : first + 1;
-            *(v_first ? second : first) = uint8_t(e.u);
-            *(v_first ? first : second) = uint8_t(e.v);
+            *sample(dst, to, channel::u, x, y) = uint8_t(e.u);
+            *sample(dst, to, channel::v, x, y) = uint8_t(e.v);
         }
 }
 
 TEST(rgb2yuv, every_size) {
-    for (const kernel &k : kernels)
+    for (const conversion &k : kernels)
         rig::check_jobs(k.name, {}, [&](int width, int height) {
-            return rig::job{exact_shapes(k.from, width, height), exact_shapes(k.to, width, height),
-                            [&](const rig::picture &src, const rig::picture &dst) {
-                                rig::call(k.run, src, dst);
-                            },
-                            [&](const rig::picture &src, const rig::picture &dst) {
-                                reference(k.from, k.to, src, dst);
-                            }};
+            return rig::job{
+                exact_shapes(k.from, width, height), exact_shapes(k.to, width, height),
+                [&](const rig::picture &src, const rig::picture &dst) {
+                    rig::call(k.run, src, dst);
+                },
+                [&](const rig::picture &src, const rig::picture &dst) { reference(k, src, dst); }};
         });
 }
 
-void check(const kernel &k, const rig::picture &src) {
+void check(const conversion &k, const rig::picture &src) {
     const auto shapes = rig::shapes_of(k.to, src.widths[0], src.heights[0]);
     rig::picture expected(shapes), got(shapes);
-    reference(k.from, k.to, src, expected);
+    reference(k, src, expected);
     rig::for_each_target([&](const rig::target_rows &) {
         for (const rig::plane &p : got.parts)  // not the result of the target before
             for (ptrdiff_t y = 0; y < p.shape().rows; y++)
@@ -114,23 +80,16 @@ void check(const kernel &k, const rig::picture &src) {
 // Of a given red, each colour stands once where it gives chroma, and in an odd column and row.
 TEST(rgb2yuv, every_24_bit_colour) {
     constexpr int size = 512;
-    for (const kernel &k : kernels) {
-        if (k.from == SIMGP_FMT_RGB565 || (k.to != SIMGP_FMT_YUV420 && k.to != SIMGP_FMT_RGB565))
-            continue;
+    for (const conversion &k : kernels) {
+        const rig::format &from = rig::format_of(k.from);
+        if (from.red.count != 8) continue;
+        if (k.to != SIMGP_FMT_YUV420 && !rig::format_of(k.to).is_rgb()) continue;
         rig::picture src(rig::shapes_of(k.from, size, size));
-        const int bytes = src.parts[0].shape().sample_bytes;
         for (int r = 0; r < 256 && !HasFailure(); r += rig::quick() ? 51 : 1) {
             for (int y = 0; y < size; y++)
-                for (int x = 0; x < size; x++) {
-                    const uint8_t red = uint8_t(r), green = uint8_t(y / 2),
-                                  blue = uint8_t(x % 2 ? 255 - x / 2 : x / 2);
-                    const bool reversed = k.from == SIMGP_FMT_BGR888;
-                    uint8_t *const p = src.row(0, y) + bytes * x;
-                    p[0] = reversed ? blue : red;
-                    p[1] = green;
-                    p[2] = reversed ? red : blue;
-                    if (bytes == 4) p[3] = uint8_t(7 * x + y);
-                }
+                for (int x = 0; x < size; x++)
+                    put_rgb(from, {r, y / 2, x % 2 ? 255 - x / 2 : x / 2}, pixel(src, from, x, y),
+                            uint8_t(7 * x + y));
             check(k, src);
         }
     }
@@ -143,13 +102,12 @@ TEST(rgb2yuv, every_16_bit_colour) {
             src.row(0, y)[2 * x] = uint8_t(x / 2);
             src.row(0, y)[2 * x + 1] = uint8_t(y / 2);
         }
-    check({"rgb565_to_yuv420", simgp_csc_rgb565_to_yuv420, SIMGP_FMT_RGB565, SIMGP_FMT_YUV420},
-          src);
+    check(rig::conversion_named("rgb565_to_yuv420"), src);
 }
 
 TEST(rgb2yuv, known_colours) {
     const struct {
-        colour c;
+        rgb c;
         yuv e;
     } known[] = {{{255, 255, 255}, {235, 128, 128}}, {{0, 0, 0}, {16, 128, 128}},
                  {{255, 0, 0}, {81, 90, 240}},       {{0, 255, 0}, {144, 54, 34}},

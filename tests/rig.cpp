@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "simd/areas.h"
+#include "areas.h"
 #include "simgp/simgp.h"
 
 #if defined(__SANITIZE_ADDRESS__)
@@ -23,7 +23,7 @@
 // a second table of the scalar rows stands in for them, so that there are two results to compare.
 #ifdef SIMGP_HAVE_lanes
 namespace simgp::lanes {
-#define DECLARE(family, area) void fill_##area(rows &);
+#define DECLARE(area) void fill_##area(area##_rows &);
 SIMGP_AREAS(DECLARE)
 #undef DECLARE
 }  // namespace simgp::lanes
@@ -107,6 +107,69 @@ void fill_bytes(uint8_t *p, size_t size, content what, rng &random) {
     }
 }
 
+// Formats
+// ------------------------------------------------------------------------------------------
+
+namespace {
+
+// Y of full size, in a plane of its own.
+constexpr channel_place luma{0, 0, 1, 1, 1};
+
+format yuv(int code, channel_place y, channel_place u, channel_place v) {
+    return {code, {y, u, v}};
+}
+// Y, and pairs in the next plane; which byte is U, which is V.
+format pairs(int code, int u, int v) { return yuv(code, luma, {1, u, 2, 2, 2}, {1, v, 2, 2, 2}); }
+// Groups of four bytes for two pixels: where the first Y, U and V stand.
+format groups(int code, int y, int u, int v) {
+    return yuv(code, {0, y, 2, 1, 1}, {0, u, 4, 2, 1}, {0, v, 4, 2, 1});
+}
+format tiled(format f) {
+    f.tiled = true;
+    return f;
+}
+format rgb_words(int code, int bytes, field r, field g, field b, field a = {}) {
+    return {code, {}, bytes, r, g, b, a};
+}
+
+}  // namespace
+
+const std::vector<format> &formats() {
+    // clang-format off
+    static const std::vector<format> all = {
+        yuv(SIMGP_FMT_YUV400,  luma, {}, {}),
+        yuv(SIMGP_FMT_YUV420,  luma, {1, 0, 1, 2, 2}, {2, 0, 1, 2, 2}),
+        yuv(SIMGP_FMT_YUV422N, luma, {1, 0, 1, 2, 1}, {2, 0, 1, 2, 1}),
+        yuv(SIMGP_FMT_YUV444,  luma, {1, 0, 1, 1, 1}, {2, 0, 1, 1, 1}),
+        yuv(SIMGP_FMT_YV12,    luma, {2, 0, 1, 2, 2}, {1, 0, 1, 2, 2}),
+        yuv(SIMGP_FMT_YV16,    luma, {2, 0, 1, 2, 1}, {1, 0, 1, 2, 1}),
+        pairs(SIMGP_FMT_NV12, 0, 1),
+        pairs(SIMGP_FMT_NV21, 1, 0),
+        yuv(SIMGP_FMT_YUV422W, luma, {1, 0, 1, 1, 2}, {2, 0, 1, 1, 2}),
+        tiled(pairs(SIMGP_FMT_T64X32, 0, 1)),
+        groups(SIMGP_FMT_UYVY, 1, 0, 2),
+        groups(SIMGP_FMT_YUYV, 0, 1, 3),
+        rgb_words(SIMGP_FMT_RGB565,   2, {5, 11}, {6, 5}, {5, 0}),
+        rgb_words(SIMGP_FMT_BGR565,   2, {5, 0}, {6, 5}, {5, 11}),
+        rgb_words(SIMGP_FMT_RGB888,   3, {8, 0}, {8, 8}, {8, 16}),
+        rgb_words(SIMGP_FMT_BGR888,   3, {8, 16}, {8, 8}, {8, 0}),
+        rgb_words(SIMGP_FMT_RGBA8888, 4, {8, 0}, {8, 8}, {8, 16}, {8, 24}),
+        rgb_words(SIMGP_FMT_BGRA8888, 4, {8, 16}, {8, 8}, {8, 0}, {8, 24}),
+        rgb_words(SIMGP_FMT_ARGB8888, 4, {8, 8}, {8, 16}, {8, 24}, {8, 0}),
+    };
+    // clang-format on
+    return all;
+}
+
+const format &format_of(int code) {
+    for (const format &f : formats())
+        if (f.code == code) return f;
+    fprintf(stderr, "the rig knows no format %d\n", code);
+    abort();
+}
+
+bool operator==(const rgb &a, const rgb &b) { return a.r == b.r && a.g == b.g && a.b == b.b; }
+
 // Planes and pictures
 // ------------------------------------------------------------------------------
 
@@ -122,44 +185,20 @@ static plane_shape tiles(int32_t width, int32_t rows) {
     return {width, rows, 1, bytes, 1};
 }
 
-std::vector<plane_shape> shapes_of(int format, int32_t w, int32_t h) {
-    const int32_t half_w = (w + 1) / 2, half_h = (h + 1) / 2;
-    const plane_shape luma = samples(w, h), quarter = samples(half_w, half_h),
-                      narrow = samples(half_w, h), wide = samples(w, half_h);
-    switch (format) {
-        case SIMGP_FMT_YUV400:
-            return {luma};
-        case SIMGP_FMT_YUV420:
-        case SIMGP_FMT_YV12:
-            return {luma, quarter, quarter};
-        case SIMGP_FMT_YUV422N:
-        case SIMGP_FMT_YV16:
-            return {luma, narrow, narrow};
-        case SIMGP_FMT_YUV422W:
-            return {luma, wide, wide};
-        case SIMGP_FMT_YUV444:
-            return {luma, luma, luma};
-        case SIMGP_FMT_NV12:
-        case SIMGP_FMT_NV21:
-            return {luma, samples(half_w, half_h, 2)};
-        case SIMGP_FMT_T64X32:
-            return {tiles(w, h), tiles(w, h / 2)};
-        case SIMGP_FMT_UYVY:
-        case SIMGP_FMT_YUYV:
-        case SIMGP_FMT_RGB565:
-        case SIMGP_FMT_BGR565:
-            return {samples(w, h, 2)};
-        case SIMGP_FMT_RGB888:
-        case SIMGP_FMT_BGR888:
-            return {samples(w, h, 3)};
-        case SIMGP_FMT_RGBA8888:
-        case SIMGP_FMT_BGRA8888:
-        case SIMGP_FMT_ARGB8888:
-            return {samples(w, h, 4)};
-        default:
-            fprintf(stderr, "shapes_of: no format %d\n", format);
-            abort();
-    }
+std::vector<plane_shape> shapes_of(int code, int32_t w, int32_t h) {
+    const format &f = format_of(code);
+    if (f.is_rgb()) return {samples(w, h, f.pixel_bytes)};
+    if (f.tiled) return {tiles(w, h), tiles(w, h / 2)};
+    std::vector<plane_shape> shapes;
+    const auto in_plane = [&](int k) {
+        return std::find_if(std::begin(f.yuv), std::end(f.yuv),
+                            [k](const channel_place &c) { return c.step && c.plane == k; });
+    };
+    // A plane has the size of any of its channels; of packed groups, Y comes first.
+    for (auto c = in_plane(0); c != std::end(f.yuv); c = in_plane(int(shapes.size())))
+        shapes.push_back(
+            samples((w + c->across - 1) / c->across, (h + c->down - 1) / c->down, c->step));
+    return shapes;
 }
 
 placement any_placement(flush where, rng &random) {
@@ -199,6 +238,11 @@ void plane::fill_pattern(unsigned salt) {
     salt_ = salt;
     const auto [begin, end] = memory_.room(reach);
     for (uint8_t *p = begin; p < end; p++) *p = pattern(p - memory_.data(), salt);
+}
+
+void plane::copy_visible(const plane &from) {
+    for (ptrdiff_t y = 0; y < shape_.rows; y++)
+        memcpy(row(y), from.row(y), size_t(shape_.row_bytes));
 }
 
 std::string plane::stray_write() const {
@@ -311,10 +355,10 @@ std::string difference(const picture &expected, const picture &got) {
 
 const std::vector<target_rows> &all_targets() {
     using simgp::target;
-    static const simgp::rows lanes = [] {
-        simgp::rows table = simgp::rows_of(target::scalar);
+    static const simgp::row_table lanes = [] {
+        simgp::row_table table = simgp::rows_of(target::scalar);
 #ifdef SIMGP_HAVE_lanes
-#define FILL(family, area) simgp::lanes::fill_##area(table);
+#define FILL(area) simgp::lanes::fill_##area(table.area);
         SIMGP_AREAS(FILL)
 #undef FILL
 #endif
@@ -343,8 +387,12 @@ std::string describe(const picture &p) {
     return text;
 }
 
-bool check_job(const std::string &name, int width, int height, flush where, const job &j,
-               rng &random) {
+std::string text_of(const size &s) {
+    return std::to_string(s.width) + " x " + std::to_string(s.height);
+}
+
+// `what_runs`: the operation and its sizes.
+bool check_job(const std::string &what_runs, flush where, const job &j, rng &random) {
     const auto places = [&](size_t count) {
         std::vector<placement> p(count);
         for (placement &place : p) place = any_placement(where, random);
@@ -354,33 +402,41 @@ bool check_job(const std::string &name, int width, int height, flush where, cons
     picture src(j.src, places(j.src.size())), expected(j.dst, dst_places), got(j.dst, dst_places);
     const content what = content(random.below(int(content::count) + 2) % int(content::count));
     src.fill(what, random);
+    picture input(j.in_place ? j.dst : std::vector<plane_shape>());
+    input.fill(what, random);
     std::vector<std::vector<uint8_t>> before;
     for (const plane &p : src.parts)
         for (ptrdiff_t y = 0; y < p.shape().rows; y++)
             before.emplace_back(p.row(y), p.row(y) + p.shape().row_bytes);
 
+    // What no job may change holds another pattern around each result: a job that reads it fails.
+    const auto prepare = [&](picture &dst, unsigned salt) {
+        dst.fill_pattern(salt);
+        for (size_t k = 0; k < input.parts.size(); k++) dst.parts[k].copy_visible(input.parts[k]);
+    };
     const unsigned salt = unsigned(random.next());
     const bool by_reference = bool(j.reference);
     if (by_reference) {
-        expected.fill_pattern(salt);
+        prepare(expected, salt);
         j.reference(src, expected);
     }
     for (const target_rows &t : all_targets()) {
         const bool defines = &t == &all_targets()[0] && !by_reference;
         picture &dst = defines ? expected : got;
         snprintf(running, sizeof running,
-                 "%s, %d x %d, %s rows, planes flush at their %s, content %d, strides %s -> %s, "
+                 "%s, %s rows, planes flush at their %s, content %d, strides %s -> %s, "
                  "SIMGP_TEST_SEED=%llu",
-                 name.c_str(), width, height, t.name, where == flush::at_end ? "end" : "start",
-                 int(what), describe(src).c_str(), describe(dst).c_str(),
-                 (unsigned long long)seed());
-        dst.fill_pattern(defines || j.holes ? salt : ~salt);
+                 what_runs.c_str(), t.name, where == flush::at_end ? "end" : "start", int(what),
+                 describe(src).c_str(), describe(dst).c_str(), (unsigned long long)seed());
+        prepare(dst, defines || j.holes ? salt : ~salt);
         for (plane &p : src.parts) p.forbid_padding();
+        for (size_t k = 0; k < input.parts.size(); k++) dst.parts[k].forbid_padding();
         {
             forced rows(t);
             j.run(src, dst);
         }
         for (plane &p : src.parts) p.allow_padding();
+        for (plane &p : dst.parts) p.allow_padding();
 
         std::string fault = dst.stray_write();
         size_t i = 0;
@@ -400,16 +456,12 @@ bool check_job(const std::string &name, int width, int height, flush where, cons
 
 }  // namespace
 
-bool check_jobs(const std::string &name, const sweep &sizes,
-                const std::function<job(int width, int height)> &make) {
-    watch_faults();
-    rng random(seed());
+namespace {
+
+// Calls check(width, height) for the sizes of a sweep until it returns false.
+template <typename F>
+bool for_sizes(const sweep &sizes, const F &check) {
     int heights = 0;
-    const auto check = [&](int width, int height) {
-        const job j = make(width, height);
-        return check_job(name, width, height, flush::at_end, j, random) &&
-               check_job(name, width, height, flush::at_start, j, random);
-    };
     for (int round = 0; round < (quick() ? 1 : sizes.rounds); round++)
         for (int width = sizes.step_x; width <= sizes.max_width; width += sizes.step_x) {
             const int height = (1 + heights++ % (sizes.max_height / sizes.step_y)) * sizes.step_y;
@@ -422,25 +474,77 @@ bool check_jobs(const std::string &name, const sweep &sizes,
     return true;
 }
 
+bool check_both_ways(const std::string &what_runs, const job &j, rng &random) {
+    return check_job(what_runs, flush::at_end, j, random) &&
+           check_job(what_runs, flush::at_start, j, random);
+}
+
+}  // namespace
+
+bool check_jobs(const std::string &name, const sweep &sizes,
+                const std::function<job(int width, int height)> &make) {
+    watch_faults();
+    rng random(seed());
+    return for_sizes(sizes, [&](int width, int height) {
+        return check_both_ways(name + ", " + text_of({width, height}), make(width, height), random);
+    });
+}
+
+bool check_resize_jobs(const std::string &name, const sweep &to,
+                       const std::function<job(const size &from, const size &to)> &make) {
+    watch_faults();
+    rng random(seed());
+    int calls = 0;
+    // A length to start from; `most` bounds those that are drawn at random.
+    const auto source_of = [&](int length, int kind, int step, int most) {
+        const int lengths[] = {length,
+                               length / 2,
+                               2 * length,
+                               length + step,
+                               length - step,
+                               3 * length / 2,
+                               step,
+                               1 + random.below(most),
+                               1 + random.below(2 * most)};
+        static_assert(std::size(lengths) == 9);
+        return std::max(1, (lengths[kind] + step - 1) / step) * step;
+    };
+    return for_sizes(to, [&](int width, int height) {
+        // Two sources for each destination; within 81 of them each kind across meets each kind down.
+        for (int i = 0; i < 2; i++, calls++) {
+            const size dst = {width, height};
+            const size src = {
+                source_of(width, calls % 9, to.step_x, to.max_width),
+                source_of(height, (calls + calls / 9 * 5) % 9, to.step_y, to.max_height)};
+            if (!check_both_ways(name + ", " + text_of(src) + " to " + text_of(dst), make(src, dst),
+                                 random))
+                return false;
+        }
+        return true;
+    });
+}
+
 bool check_csc(const std::string &name, simgp_csc_fn *kernel, int from, int to, const sweep &sizes,
                const std::function<void(const picture &src, const picture &dst)> &reference) {
     return check_jobs(name, sizes, [&](int width, int height) {
         return job{shapes_of(from, width, height), shapes_of(to, width, height),
                    [=](const picture &src, const picture &dst) { call(kernel, src, dst); },
-                   reference, to == SIMGP_FMT_T64X32};
+                   reference, format_of(to).tiled};
     });
 }
 
 bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sample_bytes,
-                    int dst_sample_bytes, const sweep &sizes) {
+                    const std::function<plane_shape(int width, int height)> &dst_shape,
+                    const sweep &sizes,
+                    const std::function<void(const picture &src, const picture &dst)> &reference) {
     return check_jobs(name, sizes, [&](int width, int height) {
         return job{{samples(width, height, src_sample_bytes)},
-                   {samples(width, height, dst_sample_bytes)},
+                   {dst_shape(width, height)},
                    [=](const picture &src, const picture &dst) {
                        kernel(src.planes[0], width, height, src.strides[0], dst.strides[0],
                               dst.planes[0]);
                    },
-                   nullptr};
+                   reference};
     });
 }
 

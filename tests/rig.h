@@ -17,7 +17,7 @@
 #include <string>
 #include <vector>
 
-#include "simd/choose.h"
+#include "rows/choose.h"
 #include "simgp/img.h"
 #include "tests/guard.h"
 
@@ -46,6 +46,64 @@ class rng {
 // change their sign; all 0; all 255.
 enum class content { random, extremes, alternating, corners, zeros, ones, count };
 void fill_bytes(uint8_t *p, size_t size, content what, rng &random);
+
+// Formats
+// ------------------------------------------------------------------------------------------
+
+// What the tests expect of a format, written down once more: the library has a table of its own.
+
+// Where the samples of Y, U or V lie: the plane, the first sample's byte in a line, the bytes from
+// one to the next, and how many pixels across and down share a sample.
+struct channel_place {
+    int plane = 0, first = 0, step = 0;  // step 0: there is no such channel
+    int across = 1, down = 1;
+};
+enum class channel { y, u, v };
+
+// Bits of a pixel.
+struct field {
+    int count = 0, first = 0;
+};
+
+struct format {
+    int code;
+    channel_place yuv[3] = {};  // by channel
+    // RGB: a pixel is a number of `pixel_bytes` bytes, the lowest first, with these bits.
+    int pixel_bytes = 0;
+    field red = {}, green = {}, blue = {}, alpha = {};
+    bool tiled = false;  // its samples are in tiles of 64 x 32 bytes
+
+    const channel_place &at(channel c) const { return yuv[int(c)]; }
+    bool is_rgb() const { return pixel_bytes > 0; }
+    bool has_chroma() const { return yuv[1].step > 0; }
+    bool is_packed() const { return has_chroma() && yuv[0].plane == yuv[1].plane; }
+};
+const std::vector<format> &formats();
+// Ends the program for a code that is none.
+const format &format_of(int code);
+
+struct rgb {
+    int r, g, b;
+};
+bool operator==(const rgb &a, const rgb &b);
+
+// A pixel at p, with the highest bits of each channel; and back, with low bits 0.
+inline void put_rgb(const format &f, const rgb &c, uint8_t *p, int alpha = 255) {
+    const auto bits = [](int value, const field &to) {
+        return unsigned(value) >> (8 - to.count) << to.first;
+    };
+    const unsigned word =
+        bits(c.r, f.red) | bits(c.g, f.green) | bits(c.b, f.blue) | bits(alpha, f.alpha);
+    for (int i = 0; i < f.pixel_bytes; i++) p[i] = uint8_t(word >> 8 * i);
+}
+inline rgb get_rgb(const format &f, const uint8_t *p) {
+    unsigned word = 0;
+    for (int i = 0; i < f.pixel_bytes; i++) word |= unsigned(p[i]) << 8 * i;
+    const auto value = [word](const field &from) {
+        return int(word >> from.first & ((1u << from.count) - 1)) << (8 - from.count);
+    };
+    return {value(f.red), value(f.green), value(f.blue)};
+}
 
 // Planes and pictures
 // ------------------------------------------------------------------------------
@@ -87,6 +145,8 @@ class plane {
     void fill(content what, rng &random);
     // As a destination: a pattern everywhere, in the surroundings too.
     void fill_pattern(unsigned salt);
+    // The visible bytes of a plane of the same shape.
+    void copy_visible(const plane &from);
     // The first byte outside the visible ones that no longer holds the pattern, in words; or "".
     std::string stray_write() const;
 
@@ -122,6 +182,15 @@ class picture {
     simgp_img img(int format) const;
 };
 
+// The sample of a channel for pixel (x, y), and the bytes of an RGB pixel. Not of tiled pictures.
+inline uint8_t *sample(const picture &p, const format &f, channel c, int x, int y) {
+    const channel_place &at = f.at(c);
+    return p.row(at.plane, y / at.down) + at.first + x / at.across * at.step;
+}
+inline uint8_t *pixel(const picture &p, const format &f, int x, int y) {
+    return p.row(0, y) + x * f.pixel_bytes;
+}
+
 inline void call(simgp_csc_fn *kernel, const picture &src, const picture &dst) {
     kernel(src.planes, src.widths, src.heights, src.strides, dst.strides, dst.planes);
 }
@@ -134,7 +203,7 @@ std::string difference(const picture &expected, const picture &got);
 
 struct target_rows {
     const char *name;
-    const simgp::rows *rows;
+    const simgp::row_table *rows;
 };
 // Scalar first; then `lanes`, the vector rows compiled over plain lanes; then every target that the
 // processor offers.
@@ -168,6 +237,9 @@ struct job {
     // Writes what is right, independently of the library; null: the scalar rows are right.
     std::function<void(const picture &src, const picture &dst)> reference;
     bool holes = false;  // dst has bytes that nothing writes, such as the unused slots of tiles
+    // Works in place: dst is filled like a source, with the same bytes for every target and for the
+    // reference. src may be empty, or hold what is read besides.
+    bool in_place = false;
 };
 
 // The sizes to try: every width from 1 to two of the widest vectors and 1 more, in steps, with
@@ -187,13 +259,25 @@ struct sweep {
 bool check_jobs(const std::string &name, const sweep &sizes,
                 const std::function<job(int width, int height)> &make);
 
-// check_jobs for a conversion kernel between two formats, and for a kernel of one plane (whose
-// destination has the size of the source).
+// check_jobs for operations between any two sizes: `to` has the sizes of the destination, each of
+// which meets sources that are as large, half and double, a pixel more or less, one pixel, and of
+// any other size, across and down independently. They are multiples of the sweep's steps, too.
+struct size {
+    int width, height;
+};
+bool check_resize_jobs(const std::string &name, const sweep &to,
+                       const std::function<job(const size &from, const size &to)> &make);
+
+// check_jobs for a conversion kernel between two formats.
 bool check_csc(
     const std::string &name, simgp_csc_fn *kernel, int from, int to, const sweep &sizes = {},
     const std::function<void(const picture &src, const picture &dst)> &reference = nullptr);
-bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sample_bytes,
-                    int dst_sample_bytes, const sweep &sizes = {});
+
+// check_jobs for a kernel of one plane, with what it makes of a plane of width x height samples.
+bool check_plane_fn(
+    const std::string &name, simgp_plane_fn *kernel, int src_sample_bytes,
+    const std::function<plane_shape(int width, int height)> &dst_shape, const sweep &sizes = {},
+    const std::function<void(const picture &src, const picture &dst)> &reference = nullptr);
 
 }  // namespace rig
 

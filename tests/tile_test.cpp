@@ -187,7 +187,7 @@ TEST(tile, pictures_from_yuv420) {
 
 // Each row is a picture of one row in YUV420, whose kernels have tests of their own.
 void check_rgb(const char *name, simgp_csc_fn *kernel, int to, simgp_csc_fn *from_yuv420) {
-    const int size = to == SIMGP_FMT_RGB565 ? 2 : 4;
+    const int size = rig::format_of(to).pixel_bytes;
     rig::check_jobs(name, sizes, [&](int w, int h) {
         rig::job j{rig::shapes_of(SIMGP_FMT_T64X32, w, h), rig::shapes_of(to, w, h), {}, {}};
         j.dst[0].stride_unit = size;

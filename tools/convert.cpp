@@ -1,9 +1,6 @@
 // simgp-convert: takes frames from files, pipes or a test card through the library's conversions.
-#include <CLI/CLI.hpp>
-#include <cstdio>
-#include <exception>
-
 #include "tools/job.h"
+#include "tools/main.h"
 #include "tools/output.h"
 
 namespace {
@@ -32,7 +29,7 @@ int main(int argc, char **argv) {
     CLI::App app("Converts pictures and video frames between the formats of the simgp library.",
                  "simgp-convert");
     app.footer(examples);
-    tools::Job job;
+    tools::job job;
     bool list = false;
     std::string demo;
     app.add_option("input", job.source.path, "file, \"-\", or testcard:[WxH][@FRAMES]");
@@ -55,33 +52,18 @@ int main(int argc, char **argv) {
     app.add_option("--demo", demo,
                    "write pictures that show what the library does into this folder");
 
-    try {
-        app.parse(argc, argv);
-        if (!list && demo.empty()) {
-            if (job.source.path.empty()) throw CLI::RequiredError("input");
-            if (job.output.empty()) throw CLI::RequiredError("--output");
-        }
-    } catch (const CLI::Success &wish) {
-        return app.exit(wish);
-    } catch (const CLI::ParseError &error) {
-        std::fprintf(stderr, "simgp-convert: %s (see --help)\n", error.what());
-        return 2;
-    }
-
-    try {
-        if (list) {
-            std::fputs(tools::list_conversions().c_str(), stdout);
-        } else if (!demo.empty()) {
+    const auto check = [&] {
+        if (list || !demo.empty()) return;
+        if (job.source.path.empty()) throw CLI::RequiredError("input");
+        if (job.output.empty()) throw CLI::RequiredError("--output");
+    };
+    return tools::run_program(app, argc, argv, check, [&] {
+        if (list)
+            fputs(tools::list_conversions().c_str(), stdout);
+        else if (!demo.empty())
             tools::demo(demo, job.source);
-        } else {
+        else
             tools::run(job);
-        }
-    } catch (const std::bad_alloc &) {
-        std::fprintf(stderr, "simgp-convert: not enough memory\n");
-        return 1;
-    } catch (const std::exception &error) {
-        std::fprintf(stderr, "simgp-convert: %s\n", error.what());
-        return 1;
-    }
-    return 0;
+        return 0;
+    });
 }

@@ -1,5 +1,6 @@
 // The one way in which the tools report that something cannot be done.
-#pragma once
+#ifndef TOOLS_FAULT_H
+#define TOOLS_FAULT_H
 
 #include <sstream>
 #include <stdexcept>
@@ -7,10 +8,10 @@
 
 namespace tools {
 
-/// Ends the work. The text is one line that says what is wrong and where: file, frame, byte.
-struct Fault : std::runtime_error {
+// Ends the work. The text is one line that says what is wrong and where: file, frame, byte.
+struct fault : std::runtime_error {
     template <class... Part>
-    explicit Fault(const Part &...part) : std::runtime_error(join(part...)) {}
+    explicit fault(const Part &...part) : std::runtime_error(join(part...)) {}
 
   private:
     template <class... Part>
@@ -22,3 +23,5 @@ struct Fault : std::runtime_error {
 };
 
 }  // namespace tools
+
+#endif

@@ -10,9 +10,9 @@ namespace tools {
 namespace {
 
 // The syntax elements of a NAL unit, without its first byte and its emulation prevention bytes.
-class Syntax {
+class syntax {
   public:
-    Syntax(const uint8_t *nal, size_t size) {
+    syntax(const uint8_t *nal, size_t size) {
         int zeros = 0;
         for (size_t i = 1; i < size; i++) {
             if (zeros >= 2 && nal[i] <= 3) {
@@ -25,7 +25,7 @@ class Syntax {
         }
         scmn_bsr_init(&bits_, bytes_.data(), int32_t(bytes_.size()), nullptr);
     }
-    Syntax(const Syntax &) = delete;
+    syntax(const syntax &) = delete;
 
     // u(n), ue(v), se(v)
     uint32_t u(int n) {
@@ -57,7 +57,7 @@ class Syntax {
     bool bad_ = false;
 };
 
-void pass_scaling_list(Syntax &s, int size) {
+void pass_scaling_list(syntax &s, int size) {
     int32_t last = 8, next = 8;
     for (int i = 0; i < size && !s.bad(); i++) {
         if (next != 0) next = (last + s.se()) & 255;
@@ -70,9 +70,9 @@ constexpr uint8_t profiles_with_chroma[] = {100, 110, 122, 244, 44,  83, 86,
 
 }  // namespace
 
-void H264::read_sequence(const uint8_t *nal, size_t size) {
-    Syntax s(nal, size);
-    SequenceParameters p;
+void h264::read_sequence(const uint8_t *nal, size_t size) {
+    syntax s(nal, size);
+    sequence_parameters p;
     const uint32_t profile = s.u(8);
     s.u(16);  // constraints, level
     const uint32_t id = s.ue();
@@ -107,9 +107,9 @@ void H264::read_sequence(const uint8_t *nal, size_t size) {
     if (!s.bad()) sequences_[id] = p;
 }
 
-void H264::read_picture(const uint8_t *nal, size_t size) {
-    Syntax s(nal, size);
-    PictureParameters p;
+void h264::read_picture(const uint8_t *nal, size_t size) {
+    syntax s(nal, size);
+    picture_parameters p;
     const uint32_t id = s.ue();
     p.sequence = s.ue();
     s.flag();  // entropy coding
@@ -118,9 +118,9 @@ void H264::read_picture(const uint8_t *nal, size_t size) {
     if (!s.bad()) pictures_[id] = p;
 }
 
-std::optional<H264::Slice> H264::read_slice(const uint8_t *nal, size_t size) const {
-    Syntax s(nal, std::min<size_t>(size, 64));
-    Slice slice;
+std::optional<h264::slice_header> h264::read_slice(const uint8_t *nal, size_t size) const {
+    syntax s(nal, std::min<size_t>(size, 64));
+    slice_header slice;
     slice.idr = (nal[0] & 31) == 5;
     slice.reference = nal[0] & 0x60;
     slice.first_block = s.ue();
@@ -132,7 +132,7 @@ std::optional<H264::Slice> H264::read_slice(const uint8_t *nal, size_t size) con
     // Without the parameter sets, the rest cannot be read.
     const auto &picture = pictures_[slice.parameters];
     if (!picture || !sequences_[picture->sequence]) return slice;
-    const SequenceParameters &sequence = *sequences_[picture->sequence];
+    const sequence_parameters &sequence = *sequences_[picture->sequence];
     if (sequence.separate_planes) s.u(2);
     slice.frame_num = s.u(int(sequence.frame_num_bits));
     if (!sequence.frames_only) {
@@ -152,18 +152,18 @@ std::optional<H264::Slice> H264::read_slice(const uint8_t *nal, size_t size) con
     return slice;
 }
 
-H264::Role H264::role(const uint8_t *nal, size_t size) {
+h264::role h264::role_of(const uint8_t *nal, size_t size) {
     const int type = nal[0] & 31;
     if (type == 7) read_sequence(nal, size);
     if (type == 8) read_picture(nal, size);
-    if ((type >= 6 && type <= 9) || (type >= 14 && type <= 18)) return Role::header;
-    if (type != 1 && type != 2 && type != 5) return Role::more;
+    if ((type >= 6 && type <= 9) || (type >= 14 && type <= 18)) return role::header;
+    if (type != 1 && type != 2 && type != 5) return role::more;
 
-    const std::optional<Slice> slice = read_slice(nal, size), last = last_;
-    if (!slice) return last ? Role::more : Role::slice;
+    const std::optional<slice_header> slice = read_slice(nal, size), last = last_;
+    if (!slice) return last ? role::more : role::slice;
     last_ = slice;
-    if (!last) return Role::slice;
-    const Slice &a = *last, &b = *slice;
+    if (!last) return role::slice;
+    const slice_header &a = *last, &b = *slice;
     bool other = a.idr != b.idr || a.parameters != b.parameters || (a.reference != b.reference);
     if (a.complete && b.complete)
         other |= a.frame_num != b.frame_num || a.field != b.field || a.bottom != b.bottom ||
@@ -171,7 +171,7 @@ H264::Role H264::role(const uint8_t *nal, size_t size) {
                  !std::equal(a.poc_delta, a.poc_delta + 3, b.poc_delta);
     else
         other |= b.first_block == 0;
-    return other ? Role::slice : Role::more;
+    return other ? role::slice : role::more;
 }
 
 }  // namespace tools

@@ -1,34 +1,36 @@
 // Where H.264 pictures begin (Rec. ITU-T H.264, 7.3 and 7.4.1.2.4).
-#pragma once
+#ifndef TOOLS_H264_H
+#define TOOLS_H264_H
 
-#include <cstddef>
-#include <cstdint>
+#include <stddef.h>
+#include <stdint.h>
+
 #include <optional>
 
 namespace tools {
 
-class H264 {
+class h264 {
   public:
-    /// What a NAL unit is to the pictures of a stream.
-    enum class Role {
+    // What a NAL unit is to the pictures of a stream.
+    enum class role {
         header,  // belongs to the picture that follows
         slice,   // of a new picture
         more     // belongs to the picture before
     };
-    /// `nal` begins with the byte behind the start code; what follows the unit may follow.
-    Role role(const uint8_t *nal, size_t size);
+    // `nal` begins with the byte behind the start code; what follows the unit may follow.
+    role role_of(const uint8_t *nal, size_t size);
 
   private:
-    struct SequenceParameters {
+    struct sequence_parameters {
         uint32_t frame_num_bits, poc_type, poc_lsb_bits = 0;
         bool separate_planes = false, frames_only, delta_poc_is_zero = false;
     };
-    struct PictureParameters {
+    struct picture_parameters {
         uint32_t sequence;
         bool poc_delta_per_frame;
     };
     // What differs between the slices of two pictures.
-    struct Slice {
+    struct slice_header {
         uint32_t first_block, parameters, frame_num = 0, idr_id = 0, poc_lsb = 0;
         int32_t poc_delta[3] = {};
         bool idr, reference, field = false, bottom = false, complete = false;
@@ -36,11 +38,13 @@ class H264 {
 
     void read_sequence(const uint8_t *nal, size_t size);
     void read_picture(const uint8_t *nal, size_t size);
-    std::optional<Slice> read_slice(const uint8_t *nal, size_t size) const;
+    std::optional<slice_header> read_slice(const uint8_t *nal, size_t size) const;
 
-    std::optional<SequenceParameters> sequences_[32];
-    std::optional<PictureParameters> pictures_[256];
-    std::optional<Slice> last_;
+    std::optional<sequence_parameters> sequences_[32];
+    std::optional<picture_parameters> pictures_[256];
+    std::optional<slice_header> last_;
 };
 
 }  // namespace tools
+
+#endif

@@ -1,15 +1,17 @@
 // One run of simgp-convert: source -> stages -> sink.
-#pragma once
+#ifndef TOOLS_JOB_H
+#define TOOLS_JOB_H
 
-#include <cstdint>
+#include <stdint.h>
+
 #include <string>
 
 #include "tools/source.h"
 
 namespace tools {
 
-struct Job {
-    SourceOptions source;
+struct job {
+    source_options source;
     std::string output;
     std::string to;      // destination format; empty: what suits the output
     std::string as;      // png, ppm, y4m, raw; empty: by the ending of `output`
@@ -21,13 +23,15 @@ struct Job {
     bool quiet = false;  // no progress bar, no notes
 };
 
-void run(const Job &job);
+void run(const job &j);
 
-/// The --list page: what converts into what.
+// The --list page: what converts into what.
 std::string list_conversions();
 
-/// Writes the demonstration's pictures into the folder `directory`, which is made if it is missing,
-/// and says on standard output what they show.
-void demo(const std::string &directory, const SourceOptions &source);
+// Writes the demonstration's pictures into the folder `directory`, which is made if it is missing,
+// and says on standard output what they show.
+void demo(const std::string &directory, const source_options &options);
 
 }  // namespace tools
+
+#endif

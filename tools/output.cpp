@@ -1,14 +1,13 @@
 #include "tools/output.h"
 
+#include <errno.h>
 #include <fcntl.h>
+#include <limits.h>
+#include <signal.h>
+#include <stdlib.h>
+#include <string.h>
 #include <sys/stat.h>
 #include <unistd.h>
-
-#include <cerrno>
-#include <climits>
-#include <csignal>
-#include <cstdlib>
-#include <cstring>
 
 #include "tools/fault.h"
 
@@ -19,28 +18,28 @@ namespace {
 // The file to take away when a signal ends the program: a plain array, for the signal handler.
 char unfinished[PATH_MAX];
 
-void remove_unfinished(int signal) {
+void remove_unfinished(int number) {
     if (unfinished[0]) unlink(unfinished);
-    std::signal(signal, SIG_DFL);
-    std::raise(signal);
+    signal(number, SIG_DFL);
+    raise(number);
 }
 
 }  // namespace
 
 void tidy_on_signals() {
-    std::signal(SIGPIPE, SIG_IGN);
-    for (int signal : {SIGINT, SIGTERM, SIGHUP}) std::signal(signal, remove_unfinished);
+    signal(SIGPIPE, SIG_IGN);
+    for (int number : {SIGINT, SIGTERM, SIGHUP}) signal(number, remove_unfinished);
 }
 
-Output::Output(const std::string &path) : name_(path), path_(path) {
+output::output(const std::string &path) : name_(path), path_(path) {
     struct stat about;
     if (path == "-") {
         name_ = "standard output";
         if (isatty(STDOUT_FILENO))
-            throw Fault("standard output is a terminal; picture data is not written to it");
+            throw fault("standard output is a terminal; picture data is not written to it");
         file_ = stdout;
     } else if (stat(path.c_str(), &about) == 0 && !S_ISREG(about.st_mode)) {
-        file_ = std::fopen(path.c_str(), "wb");
+        file_ = fopen(path.c_str(), "wb");
     } else {
         const size_t slash = path.rfind('/') + 1;  // 0 where there is no slash
         temporary_ = path.substr(0, slash) + "." + path.substr(slash) + ".XXXXXX";
@@ -49,7 +48,7 @@ Output::Output(const std::string &path) : name_(path), path_(path) {
             temporary_.clear();
         } else {
             if (temporary_.size() < sizeof unfinished)
-                std::memcpy(unfinished, temporary_.c_str(), temporary_.size() + 1);
+                memcpy(unfinished, temporary_.c_str(), temporary_.size() + 1);
             // mkostemp makes private files; this one shall be as any other.
             const mode_t mask = umask(0);
             umask(mask);
@@ -60,35 +59,35 @@ Output::Output(const std::string &path) : name_(path), path_(path) {
     if (!file_) fail(errno);
 }
 
-Output::~Output() {
-    if (file_ && file_ != stdout) std::fclose(file_);
+output::~output() {
+    if (file_ && file_ != stdout) fclose(file_);
     if (!temporary_.empty()) {
         unlink(temporary_.c_str());
         unfinished[0] = 0;
     }
 }
 
-void Output::fail(int error) const {
-    throw Fault(name_, ": ", std::strerror(error), written_ ? " after byte " : "",
+void output::fail(int error) const {
+    throw fault(name_, ": ", strerror(error), written_ ? " after byte " : "",
                 written_ ? std::to_string(written_) : "");
 }
 
-void Output::write(const void *bytes, size_t count) {
-    const size_t done = std::fwrite(bytes, 1, count, file_);
+void output::write(const void *bytes, size_t count) {
+    const size_t done = fwrite(bytes, 1, count, file_);
     written_ += (long long)done;
     if (done != count) fail(errno);
 }
 
-void Output::commit() {
+void output::commit() {
     if (file_ == stdout) {
-        if (std::fflush(stdout) != 0) fail(errno);
+        if (fflush(stdout) != 0) fail(errno);
         return;
     }
-    std::FILE *file = file_;
+    FILE *file = file_;
     file_ = nullptr;
-    if (std::fclose(file) != 0) fail(errno);
+    if (fclose(file) != 0) fail(errno);
     if (temporary_.empty()) return;
-    if (std::rename(temporary_.c_str(), path_.c_str()) != 0) fail(errno);
+    if (rename(temporary_.c_str(), path_.c_str()) != 0) fail(errno);
     temporary_.clear();
     unfinished[0] = 0;
 }

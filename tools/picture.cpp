@@ -1,136 +1,110 @@
 #include "tools/picture.h"
 
-#include <algorithm>
+#include <array>
 #include <charconv>
-#include <cstring>
+#include <iterator>
 
+#include "simgp/formats.h"
 #include "tools/fault.h"
 
 namespace tools {
 
 namespace {
 
-const std::vector<Format> table = {
-    {SIMGP_FMT_YUV400, "yuv400", Kind::planar, {{1, 0, 0}}, {{0, 0, 1, 0, 0}, {}, {}}},
-    {SIMGP_FMT_YUV420,
-     "yuv420",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 1}, {1, 1, 1}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 1, 1}, {2, 0, 1, 1, 1}}},
-    {SIMGP_FMT_YUV422N,
-     "yuv422n",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 0}, {1, 1, 0}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 1, 0}, {2, 0, 1, 1, 0}}},
-    {SIMGP_FMT_YUV444,
-     "yuv444",
-     Kind::planar,
-     {{1, 0, 0}, {1, 0, 0}, {1, 0, 0}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 0, 0}, {2, 0, 1, 0, 0}}},
-    {SIMGP_FMT_YV12,
-     "yv12",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 1}, {1, 1, 1}},
-     {{0, 0, 1, 0, 0}, {2, 0, 1, 1, 1}, {1, 0, 1, 1, 1}}},
-    {SIMGP_FMT_YV16,
-     "yv16",
-     Kind::planar,
-     {{1, 0, 0}, {1, 1, 0}, {1, 1, 0}},
-     {{0, 0, 1, 0, 0}, {2, 0, 1, 1, 0}, {1, 0, 1, 1, 0}}},
-    {SIMGP_FMT_NV12,
-     "nv12",
-     Kind::planar,
-     {{1, 0, 0}, {2, 1, 1}},
-     {{0, 0, 1, 0, 0}, {1, 0, 2, 1, 1}, {1, 1, 2, 1, 1}}},
-    {SIMGP_FMT_NV21,
-     "nv21",
-     Kind::planar,
-     {{1, 0, 0}, {2, 1, 1}},
-     {{0, 0, 1, 0, 0}, {1, 1, 2, 1, 1}, {1, 0, 2, 1, 1}}},
-    {SIMGP_FMT_YUV422W,
-     "yuv422w",
-     Kind::planar,
-     {{1, 0, 0}, {1, 0, 1}, {1, 0, 1}},
-     {{0, 0, 1, 0, 0}, {1, 0, 1, 0, 1}, {2, 0, 1, 0, 1}}},
-    {SIMGP_FMT_T64X32, "t64x32", Kind::tiled, {{1, 0, 0}, {2, 1, 1}}, {}},
-    {SIMGP_FMT_UYVY,
-     "uyvy",
-     Kind::packed,
-     {{2, 0, 0}},
-     {{0, 1, 2, 0, 0}, {0, 0, 4, 1, 0}, {0, 2, 4, 1, 0}}},
-    {SIMGP_FMT_YUYV,
-     "yuyv",
-     Kind::packed,
-     {{2, 0, 0}},
-     {{0, 0, 2, 0, 0}, {0, 1, 4, 1, 0}, {0, 3, 4, 1, 0}}},
-    {SIMGP_FMT_RGB565, "rgb565", Kind::rgb16, {{2, 0, 0}}, {}},
-    {SIMGP_FMT_BGR565, "bgr565", Kind::rgb16, {{2, 0, 0}}, {}},
-    {SIMGP_FMT_RGB888,
-     "rgb888",
-     Kind::rgb,
-     {{3, 0, 0}},
-     {{0, 0, 3, 0, 0}, {0, 1, 3, 0, 0}, {0, 2, 3, 0, 0}}},
-    {SIMGP_FMT_BGR888,
-     "bgr888",
-     Kind::rgb,
-     {{3, 0, 0}},
-     {{0, 2, 3, 0, 0}, {0, 1, 3, 0, 0}, {0, 0, 3, 0, 0}}},
-    {SIMGP_FMT_RGBA8888,
-     "rgba8888",
-     Kind::rgb,
-     {{4, 0, 0}},
-     {{0, 0, 4, 0, 0}, {0, 1, 4, 0, 0}, {0, 2, 4, 0, 0}}},
-    {SIMGP_FMT_BGRA8888,
-     "bgra8888",
-     Kind::rgb,
-     {{4, 0, 0}},
-     {{0, 2, 4, 0, 0}, {0, 1, 4, 0, 0}, {0, 0, 4, 0, 0}}},
-    {SIMGP_FMT_ARGB8888,
-     "argb8888",
-     Kind::rgb,
-     {{4, 0, 0}},
-     {{0, 1, 4, 0, 0}, {0, 2, 4, 0, 0}, {0, 3, 4, 0, 0}}},
-};
+using family = pixel_format::family;
+
+// A format of the library's table, with the places of the channels that its layout means.
+constexpr pixel_format described(const simgp::coded_format &coded) {
+    using simgp::format_kind;
+    using simgp::yuv_layout;
+    const simgp::format &f = *coded.is;
+    pixel_format d{coded.code, f.name, family::planar, f.planes, {}, {}};
+    for (int k = 0; k < f.planes; ++k) d.planes[k] = {f.bytes[k], f.x_shift[k], f.y_shift[k]};
+    if (f.kind == format_kind::rgb) {
+        const simgp::pixel_bytes at = simgp::pixels_of[size_t(f.packing)];
+        d.kind = at.size == 2 ? family::rgb16 : family::rgb;
+        if (at.size == 2) return d;
+        const int first[] = {at.r, at.g, at.b};
+        for (int c = 0; c < 3; ++c) d.channels[c] = {0, first[c], at.size, 0, 0};
+    } else if (f.kind == format_kind::tiled) {
+        d.kind = family::tiled;
+    } else if (f.kind == format_kind::packed) {
+        d.kind = family::packed;
+        const int y = f.layout == yuv_layout::uyvy ? 1 : 0, u = 1 - y;
+        d.channels[0] = {0, y, 2, 0, 0};
+        d.channels[1] = {0, u, 4, 1, 0};
+        d.channels[2] = {0, u + 2, 4, 1, 0};
+    } else {
+        d.channels[0] = {0, 0, 1, 0, 0};
+        for (int c = 1; c < 3 && f.u >= 0; ++c) {
+            const int plane = c == 1 ? f.u : f.v;
+            const bool second = c == 1 ? f.layout == yuv_layout::vu : f.layout == yuv_layout::uv;
+            d.channels[c] = {plane, second, f.bytes[plane], f.x_shift[plane], f.y_shift[plane]};
+        }
+    }
+    return d;
+}
+
+constexpr auto table = [] {
+    std::array<pixel_format, std::size(simgp::coded_formats)> all{};
+    for (size_t i = 0; i < all.size(); ++i) all[i] = described(simgp::coded_formats[i]);
+    return all;
+}();
 
 int even(int n) { return n + (n & 1); }
 int shifted_up(int n, int shift) { return (n + (1 << shift) - 1) >> shift; }
 
-}  // namespace
-
-int Format::chroma() const {
-    if (is_rgb()) return 4;
-    if (kind == Kind::tiled) return 1;
-    if (channel[1].step == 0) return 0;
-    return 4 >> (channel[1].x_shift + channel[1].y_shift);
+// As simgp/tile.h says: whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one,
+// groups of 4 x 1.
+size_t tiled_plane_bytes(size_t line_bytes, size_t lines) {
+    const size_t tile_rows = (lines + 31) / 32;
+    return 8192 * ((line_bytes + 127) / 128 * (tile_rows / 2) +
+                   (tile_rows % 2 ? (line_bytes + 255) / 256 : 0));
 }
 
-std::span<const Format> formats() { return table; }
+}  // namespace
 
-const Format *find_format(std::string_view name) {
-    for (const Format &format : table)
+int pixel_format::chroma() const {
+    if (is_rgb()) return 4;
+    if (is_tiled()) return 1;
+    if (channels[1].step == 0) return 0;
+    return 4 >> (channels[1].x_shift + channels[1].y_shift);
+}
+
+std::span<const pixel_format> formats() { return table; }
+
+const pixel_format *find_format(std::string_view name) {
+    for (const pixel_format &format : table)
         if (format.name == name) return &format;
     return nullptr;
 }
 
-const Format &format_named(std::string_view name) {
-    if (const Format *format = find_format(name)) return *format;
+const pixel_format &format_named(std::string_view name) {
+    if (const pixel_format *format = find_format(name)) return *format;
     std::string known;
-    for (const Format &format : table) known.append(" ").append(format.name);
-    throw Fault("unknown format '", name, "'; there are", known);
+    for (const pixel_format &format : table) known.append(" ").append(format.name);
+    throw fault("unknown format '", name, "'; there are", known);
 }
 
-const Format &format_coded(int32_t code) {
-    for (const Format &format : table)
+const pixel_format &format_coded(int32_t code) {
+    for (const pixel_format &format : table)
         if (format.code == code) return format;
-    throw Fault("unknown format code ", code);
+    throw fault("unknown format code ", code);
+}
+
+std::string ending_of(const std::string &path) {
+    const size_t dot = path.rfind('.');
+    return dot == std::string::npos || path.find('/', dot) != std::string::npos
+               ? ""
+               : path.substr(dot + 1);
 }
 
 void check_size(int64_t width, int64_t height, const std::string &where) {
     if (width < 1 || height < 1 || width > 65535 || height > 65535)
-        throw Fault(where, ": impossible size ", width, "x", height,
+        throw fault(where, ": impossible size ", width, "x", height,
                     "; width and height go from 1 to 65535");
     if (width * height > (int64_t{1} << 30) / 4)
-        throw Fault(where, ": impossible size ", width, "x", height,
+        throw fault(where, ": impossible size ", width, "x", height,
                     "; a frame may have up to 268435456 pixels");
 }
 
@@ -143,69 +117,62 @@ void parse_size(std::string_view text, const std::string &what, int &width, int 
         auto second = std::from_chars(first.ptr + 1, end, h);
         good = second.ec != std::errc::invalid_argument && second.ptr == end;
         if (good && (first.ec != std::errc() || second.ec != std::errc()))
-            throw Fault(what, ": impossible size ", text, "; width and height go from 1 to 65535");
+            throw fault(what, ": impossible size ", text, "; width and height go from 1 to 65535");
     }
-    if (!good) throw Fault(what, ": '", text, "' is not a size such as 640x480");
+    if (!good) throw fault(what, ": '", text, "' is not a size such as 640x480");
     check_size(w, h, what);
     width = int(w);
     height = int(h);
 }
 
-size_t tiled_plane_bytes(size_t row_bytes, size_t rows) {
-    const size_t tile_rows = (rows + 31) / 32;
-    // Whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one, groups of 4 x 1.
-    return 8192 * ((row_bytes + 127) / 128 * (tile_rows / 2) +
-                   (tile_rows % 2 ? (row_bytes + 255) / 256 : 0));
-}
-
-Picture::Picture(const Shape &shape) : shape_(shape) {
+picture::picture(const picture_shape &shape) : shape_(shape) {
     size_t total = 0;
     for (int k = 0; k < planes(); ++k) {
-        const PlaneShape &p = format().planes[k];
+        const plane_shape &p = format().planes[k];
         start_[k] = total;
-        if (format().kind == Kind::tiled) {
-            rows_[k] = 1;
-            row_bytes_[k] = tiled_plane_bytes(width(), height() >> p.y_shift);
-            total += row_bytes_[k];
+        if (format().is_tiled()) {
+            lines_[k] = 1;
+            line_bytes_[k] = tiled_plane_bytes(width(), height() >> p.y_shift);
+            total += line_bytes_[k];
             continue;
         }
-        rows_[k] = shifted_up(height(), p.y_shift);
-        row_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
+        lines_[k] = shifted_up(height(), p.y_shift);
+        line_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
         stride_[k] = ptrdiff_t(shifted_up(even(width()), p.x_shift)) * p.bytes;
         total += size_t(stride_[k]) * shifted_up(even(height()), p.y_shift);
     }
     memory_.resize(total);
 }
 
-size_t Picture::raw_bytes() const {
+size_t picture::raw_bytes() const {
     size_t total = 0;
-    for (int k = 0; k < planes(); ++k) total += row_bytes_[k] * rows_[k];
+    for (int k = 0; k < planes(); ++k) total += line_bytes_[k] * lines_[k];
     return total;
 }
 
-simgp_img Picture::descriptor(bool even_width, bool even_height) {
+simgp_img picture::descriptor(bool even_width, bool even_height) {
     const int w = even_width ? even(width()) : width();
     const int h = even_height ? even(height()) : height();
     simgp_img img = {};
     img.format = format().code;
     for (int k = 0; k < planes(); ++k) {
-        const PlaneShape &p = format().planes[k];
+        const plane_shape &p = format().planes[k];
         img.width[k] = shifted_up(w, p.x_shift);
-        img.height[k] = format().kind == Kind::tiled ? h >> p.y_shift : shifted_up(h, p.y_shift);
+        img.height[k] = format().is_tiled() ? h >> p.y_shift : shifted_up(h, p.y_shift);
         img.stride[k] = int32_t(stride_[k]);
-        img.plane[k] = row(k, 0);
+        img.plane[k] = line(k, 0);
     }
     return img;
 }
 
-void move_samples(const Picture &src, Picture &dst) {
-    // The V of a last half group lies outside the row: that of the group before serves, as everywhere
-    // in the library.
-    const bool half_group = src.format().kind == Kind::packed && src.width() % 2 == 1;
+void move_samples(const picture &src, picture &dst) {
+    // The V of a last half group lies outside the line: that of the group before serves, as
+    // everywhere in the library.
+    const bool half_group = src.format().is_packed() && src.width() % 2 == 1;
     for (int c = 0; c < 3; ++c) {
-        const Channel &to = dst.format().channel[c];
+        const channel &to = dst.format().channels[c];
         if (to.step == 0) continue;
-        const bool known = src.format().channel[c].step != 0;
+        const bool known = src.format().channels[c].step != 0;
         for (int y = 0; y < dst.height(); y += 1 << to.y_shift)
             for (int x = 0; x < dst.width(); x += 1 << to.x_shift) {
                 const int from = half_group && c == 2 && x == src.width() - 1 ? x - 2 : x;

@@ -5,61 +5,60 @@
 
 namespace tools {
 
-void read_frame(Input &input, Picture &to, int64_t frame) {
-    const int64_t begin = input.offset();
+void read_frame(input &in, picture &to, int64_t frame) {
+    const int64_t begin = in.offset();
     for (int k = 0; k < to.planes(); ++k)
-        for (int y = 0; y < to.rows(k); ++y)
-            if (input.read(to.row(k, y), to.row_bytes(k)) != to.row_bytes(k))
-                input.fail(frame, input.offset(),
-                           "the input ends within the frame: ", input.offset() - begin, " of its ",
-                           to.raw_bytes(), " bytes are there");
+        for (int y = 0; y < to.lines(k); ++y)
+            if (in.read(to.line(k, y), to.line_bytes(k)) != to.line_bytes(k))
+                in.fail(frame, in.offset(),
+                        "the input ends within the frame: ", in.offset() - begin, " of its ",
+                        to.raw_bytes(), " bytes are there");
 }
 
-void write_frame(Output &output, const Picture &picture) {
-    for (int k = 0; k < picture.planes(); ++k)
-        for (int y = 0; y < picture.rows(k); ++y)
-            output.write(picture.row(k, y), picture.row_bytes(k));
+void write_frame(output &out, const picture &p) {
+    for (int k = 0; k < p.planes(); ++k)
+        for (int y = 0; y < p.lines(k); ++y) out.write(p.line(k, y), p.line_bytes(k));
 }
 
 namespace {
 
-class RawSource : public Source {
+class raw_source : public source {
   public:
-    RawSource(std::unique_ptr<Input> input, const Shape &shape) : input_(std::move(input)) {
+    raw_source(std::unique_ptr<input> in, const picture_shape &shape) : input_(std::move(in)) {
         name_ = input_->name();
         shape_ = shape;
         if (input_->peek(1).empty()) input_->fail(-1, 0, "the input is empty");
     }
-    bool next(Picture &to) override {
+    bool next(picture &to) override {
         if (input_->peek(1).empty()) return false;
         read_frame(*input_, to, frame_++);
         return true;
     }
-    double done() const override {
-        return input_->size() > 0 ? double(input_->offset()) / double(input_->size()) : -1;
-    }
+    double done() const override { return input_->done(); }
 
   private:
-    std::unique_ptr<Input> input_;
+    std::unique_ptr<input> input_;
     int64_t frame_ = 0;
 };
 
-class RawSink : public Sink {
+class raw_sink : public sink {
   public:
-    explicit RawSink(const std::string &path) : output_(path) {}
-    void put(const Picture &picture) override { write_frame(output_, picture); }
+    explicit raw_sink(const std::string &path) : output_(path) {}
+    void put(const picture &p) override { write_frame(output_, p); }
     void finish() override { output_.commit(); }
 
   private:
-    Output output_;
+    output output_;
 };
 
 }  // namespace
 
-std::unique_ptr<Source> open_raw(std::unique_ptr<Input> input, const Shape &shape) {
-    return std::make_unique<RawSource>(std::move(input), shape);
+std::unique_ptr<source> open_raw(std::unique_ptr<input> in, const picture_shape &shape) {
+    return std::make_unique<raw_source>(std::move(in), shape);
 }
 
-std::unique_ptr<Sink> raw_sink(const std::string &path) { return std::make_unique<RawSink>(path); }
+std::unique_ptr<sink> open_raw_sink(const std::string &path) {
+    return std::make_unique<raw_sink>(path);
+}
 
 }  // namespace tools

@@ -1,5 +1,6 @@
 // Frames as they lie in files: plane after plane, line after line, without padding.
-#pragma once
+#ifndef TOOLS_RAW_H
+#define TOOLS_RAW_H
 
 #include "tools/input.h"
 #include "tools/output.h"
@@ -7,8 +8,10 @@
 
 namespace tools {
 
-/// Reads one frame of `to`'s shape; one that the input ends within is a Fault.
-void read_frame(Input &input, Picture &to, int64_t frame);
-void write_frame(Output &output, const Picture &picture);
+// Reads one frame of `to`'s shape; one that the input ends within is a fault.
+void read_frame(input &in, picture &to, int64_t frame);
+void write_frame(output &out, const picture &p);
 
 }  // namespace tools
+
+#endif

@@ -1,5 +1,6 @@
 // The conversions that lead from one format to another.
-#pragma once
+#ifndef TOOLS_ROAD_H
+#define TOOLS_ROAD_H
 
 #include <string>
 #include <vector>
@@ -8,38 +9,40 @@
 
 namespace tools {
 
-/// Who does a step.
-enum class Via { csc, dither, samples };
+// Who does a step.
+enum class method { csc, dither, samples };
 
-/// True if the library has this conversion; found out by asking it for a tiny picture.
-bool offered(const Format &from, const Format &to, Via via);
+// True if the library has this conversion; found out by asking it for a tiny picture.
+bool offered(const pixel_format &from, const pixel_format &to, method how);
 
-/// The best chain of conversions, with the pictures between them.
-class Road : public Stage {
+// The best chain of conversions, with the pictures between them.
+class road : public stage {
   public:
-    /// From pictures of `from` to the format `to`. With `dither` the last step is a dithered one.
-    /// Ends in a Fault where no chain leads there.
-    Road(const Shape &from, const Format &to, bool dither);
+    // From pictures of `from` to the format `to`. With `dither` the last step is a dithered one.
+    // Ends in a fault where no chain leads there.
+    road(const picture_shape &from, const pixel_format &to, bool dither);
 
-    /// Lines and columns beyond the size of `from` are set (Picture::pad). Where there is nothing
-    /// to do, the result is `from`.
-    Picture &run(Picture &from) override;
-    /// "nv12 -> yuv420 -> rgb565 (dithered)"
+    // Lines and columns beyond the size of `from` are overwritten. Where there is nothing to do,
+    // the result is `from`.
+    picture &run(picture &from) override;
+    // "nv12 -> yuv420 -> rgb565 (dithered)"
     std::string text() const override;
-    Shape out() const override;
-    /// What a step on the way loses that both ends could hold; empty if nothing.
+    picture_shape out() const override;
+    // What a step on the way loses that both ends could hold; empty if nothing.
     std::string loss() const;
-    /// Comparable between roads: fewer and gentler steps cost less.
+    // Comparable between roads: fewer and gentler steps cost less.
     int cost() const { return cost_; }
 
   private:
-    struct Step {
-        Via via;
-        Picture out;
+    struct step {
+        method how;
+        picture out;
     };
-    Shape from_;
-    std::vector<Step> steps_;
+    picture_shape from_;
+    std::vector<step> steps_;
     int cost_ = 0;
 };
 
 }  // namespace tools
+
+#endif

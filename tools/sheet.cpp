@@ -1,8 +1,9 @@
 #include "tools/sheet.h"
 
+#include <string.h>
+
 #include <algorithm>
 #include <cmath>
-#include <cstring>
 
 #include "tools/rgb.h"
 #include "tools/sink.h"
@@ -15,12 +16,12 @@ namespace {
 constexpr int gap = 8;
 constexpr uint8_t paper = 48;
 
-class SheetSink : public Sink {
+class sheet_sink : public sink {
   public:
-    SheetSink(const std::string &path, WriteStill write, int columns)
+    sheet_sink(const std::string &path, still_writer write, int columns)
         : output_(path), write_(write), columns_(columns) {}
 
-    void put(const Picture &picture) override {
+    void put(const picture &p) override {
         if (frame_ % every_ == 0) {
             if (tiles_.size() == 64) {
                 for (size_t k = 1; k < 32; ++k) tiles_[k] = std::move(tiles_[2 * k]);
@@ -28,7 +29,7 @@ class SheetSink : public Sink {
                 every_ *= 2;
             }
             if (frame_ % every_ == 0)
-                tiles_.push_back(make_tile(picture, "frame " + std::to_string(frame_), 320, 240));
+                tiles_.push_back(make_tile(p, "frame " + std::to_string(frame_), 320, 240));
         }
         ++frame_;
     }
@@ -38,22 +39,22 @@ class SheetSink : public Sink {
     }
 
   private:
-    Output output_;
-    WriteStill write_;
+    output output_;
+    still_writer write_;
     int columns_;
     int64_t frame_ = 0, every_ = 1;
-    std::vector<Tile> tiles_;
+    std::vector<tile> tiles_;
 };
 
 }  // namespace
 
-Tile make_tile(const Picture &picture, const std::string &label, int max_width, int max_height) {
-    Picture full = to_rgb888(picture);
+tile make_tile(const picture &p, const std::string &label, int max_width, int max_height) {
+    picture full = to_rgb888(p);
     const int by = std::max({1, (full.width() + max_width - 1) / max_width,
                              (full.height() + max_height - 1) / max_height});
     if (by == 1) return {std::move(full), label};
     const int width = std::max(full.width() / by, 1), height = std::max(full.height() / by, 1);
-    Picture small({&full.format(), width, height});
+    picture small({&full.format(), width, height});
     for (int y = 0; y < height; ++y)
         for (int x = 0; x < width; ++x)
             for (int c = 0; c < 3; ++c) {
@@ -68,13 +69,13 @@ Tile make_tile(const Picture &picture, const std::string &label, int max_width, 
     return {std::move(small), label};
 }
 
-Picture lay_out(const std::vector<Tile> &tiles, int columns) {
-    if (tiles.empty()) throw Fault("no picture for the sheet");
+picture lay_out(const std::vector<tile> &tiles, int columns) {
+    if (tiles.empty()) throw fault("no picture for the sheet");
     const int count = int(tiles.size());
     int cell_width = 0, cell_height = 0;
-    for (const Tile &tile : tiles) {
-        cell_width = std::max({cell_width, tile.picture.width(), text_width(tile.label, 1)});
-        cell_height = std::max(cell_height, tile.picture.height());
+    for (const tile &t : tiles) {
+        cell_width = std::max({cell_width, t.image.width(), text_width(t.label, 1)});
+        cell_height = std::max(cell_height, t.image.height());
     }
     if (columns <= 0)
         columns = int(std::lround(std::sqrt(double(count) * cell_height / cell_width)));
@@ -86,28 +87,27 @@ Picture lay_out(const std::vector<Tile> &tiles, int columns) {
     for (int first = 0; first < count; first += columns) {
         int height = 0;
         for (int k = first; k < std::min(first + columns, count); ++k)
-            height = std::max(height, tiles[k].picture.height());
+            height = std::max(height, tiles[k].image.height());
         top.push_back(top.back() + label_height + height + gap);
     }
     const int width = columns * (cell_width + gap) + gap;
     check_size(width, top.back(), "contact sheet");
-    Picture sheet({&format_coded(SIMGP_FMT_RGB888), width, top.back()});
-    for (int y = 0; y < sheet.height(); ++y)
-        std::memset(sheet.row(0, y), paper, sheet.row_bytes(0));
+    picture sheet({&format_coded(SIMGP_FMT_RGB888), width, top.back()});
+    for (int y = 0; y < sheet.height(); ++y) memset(sheet.line(0, y), paper, sheet.line_bytes(0));
     for (int k = 0; k < count; ++k) {
-        const Tile &tile = tiles[k];
+        const tile &t = tiles[k];
         const int x = gap + k % columns * (cell_width + gap), y = top[k / columns];
         // A label that does not fit at the larger scale is written at the smaller one.
-        draw_text(sheet, x, y, tile.label, text_width(tile.label, scale) <= cell_width ? scale : 1);
-        for (int line = 0; line < tile.picture.height(); ++line)
-            std::memcpy(sheet.sample(0, x, y + label_height + line), tile.picture.row(0, line),
-                        tile.picture.row_bytes(0));
+        draw_text(sheet, x, y, t.label, text_width(t.label, scale) <= cell_width ? scale : 1);
+        for (int line = 0; line < t.image.height(); ++line)
+            memcpy(sheet.sample(0, x, y + label_height + line), t.image.line(0, line),
+                   t.image.line_bytes(0));
     }
     return sheet;
 }
 
-std::unique_ptr<Sink> sheet_sink(const std::string &path, WriteStill write, int columns) {
-    return std::make_unique<SheetSink>(path, write, columns);
+std::unique_ptr<sink> open_sheet_sink(const std::string &path, still_writer write, int columns) {
+    return std::make_unique<sheet_sink>(path, write, columns);
 }
 
 }  // namespace tools

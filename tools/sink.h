@@ -1,5 +1,6 @@
 // Where frames go.
-#pragma once
+#ifndef TOOLS_SINK_H
+#define TOOLS_SINK_H
 
 #include <memory>
 #include <string>
@@ -13,32 +14,34 @@
 
 namespace tools {
 
-class Sink {
+class sink {
   public:
-    virtual ~Sink() = default;
-    virtual void put(const Picture &picture) = 0;
-    /// All frames are there: completes the file. Without this call no unfinished file stays.
+    virtual ~sink() = default;
+    virtual void put(const picture &p) = 0;
+    // All frames are there: completes the file. Without this call no unfinished file stays.
     virtual void finish() = 0;
-    /// Complete files that stay even if the work fails now.
+    // Complete files that stay even if the work fails now.
     virtual int64_t kept() const { return 0; }
 };
 
-std::unique_ptr<Sink> raw_sink(const std::string &path);
-std::unique_ptr<Sink> y4m_sink(const std::string &path, const Tempo &tempo);
+std::unique_ptr<sink> open_raw_sink(const std::string &path);
+std::unique_ptr<sink> open_y4m_sink(const std::string &path, const video_traits &traits);
 
-/// What the colour space tag of a Y4M stream says for this format; empty if Y4M cannot hold it.
-std::string_view y4m_tag(const Format &format);
+// What the colour space tag of a Y4M stream says for this format; empty if Y4M cannot hold it.
+std::string_view y4m_tag(const pixel_format &format);
 
-/// Writes one still picture, of any RGB format.
-using WriteStill = void (*)(Output &output, const Picture &picture);
-void write_png(Output &output, const Picture &picture);
-void write_ppm(Output &output, const Picture &picture);
+// Writes one still picture, of any RGB format.
+using still_writer = void (*)(output &out, const picture &p);
+void write_png(output &out, const picture &p);
+void write_ppm(output &out, const picture &p);
 
-/// Still pictures. A path with a number in it ("out-%04d.png"; the first picture is number 0) gives
-/// a file for each frame, any other path holds one frame and a second one is a Fault.
-std::unique_ptr<Sink> still_sink(const std::string &path, WriteStill write);
-/// One still picture that shows the frames in a grid; `columns` 0 makes it about as wide as high.
-/// Of more than 64 frames it shows every second, fourth, ...
-std::unique_ptr<Sink> sheet_sink(const std::string &path, WriteStill write, int columns);
+// Still pictures. A path with a number in it ("out-%04d.png"; the first picture is number 0) gives
+// a file for each frame, any other path holds one frame and a second one is a fault.
+std::unique_ptr<sink> open_still_sink(const std::string &path, still_writer write);
+// One still picture that shows the frames in a grid; `columns` 0 makes it about as wide as high.
+// Of more than 64 frames it shows every second, fourth, ...
+std::unique_ptr<sink> open_sheet_sink(const std::string &path, still_writer write, int columns);
 
 }  // namespace tools
+
+#endif

@@ -1,5 +1,6 @@
 // Where frames come from.
-#pragma once
+#ifndef TOOLS_SOURCE_H
+#define TOOLS_SOURCE_H
 
 #include <memory>
 #include <string>
@@ -9,42 +10,44 @@
 
 namespace tools {
 
-/// What a stream says about its frames beyond their shape, in the words of a Y4M header.
-struct Tempo {
+// What a stream says about its frames beyond their shape, in the words of a Y4M header.
+struct video_traits {
     std::string rate = "25:1", interlacing = "p", aspect = "1:1";
 };
 
-class Source {
+class source {
   public:
-    virtual ~Source() = default;
-    const Shape &shape() const { return shape_; }
-    const Tempo &tempo() const { return tempo_; }
+    virtual ~source() = default;
+    const picture_shape &shape() const { return shape_; }
+    const video_traits &traits() const { return traits_; }
     const std::string &name() const { return name_; }
 
-    /// Fills `to`, a picture of shape(), with the next frame; false where there is none.
-    virtual bool next(Picture &to) = 0;
-    /// How much of the whole has been delivered, 0 ... 1; negative if that is not known.
+    // Fills `to`, a picture of shape(), with the next frame; false where there is none.
+    virtual bool next(picture &to) = 0;
+    // How much of the whole has been delivered, 0 ... 1; negative if that is not known.
     virtual double done() const = 0;
 
   protected:
-    Shape shape_;
-    Tempo tempo_;
+    picture_shape shape_;
+    video_traits traits_;
     std::string name_;
 };
 
-/// How the user described the input.
-struct SourceOptions {
+// How the user described the input.
+struct source_options {
     std::string path;    // a file, "-", or "testcard:[WxH][@FRAMES]"
     std::string format;  // of raw frames and test cards; empty: as the file says
     std::string size;    // of raw frames
 };
 
-/// Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M or PNG.
-std::unique_ptr<Source> open_source(const SourceOptions &options);
+// Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M or PNG.
+std::unique_ptr<source> open_source(const source_options &options);
 
-std::unique_ptr<Source> open_y4m(std::unique_ptr<Input> input);
-std::unique_ptr<Source> open_png(std::unique_ptr<Input> input, const Format &format);
-std::unique_ptr<Source> open_raw(std::unique_ptr<Input> input, const Shape &shape);
-std::unique_ptr<Source> open_testcard(const std::string &spec, const Format &format);
+std::unique_ptr<source> open_y4m(std::unique_ptr<input> in);
+std::unique_ptr<source> open_png(std::unique_ptr<input> in, const pixel_format &format);
+std::unique_ptr<source> open_raw(std::unique_ptr<input> in, const picture_shape &shape);
+std::unique_ptr<source> open_testcard(const std::string &spec, const pixel_format &format);
 
 }  // namespace tools
+
+#endif

@@ -1,5 +1,6 @@
 // One thing that is done to every frame between source and sink.
-#pragma once
+#ifndef TOOLS_STAGE_H
+#define TOOLS_STAGE_H
 
 #include <string>
 
@@ -7,15 +8,17 @@
 
 namespace tools {
 
-class Stage {
+class stage {
   public:
-    virtual ~Stage() = default;
-    /// The shape of what run() returns.
-    virtual Shape out() const = 0;
-    /// The result stays valid until the next call.
-    virtual Picture &run(Picture &from) = 0;
-    /// For --verbose.
+    virtual ~stage() = default;
+    // The shape of what run() returns.
+    virtual picture_shape out() const = 0;
+    // The result stays valid until the next call.
+    virtual picture &run(picture &from) = 0;
+    // For --verbose.
     virtual std::string text() const = 0;
 };
 
 }  // namespace tools
+
+#endif

@@ -6,13 +6,13 @@ namespace tools {
 
 namespace {
 
-/// "out-%04d.png" as what stands before and behind the number, and its width.
-struct Pattern {
+// "out-%04d.png" as what stands before and behind the number, and its width.
+struct pattern {
     std::string before, behind;
     size_t digits = 0;
     bool numbered = false;
 
-    explicit Pattern(const std::string &path) {
+    explicit pattern(const std::string &path) {
         for (size_t at = 0; at < path.size(); ++at) {
             std::string &part = numbered ? behind : before;
             if (path[at] != '%') {
@@ -27,7 +27,7 @@ struct Pattern {
                 const bool good = end < path.size() && path[end] == 'd' && width.size() <= 2 &&
                                   (width.empty() || width[0] == '0');
                 if (!good || numbered)
-                    throw Fault(path,
+                    throw fault(path,
                                 ": one number such as %d or %04d may stand in the name; for '%' "
                                 "itself write %%");
                 digits = width.empty() ? 0 : std::stoul(width);
@@ -44,17 +44,17 @@ struct Pattern {
     }
 };
 
-class StillSink : public Sink {
+class still_sink : public sink {
   public:
-    StillSink(const std::string &path, WriteStill write) : pattern_(path), write_(write) {}
+    still_sink(const std::string &path, still_writer write) : pattern_(path), write_(write) {}
 
-    void put(const Picture &picture) override {
+    void put(const picture &p) override {
         if (!pattern_.numbered && frame_ == 1)
-            throw Fault(pattern_.name(0),
+            throw fault(pattern_.name(0),
                         ": holds one picture, but more frames follow; use a name such "
                         "as out-%04d.png, --sheet or --frames 1");
-        output_ = std::make_unique<Output>(pattern_.name(frame_));
-        write_(*output_, picture);
+        output_ = std::make_unique<output>(pattern_.name(frame_));
+        write_(*output_, p);
         ++frame_;
         if (!pattern_.numbered) return;
         output_->commit();
@@ -67,16 +67,16 @@ class StillSink : public Sink {
     int64_t kept() const override { return kept_; }
 
   private:
-    Pattern pattern_;
-    WriteStill write_;
-    std::unique_ptr<Output> output_;  // of a single picture, until it is known to be the only one
+    pattern pattern_;
+    still_writer write_;
+    std::unique_ptr<output> output_;  // of a single picture, until it is known to be the only one
     int64_t frame_ = 0, kept_ = 0;
 };
 
 }  // namespace
 
-std::unique_ptr<Sink> still_sink(const std::string &path, WriteStill write) {
-    return std::make_unique<StillSink>(path, write);
+std::unique_ptr<sink> open_still_sink(const std::string &path, still_writer write) {
+    return std::make_unique<still_sink>(path, write);
 }
 
 }  // namespace tools

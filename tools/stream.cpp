@@ -1,7 +1,8 @@
 #include "tools/stream.h"
 
+#include <string.h>
+
 #include <algorithm>
-#include <cstring>
 
 #include "scmn/scmn.h"
 
@@ -83,20 +84,19 @@ const char *media_name(int32_t media_type) {
     }
 }
 
-CodedStream::CodedStream(Input &input, int32_t media_type)
-    : input_(input), media_type_(media_type) {
+coded_stream::coded_stream(input &in, int32_t media_type) : input_(in), media_type_(media_type) {
     if (media_type && !has_start_codes(media_type))
-        throw Fault(input.name(), ": ", media_name(media_type),
+        throw fault(in.name(), ": ", media_name(media_type),
                     " has no start codes; only H.264, MPEG-4 and H.263 streams can be cut");
     read_more();
-    if (window_.empty()) throw Fault(input.name(), ": empty");
+    if (window_.empty()) throw fault(in.name(), ": empty");
     if (media_type_) return;
     reject_containers();  // a container holds start codes too
     media_type_ = recognise();
     if (!media_type_) reject();
 }
 
-int32_t CodedStream::recognise() const {
+int32_t coded_stream::recognise() const {
     const uint8_t *p = window_.data(), *end = p + window_.size();
     bool any = false, vop = false, slice = false, not_h264 = false;
     for (const uint8_t *code = p; (code = find_code(code, end, false)) && end - code > 3;
@@ -115,7 +115,7 @@ int32_t CodedStream::recognise() const {
     return 0;
 }
 
-void CodedStream::reject_containers() const {
+void coded_stream::reject_containers() const {
     const auto at = [&](size_t place, std::string_view text) {
         return window_.size() >= place + text.size() &&
                memcmp(window_.data() + place, text.data(), text.size()) == 0;
@@ -131,13 +131,13 @@ void CodedStream::reject_containers() const {
                             : at(0, "\x47") && at(188, "\x47") ? "an MPEG transport stream"
                                                                : nullptr;
     if (container)
-        throw Fault(input_.name(), ": ", container,
+        throw fault(input_.name(), ": ", container,
                     " file, not an elementary stream; `ffmpeg -i FILE -c copy -an OUT.h264` (or "
                     ".m4v, .h263) takes the video out");
 }
 
 // Says what the bytes look like instead.
-void CodedStream::reject() const {
+void coded_stream::reject() const {
     // Lengths of NAL units, each leading to the next.
     size_t place = 0;
     int units = 0;
@@ -148,16 +148,16 @@ void CodedStream::reject() const {
         place += 4 + length, units++;
     }
     if (units >= 2 && (place == window_.size() || units == 8))
-        throw Fault(
+        throw fault(
             input_.name(),
             ": H.264 with lengths in place of start codes, as in MP4; needs ffmpeg's filter "
             "h264_mp4toannexb");
-    throw Fault(input_.name(), ": no start codes of H.264, MPEG-4 or H.263 in the first ",
+    throw fault(input_.name(), ": no start codes of H.264, MPEG-4 or H.263 in the first ",
                 window_.size(), " bytes");
 }
 
 // Drops what has been searched and reads a portion; false at the end.
-bool CodedStream::read_more() {
+bool coded_stream::read_more() {
     if (ended_) return false;
     const size_t done = at_ > 0 ? at_ - 1 : 0;  // a zero byte before a start code belongs to it
     window_.erase(window_.begin(), window_.begin() + ptrdiff_t(done));
@@ -171,7 +171,7 @@ bool CodedStream::read_more() {
     return true;
 }
 
-bool CodedStream::find(Unit &unit) {
+bool coded_stream::find(unit &u) {
     const bool h263 = media_type_ == SCMN_MT_H263;
     for (;;) {
         const uint8_t *begin = window_.data(), *end = begin + window_.size();
@@ -181,8 +181,8 @@ bool CodedStream::find(Unit &unit) {
             if (end - code < 4) return false;  // cut off
             // The first of four bytes 00 00 00 01 is part of the start code in H.264.
             const bool four = media_type_ == SCMN_MT_H264 && code > begin && code[-1] == 0;
-            unit = {window_offset_ + size_t(code - begin) - four, code,
-                    std::min(size_t(end - code), look_ahead)};
+            u = {window_offset_ + size_t(code - begin) - four, code,
+                 std::min(size_t(end - code), look_ahead)};
             return true;
         }
         // The last two bytes may begin a start code.
@@ -192,47 +192,47 @@ bool CodedStream::find(Unit &unit) {
     }
 }
 
-CodedStream::Role CodedStream::role(const Unit &unit) {
-    if (media_type_ == SCMN_MT_H263) return Role::picture;
+coded_stream::role coded_stream::role_of(const unit &u) {
+    if (media_type_ == SCMN_MT_H263) return role::picture;
     if (media_type_ == SCMN_MT_H264) {
-        const H264::Role role = h264_.role(unit.bytes + 3, unit.size - 3);
-        if (role == H264::Role::header) return Role::header;
+        const h264::role r = h264_.role_of(u.bytes + 3, u.size - 3);
+        if (r == h264::role::header) return role::header;
         // Behind a header every slice is one of a new picture.
-        const int type = unit.bytes[3] & 31;
+        const int type = u.bytes[3] & 31;
         const bool first = !has_picture_ && (type == 1 || type == 2 || type == 5);
-        return first || role == H264::Role::slice ? Role::picture : Role::more;
+        return first || r == h264::role::slice ? role::picture : role::more;
     }
-    switch (unit.bytes[3]) {
+    switch (u.bytes[3]) {
         case 0xB6:
-            return Role::picture;
+            return role::picture;
         case 0xB1:  // end of the sequence
         case 0xB7:
-            return Role::more;  // slice
+            return role::more;  // slice
         default:
-            return Role::header;
+            return role::header;
     }
 }
 
-bool CodedStream::next(CodedPicture &picture) {
-    Unit unit;
-    while (find(unit)) {
-        const Role role = this->role(unit);
-        if (role == Role::more) continue;
+bool coded_stream::next(coded_picture &picture) {
+    unit u;
+    while (find(u)) {
+        const role r = role_of(u);
+        if (r == role::more) continue;
         const bool complete = has_picture_;
         if (complete) {
             picture = current_;
-            picture.size = unit.offset - current_.offset;
+            picture.size = u.offset - current_.offset;
             started_ = has_picture_ = false;
         }
         if (!started_) {
             started_ = true;
-            current_.offset = unit.offset;
+            current_.offset = u.offset;
         }
-        if (role == Role::picture) {
+        if (r == role::picture) {
             has_picture_ = true;
             // The slice that has been found decides in H.264, not what may follow.
-            const size_t size = media_type_ == SCMN_MT_H264 ? 4 : unit.size;
-            current_.key = scmn_is_vkeyfrm(media_type_, unit.bytes, int32_t(size));
+            const size_t size = media_type_ == SCMN_MT_H264 ? 4 : u.size;
+            current_.key = scmn_is_vkeyfrm(media_type_, u.bytes, int32_t(size));
         }
         if (complete) return true;
     }

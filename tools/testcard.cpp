@@ -14,27 +14,27 @@ namespace tools {
 
 namespace {
 
-struct Yuv {
+struct yuv {
     uint8_t y, u, v;
 };
 
 // ITU-R BT.601, limited range, of the full-scale colours.
-constexpr Yuv bars[8] = {{235, 128, 128}, {210, 16, 146}, {170, 166, 16}, {145, 54, 34},
+constexpr yuv bars[8] = {{235, 128, 128}, {210, 16, 146}, {170, 166, 16}, {145, 54, 34},
                          {106, 202, 222}, {81, 90, 240},  {41, 240, 110}, {16, 128, 128}};
 
-/// Runs from 0 to `top` and back.
+// Runs from 0 to `top` and back.
 int back_and_forth(int64_t step, int top) {
     if (top <= 0) return 0;
     const int at = int(step % (2 * int64_t{top}));
     return at <= top ? at : 2 * top - at;
 }
 
-/// Maps 0 ... count - 1 to low ... high.
+// Maps 0 ... count - 1 to low ... high.
 uint8_t ramp(int at, int count, int low, int high) {
     return uint8_t(low + (count > 1 ? int64_t{high - low} * at / (count - 1) : 0));
 }
 
-Yuv card(int x, int y, int width, int height, int64_t frame) {
+yuv card(int x, int y, int width, int height, int64_t frame) {
     const int bars_end = height * 5 / 8, ramp_end = height * 6 / 8;
     if (y < bars_end) {
         const int side = std::max(bars_end / 4, 1), speed = std::max(width / 80, 1);
@@ -52,9 +52,9 @@ Yuv card(int x, int y, int width, int height, int64_t frame) {
     return {130, ramp(x, width, 16, 240), ramp(y - ramp_end, height - ramp_end, 16, 240)};
 }
 
-class Testcard : public Source {
+class test_card : public source {
   public:
-    Testcard(const std::string &spec, const Format &format) {
+    test_card(const std::string &spec, const pixel_format &format) {
         name_ = spec;
         std::string size = spec.substr(std::string("testcard:").size());
         if (const size_t at = size.find('@'); at != std::string::npos) {
@@ -62,19 +62,19 @@ class Testcard : public Source {
             const char *end = count.data() + count.size();
             const auto result = std::from_chars(count.data(), end, frames_);
             if (result.ec != std::errc() || result.ptr != end || frames_ < 1)
-                throw Fault(spec, ": '", count, "' is not a number of frames");
+                throw fault(spec, ": '", count, "' is not a number of frames");
             size.resize(at);
         }
         int width = 640, height = 480;
         if (!size.empty()) parse_size(size, spec, width, height);
         shape_ = {&format, width, height};
         // It is drawn in YUV; other formats are reached from 4:2:0 with the library.
-        const bool drawn = !format.is_rgb() && format.kind != Kind::tiled;
-        drawing_ = Picture({drawn ? &format : &format_coded(SIMGP_FMT_YUV420), width, height});
-        if (!drawn) road_ = std::make_unique<Road>(drawing_.shape(), format, false);
+        const bool drawn = !format.is_rgb() && !format.is_tiled();
+        drawing_ = picture({drawn ? &format : &format_coded(SIMGP_FMT_YUV420), width, height});
+        if (!drawn) road_ = std::make_unique<road>(drawing_.shape(), format, false);
     }
 
-    bool next(Picture &to) override {
+    bool next(picture &to) override {
         if (frame_ == frames_) return false;
         for (int y = 0; y < drawing_.height(); ++y)
             for (int x = 0; x < drawing_.width(); ++x) draw(x, y);
@@ -85,26 +85,26 @@ class Testcard : public Source {
     double done() const override { return double(frame_) / double(frames_); }
 
   private:
-    /// Shared chroma samples are those of the top left pixel, as in the library's own conversions.
+    // Shared chroma samples are those of the top left pixel, as in the library's own conversions.
     void draw(int x, int y) {
-        const Yuv colour = card(x, y, drawing_.width(), drawing_.height(), frame_);
+        const yuv colour = card(x, y, drawing_.width(), drawing_.height(), frame_);
         const uint8_t value[3] = {colour.y, colour.u, colour.v};
         for (int c = 0; c < 3; ++c) {
-            const Channel &channel = drawing_.format().channel[c];
-            const int mask = (1 << channel.x_shift) - 1, lines = (1 << channel.y_shift) - 1;
-            if (channel.step && !(x & mask) && !(y & lines)) *drawing_.sample(c, x, y) = value[c];
+            const channel &to = drawing_.format().channels[c];
+            const int columns = (1 << to.x_shift) - 1, lines = (1 << to.y_shift) - 1;
+            if (to.step && !(x & columns) && !(y & lines)) *drawing_.sample(c, x, y) = value[c];
         }
     }
 
     int64_t frame_ = 0, frames_ = 1;
-    Picture drawing_;
-    std::unique_ptr<Road> road_;
+    picture drawing_;
+    std::unique_ptr<road> road_;
 };
 
 }  // namespace
 
-std::unique_ptr<Source> open_testcard(const std::string &spec, const Format &format) {
-    return std::make_unique<Testcard>(spec, format);
+std::unique_ptr<source> open_testcard(const std::string &spec, const pixel_format &format) {
+    return std::make_unique<test_card>(spec, format);
 }
 
 }  // namespace tools

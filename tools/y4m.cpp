@@ -1,5 +1,6 @@
 // Y4M, uncompressed video: a line of text about the stream, then for each frame a line that begins
 // with FRAME and the tight planes.
+#include <algorithm>
 #include <charconv>
 #include <limits>
 
@@ -12,18 +13,23 @@ namespace {
 
 constexpr size_t longest_line = 1024;
 
-/// The layouts of the colour space tag. 4:2:0 comes in several sitings of chroma, which say where a
-/// sample belongs, not where it lies in memory.
-const Format *format_of_tag(std::string_view tag) {
-    for (const char *same : {"420", "420jpeg", "420mpeg2", "420paldv"})
-        if (tag == same) return &format_coded(SIMGP_FMT_YUV420);
-    if (tag == "422") return &format_coded(SIMGP_FMT_YUV422N);
-    if (tag == "444") return &format_coded(SIMGP_FMT_YUV444);
-    if (tag == "mono") return &format_coded(SIMGP_FMT_YUV400);
+// Colour space tags. 4:2:0 comes in several sitings of chroma, which say where a sample belongs,
+// not where it lies in memory. Of the tags of one format, the first is the one that is written.
+constexpr struct {
+    std::string_view tag;
+    int32_t format;
+} colour_tags[] = {{"420jpeg", SIMGP_FMT_YUV420},  {"420", SIMGP_FMT_YUV420},
+                   {"420mpeg2", SIMGP_FMT_YUV420}, {"420paldv", SIMGP_FMT_YUV420},
+                   {"422", SIMGP_FMT_YUV422N},     {"444", SIMGP_FMT_YUV444},
+                   {"mono", SIMGP_FMT_YUV400}};
+
+const pixel_format *format_of_tag(std::string_view tag) {
+    for (const auto &known : colour_tags)
+        if (known.tag == tag) return &format_coded(known.format);
     return nullptr;
 }
 
-/// "420p10", "mono16": the digits after the last letter that is followed by digits only.
+// "420p10", "mono16": a known layout, with a number of bits behind it.
 bool high_depth(std::string_view tag) {
     for (const char *begin : {"420p", "422p", "444p", "440p", "mono"})
         if (tag.starts_with(begin)) {
@@ -34,15 +40,15 @@ bool high_depth(std::string_view tag) {
     return false;
 }
 
-class Y4mSource : public Source {
+class y4m_source : public source {
   public:
-    explicit Y4mSource(std::unique_ptr<Input> input) : input_(std::move(input)) {
+    explicit y4m_source(std::unique_ptr<input> in) : input_(std::move(in)) {
         name_ = input_->name();
         std::string header;
         if (!input_->line(header, longest_line)) fail(0, "the Y4M header has no end");
         if (!header.starts_with("YUV4MPEG2 "))
             fail(0, "the Y4M header does not begin with YUV4MPEG2");
-        std::string colour = "420";
+        shape_.format = format_of_tag("420");  // unless the header says otherwise
         constexpr int64_t missing = std::numeric_limits<int64_t>::min();
         int64_t width = missing, height = missing;
         for (size_t at = 10; at < header.size();) {
@@ -60,41 +66,37 @@ class Y4mSource : public Source {
                     height = number(value, begin);
                     break;
                 case 'C':
-                    colour = value;
+                    if (high_depth(value))
+                        fail(begin, "colour space ", tag,
+                             " has more than 8 bits a sample; only 8-bit video is supported");
+                    shape_.format = format_of_tag(value);
+                    if (!shape_.format)
+                        fail(begin, "unknown colour space tag ", tag,
+                             "; mono, 420, 422 and 444 are supported");
                     break;
                 case 'F':
-                    tempo_.rate = value;
+                    traits_.rate = value;
                     break;
                 case 'I':
-                    tempo_.interlacing = value;
+                    traits_.interlacing = value;
                     break;
                 case 'A':
-                    tempo_.aspect = value;
+                    traits_.aspect = value;
                     break;
                 case 'X':
                     break;  // comments and extensions
                 default:
                     fail(begin, "unknown tag '", tag, "' in the Y4M header");
             }
-            if (tag[0] == 'C') {
-                if (high_depth(colour))
-                    fail(begin, "colour space C", colour,
-                         " has more than 8 bits a sample; only 8-bit ", "video is supported");
-                shape_.format = format_of_tag(colour);
-                if (!shape_.format)
-                    fail(begin, "unknown colour space tag C", colour,
-                         "; mono, 420, 422 and 444 are supported");
-            }
         }
         if (width == missing || height == missing)
             fail(0, "the Y4M header lacks ", width == missing ? "W" : "H");
         check_size(width, height, name_ + ": byte 0: Y4M header");
-        if (!shape_.format) shape_.format = format_of_tag(colour);
         shape_.width = int(width);
         shape_.height = int(height);
     }
 
-    bool next(Picture &to) override {
+    bool next(picture &to) override {
         const int64_t begin = input_->offset();
         if (input_->peek(1).empty()) return false;
         std::string header;
@@ -106,9 +108,7 @@ class Y4mSource : public Source {
         return true;
     }
 
-    double done() const override {
-        return input_->size() > 0 ? double(input_->offset()) / double(input_->size()) : -1;
-    }
+    double done() const override { return input_->done(); }
 
   private:
     template <class... Part>
@@ -125,56 +125,48 @@ class Y4mSource : public Source {
         return value;
     }
 
-    std::unique_ptr<Input> input_;
+    std::unique_ptr<input> input_;
     int64_t frame_ = 0;
 };
 
-class Y4mSink : public Sink {
+class y4m_sink : public sink {
   public:
-    Y4mSink(const std::string &path, const Tempo &tempo) : output_(path), tempo_(tempo) {}
+    y4m_sink(const std::string &path, const video_traits &traits)
+        : output_(path), traits_(traits) {}
 
-    void put(const Picture &picture) override {
+    void put(const picture &p) override {
         if (frames_++ == 0) {
             std::ostringstream header;
-            header << "YUV4MPEG2 W" << picture.width() << " H" << picture.height() << " F"
-                   << tempo_.rate << " I" << tempo_.interlacing << " A" << tempo_.aspect << " C"
-                   << y4m_tag(picture.format()) << "\n";
+            header << "YUV4MPEG2 W" << p.width() << " H" << p.height() << " F" << traits_.rate
+                   << " I" << traits_.interlacing << " A" << traits_.aspect << " C"
+                   << y4m_tag(p.format()) << "\n";
             output_.write(header.str());
         }
         output_.write("FRAME\n");
-        write_frame(output_, picture);
+        write_frame(output_, p);
     }
     void finish() override { output_.commit(); }
 
   private:
-    Output output_;
-    Tempo tempo_;
+    output output_;
+    video_traits traits_;
     int64_t frames_ = 0;
 };
 
 }  // namespace
 
-std::string_view y4m_tag(const Format &format) {
-    switch (format.code) {
-        case SIMGP_FMT_YUV400:
-            return "mono";
-        case SIMGP_FMT_YUV420:
-            return "420jpeg";
-        case SIMGP_FMT_YUV422N:
-            return "422";
-        case SIMGP_FMT_YUV444:
-            return "444";
-        default:
-            return {};
-    }
+std::string_view y4m_tag(const pixel_format &format) {
+    for (const auto &known : colour_tags)
+        if (known.format == format.code) return known.tag;
+    return {};
 }
 
-std::unique_ptr<Source> open_y4m(std::unique_ptr<Input> input) {
-    return std::make_unique<Y4mSource>(std::move(input));
+std::unique_ptr<source> open_y4m(std::unique_ptr<input> in) {
+    return std::make_unique<y4m_source>(std::move(in));
 }
 
-std::unique_ptr<Sink> y4m_sink(const std::string &path, const Tempo &tempo) {
-    return std::make_unique<Y4mSink>(path, tempo);
+std::unique_ptr<sink> open_y4m_sink(const std::string &path, const video_traits &traits) {
+    return std::make_unique<y4m_sink>(path, traits);
 }
 
 }  // namespace tools

@@ -2,7 +2,7 @@
 #ifndef SCMN_VECTOR_KEYFRAME_H
 #define SCMN_VECTOR_KEYFRAME_H
 
-#include "simgp/rows.h"
+#include "rows/keyframe.h"
 
 namespace simgp::SIMD_TARGET {
 
@@ -16,7 +16,7 @@ inline int first_code(const uint8_t *p, u8v mask, u8v code) {
 
 // Two zero bytes are rare in coded video: four vectors are searched for them at once, and only then
 // for the code.
-ptrdiff_t find_code(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t code) {
+static ptrdiff_t find_code(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t code) {
     const u8v masks = set_u8(mask), codes = set_u8(code);
     ptrdiff_t x = 0;
     for (; x + 4 * bytes <= count; x += 4 * bytes) {
@@ -36,7 +36,7 @@ ptrdiff_t find_code(const uint8_t *p, ptrdiff_t count, uint8_t mask, uint8_t cod
     return x;
 }
 
-void fill_keyframe(rows &t) { t.find_code = find_code; }
+void fill_keyframe(keyframe_rows &t) { t.find_code = find_code; }
 
 }  // namespace simgp::SIMD_TARGET
 

@@ -7,7 +7,7 @@
 #ifndef SIMGP_VECTOR_DITHER_H
 #define SIMGP_VECTOR_DITHER_H
 
-#include "simgp/rows.h"
+#include "rows/dither.h"
 
 namespace simgp::SIMD_TARGET {
 
@@ -47,8 +47,8 @@ struct dither_columns {
 // The first column, 2, takes no nudge, and the last one that does makes nothing below; between them
 // all columns do the same. Whole vectors of those are followed by one that ends at the last of them
 // and may do some again: its samples are loaded before the first store.
-void dither(const uint8_t *src, const uint8_t *above, uint8_t *cur, uint8_t *below,
-            ptrdiff_t width) {
+static void dither(const uint8_t *src, const uint8_t *above, uint8_t *cur, uint8_t *below,
+                   ptrdiff_t width) {
     const dither_columns c{src, above, cur, below};
     const ptrdiff_t last = 2 + ((width - 3) & ~ptrdiff_t(1));
     below[0] = src[0];
@@ -74,7 +74,7 @@ void dither(const uint8_t *src, const uint8_t *above, uint8_t *cur, uint8_t *bel
     c.nudge_cur(last);
 }
 
-void fill_dither(rows &t) { t.dither = dither; }
+void fill_dither(dither_rows &t) { t.dither = dither; }
 
 }  // namespace simgp::SIMD_TARGET
 

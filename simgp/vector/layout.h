@@ -2,38 +2,13 @@
 #ifndef SIMGP_VECTOR_LAYOUT_H
 #define SIMGP_VECTOR_LAYOUT_H
 
-#include <string.h>
-
-#include "simgp/rows.h"
+#include "rows/layout.h"
+#include "simgp/vector/steps.h"
 
 namespace simgp::SIMD_TARGET {
 
-// Moves `pairs` >= 1 pairs in steps of a vector: whole(i) does `bytes` of them from pair i on,
-// half(i) half as many, one(i) one. The last step ends at the last pair and may do some again.
-template <class Whole, class Half, class One>
-inline void in_steps(ptrdiff_t pairs, Whole whole, Half half, One one) {
-    if (pairs < bytes / 2) {
-        for (ptrdiff_t i = 0; i < pairs; i++) one(i);
-        return;
-    }
-    if (pairs < bytes) {
-        half(0);
-        return half(pairs - bytes / 2);
-    }
-    ptrdiff_t i = 0;
-    for (; i + 2 * bytes <= pairs; i += 2 * bytes) {
-        whole(i);
-        whole(i + bytes);
-    }
-    if (i + bytes <= pairs) {
-        whole(i);
-        i += bytes;
-    }
-    if (i < pairs) whole(pairs - bytes);
-}
-
-void pack_pairs(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs) {
-    in_steps(
+static void pack_pairs(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs) {
+    in_pair_steps(
         pairs,
         [&](ptrdiff_t i) {
             store_zip8(dst + 2 * i, natural_to_by8(load(a + i)), natural_to_by8(load(b + i)));
@@ -45,8 +20,8 @@ void pack_pairs(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pair
         });
 }
 
-void unpack_pairs(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
-    in_steps(
+static void unpack_pairs(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
+    in_pair_steps(
         pairs,
         [&](ptrdiff_t i) {
             const pair_u8 v = load_split_natural(src + 2 * i);
@@ -60,7 +35,7 @@ void unpack_pairs(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
         });
 }
 
-void fill_layout(rows &t) {
+void fill_layout(layout_rows &t) {
     t.pack = pack_pairs;
     t.unpack = unpack_pairs;
 }

@@ -28,6 +28,8 @@
 #ifndef SIMGP_VECTOR_MATRIX_H
 #define SIMGP_VECTOR_MATRIX_H
 
+#include "rows/yuv2rgb.h"
+
 namespace simgp::SIMD_TARGET {
 
 // Three channels with 7 fractional bits, and blue with 6; saturated. What a packer does not use is
@@ -79,6 +81,19 @@ struct matrix_s7 {
 
 using bt601 = matrix_s7<149, 409>;
 using bt601_coarse = matrix_s7<150, 408>;
+
+template <yuv_matrix>
+struct matrix_of_name;
+template <>
+struct matrix_of_name<yuv_matrix::fine> {
+    using type = bt601;
+};
+template <>
+struct matrix_of_name<yuv_matrix::coarse> {
+    using type = bt601_coarse;
+};
+template <yuv_matrix Name>
+using matrix_named = typename matrix_of_name<Name>::type;
 
 }  // namespace simgp::SIMD_TARGET
 

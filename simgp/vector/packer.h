@@ -5,7 +5,7 @@
 #ifndef SIMGP_VECTOR_PACKER_H
 #define SIMGP_VECTOR_PACKER_H
 
-#include "simgp/rows.h"
+#include "rows/formats.h"
 #include "simgp/vector/matrix.h"
 
 namespace simgp::SIMD_TARGET {
@@ -20,67 +20,48 @@ inline u8v arrange(u8v v) {
                                        : v;
 }
 
-template <rgb_packing>
-struct packer;
+template <int Size, pixel_bytes At>
+struct packer_of_size;
 
-template <bool BGR>
-struct packer_565 {
+template <rgb_packing Packing>
+struct packer : packer_of_size<pixels_of[size_t(Packing)].size, pixels_of[size_t(Packing)]> {};
+
+template <pixel_bytes At>
+struct packer_of_size<2, At> {
     static constexpr pixel_order order = pixel_order::by8;
     static constexpr int size = 2;
-    static u16v pack(const rgb_s16 &p) { return pack565(BGR ? p.b : p.r, p.g, BGR ? p.r : p.b); }
+    static u16v pack(const rgb_s16 &p) {
+        return At.r > At.b ? pack565(p.r, p.g, p.b) : pack565(p.b, p.g, p.r);
+    }
     static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
         store_zip16(dst, pack(even), pack(odd));
     }
 };
-template <>
-struct packer<rgb_packing::rgb565> : packer_565<false> {};
-template <>
-struct packer<rgb_packing::bgr565> : packer_565<true> {};
 
-// The channels as bytes, clamped, pixel after pixel.
-struct rgb_u8 {
-    u8v r, g, b;
-};
-inline rgb_u8 narrow(const rgb_s16 &even, const rgb_s16 &odd) {
-    return {narrow_join<7>(even.r, odd.r), narrow_join<7>(even.g, odd.g),
-            narrow_join<6>(even.b6, odd.b6)};
-}
-
-template <bool BGR>
-struct packer_888 {
+template <pixel_bytes At>
+struct packer_of_size<3, At> {
+    static_assert(At.g == 1);
     static constexpr pixel_order order = pixel_order::natural;
     static constexpr int size = 3;
     static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
-        if constexpr (BGR)
+        if constexpr (At.b == 0)
             store_narrow_zip3<6, 7, 7>(dst, even.b6, odd.b6, even.g, odd.g, even.r, odd.r);
         else
             store_narrow_zip3<7, 7, 6>(dst, even.r, odd.r, even.g, odd.g, even.b6, odd.b6);
     }
 };
-template <>
-struct packer<rgb_packing::rgb888> : packer_888<false> {};
-template <>
-struct packer<rgb_packing::bgr888> : packer_888<true> {};
 
-template <bool BGR, bool ALPHA_FIRST>
-struct packer_8888 {
+template <pixel_bytes At>
+struct packer_of_size<4, At> {
     static constexpr pixel_order order = pixel_order::by4;
     static constexpr int size = 4;
     static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
-        const rgb_u8 p = narrow(even, odd);
-        const u8v first = BGR ? p.b : p.r, last = BGR ? p.r : p.b, alpha = set_u8(255);
-        if constexpr (ALPHA_FIRST)
-            store_zip4(dst, alpha, first, p.g, last);
-        else
-            store_zip4(dst, first, p.g, last, alpha);
+        const u8v r = narrow_join<7>(even.r, odd.r), g = narrow_join<7>(even.g, odd.g),
+                  b = narrow_join<6>(even.b6, odd.b6), a = set_u8(255);
+        const auto byte = [&](int k) { return k == At.r ? r : k == At.g ? g : k == At.b ? b : a; };
+        store_zip4(dst, byte(0), byte(1), byte(2), byte(3));
     }
 };
-template <>
-struct packer<rgb_packing::rgba8888> : packer_8888<false, false> {};
-template <>
-struct packer<rgb_packing::bgra8888> : packer_8888<true, false> {};
-template <>
-struct packer<rgb_packing::argb8888> : packer_8888<false, true> {};
 
 }  // namespace simgp::SIMD_TARGET
 

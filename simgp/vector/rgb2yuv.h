@@ -8,30 +8,19 @@
 
 #include <string.h>
 
-#include "simgp/rows.h"
+#include "rows/rgb2yuv.h"
 #include "simgp/vector/steps.h"
 
 namespace simgp::SIMD_TARGET {
 
-template <rgb_packing>
-struct unpacker;
-
-template <>
-struct unpacker<rgb_packing::rgb565> {
-    static constexpr int size = 2;
-    static constexpr bool blue_first = false;
-    static rgb_v load(const uint8_t *p) { return load_565(p); }
+template <rgb_packing Packing>
+struct unpacker {
+    static constexpr pixel_bytes at = pixels_of[size_t(Packing)];
+    static constexpr int size = at.size;
+    static constexpr bool blue_first = size == 2 ? at.b > at.r : at.b < at.r;
+    static_assert(size == 2 || (size == 3 && at.g == 1));
+    static rgb_v load(const uint8_t *p) { return size == 2 ? load_565(p) : load_888(p); }
 };
-template <bool BGR>
-struct unpacker_888 {
-    static constexpr int size = 3;
-    static constexpr bool blue_first = BGR;
-    static rgb_v load(const uint8_t *p) { return load_888(p); }
-};
-template <>
-struct unpacker<rgb_packing::rgb888> : unpacker_888<false> {};
-template <>
-struct unpacker<rgb_packing::bgr888> : unpacker_888<true> {};
 
 // BT.601, limited range, of pixels whose first channel is red, or blue.
 template <bool BLUE_FIRST>
@@ -67,7 +56,7 @@ struct rgb_to_yuv_step {
     static constexpr int chroma_size = planar ? 1 : 2;
 
     static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + from::size * x; }
-    static void convert(const yuv_row_out &out, ptrdiff_t x, const uint8_t *pixels) {
+    static void write(const yuv_row_out &out, ptrdiff_t x, const uint8_t *pixels) {
         const rgb_v p = from::load(pixels);
         store(out.y + x, matrix::luma(p));
         if constexpr (Layout == yuv_layout::grey) return;
@@ -83,7 +72,7 @@ struct rgb_to_yuv_step {
     static void part(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x, int count) {
         uint8_t pixels[bytes * from::size] = {}, y[bytes], u[bytes], v[bytes];
         memcpy(pixels, in + from::size * x, size_t(count) * from::size);
-        convert({y, u, v}, 0, pixels);
+        write({y, u, v}, 0, pixels);
         memcpy(out.y + x, y, size_t(count));
         if (const size_t chroma = size_t(count / 2); pixels_in_pairs && chroma) {
             memcpy(out.u + chroma_size * (x / 2), u, chroma * chroma_size);
@@ -95,11 +84,13 @@ struct rgb_to_yuv_step {
 template <rgb_packing Packing>
 struct rgb_to_rgb565_step {
     static constexpr bool pixels_in_pairs = false;
-    static constexpr bool four_bytes = Packing == rgb_packing::rgba8888;
-    static constexpr int size = four_bytes ? 4 : 3;
+    static constexpr pixel_bytes at = pixels_of[size_t(Packing)];
+    static constexpr int size = at.size;
+    static constexpr bool four_bytes = size == 4;
+    static_assert(size >= 3 && at.r == 0 && at.g == 1 && at.b == 2);
 
     static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + size * x; }
-    static void convert(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
+    static void write(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
         if constexpr (four_bytes)
             repack_8888_to_565(out + 2 * x, pixels);
         else
@@ -108,30 +99,34 @@ struct rgb_to_rgb565_step {
     static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
         uint8_t pixels[bytes * size] = {}, words[2 * bytes];
         memcpy(pixels, in + size * x, size_t(count) * size);
-        convert(words, 0, pixels);
+        write(words, 0, pixels);
         memcpy(out + 2 * x, words, 2 * size_t(count));
     }
 };
 
 template <rgb_packing Packing, yuv_layout Layout>
-void rgb_to_yuv(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     row_of_steps<rgb_to_yuv_step<Packing, Layout>>(src, yuv_row_out{y, u, v}, width);
 }
 
 template <rgb_packing Packing>
-void rgb_to_rgb565(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
+static void to_rgb565_row(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
     row_of_steps<rgb_to_rgb565_step<Packing>>(src, dst, width);
 }
 
-void fill_rgb2yuv(rows &t) {
-#define FILL(packing, layout)                                     \
-    t.rgb_to_yuv_slot(rgb_packing::packing, yuv_layout::layout) = \
-        rgb_to_yuv<rgb_packing::packing, yuv_layout::layout>;
-    SIMGP_RGB_TO_YUV_ROWS(FILL)
+template <rgb_packing Packing, yuv_layout Layout>
+static void fill_slots(rgb2yuv_rows &t) {
+    t.row[size_t(Packing)][size_t(Layout)] = to_yuv_row<Packing, Layout>;
+    t.row[size_t(Packing)][size_t(yuv_layout::grey)] = to_yuv_row<Packing, yuv_layout::grey>;
+}
+
+void fill_rgb2yuv(rgb2yuv_rows &t) {
+#define FILL(name, from, to) fill_slots<formats::from.packing, formats::to.layout>(t);
+    SIMGP_RGB_TO_YUV_KERNELS(FILL)
 #undef FILL
-#define FILL(packing) \
-    t.rgb_to_rgb565[size_t(rgb_packing::packing)] = rgb_to_rgb565<rgb_packing::packing>;
-    SIMGP_RGB_TO_RGB565_ROWS(FILL)
+#define FILL(name, from, to) \
+    t.to_rgb565[size_t(formats::from.packing)] = to_rgb565_row<formats::from.packing>;
+    SIMGP_RGB_TO_RGB565_KERNELS(FILL)
 #undef FILL
 }
 

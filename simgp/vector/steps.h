@@ -1,4 +1,4 @@
-// A row as a sequence of vector steps, right to the last pixel.
+// Rows as sequences of vector steps, right to the last pixel.
 #ifndef SIMGP_VECTOR_STEPS_H
 #define SIMGP_VECTOR_STEPS_H
 
@@ -9,7 +9,7 @@ namespace simgp::SIMD_TARGET {
 // A Step converts `bytes` pixels at a time:
 //   pixels_in_pairs         whether a step must begin at an even pixel
 //   load(in, x)             the samples of pixels x ... x + bytes - 1
-//   convert(out, x, those)  stores the pixels at their places
+//   write(out, x, those)    computes the pixels and stores them at their places
 //   part(in, out, x, n)     converts n <= bytes pixels from x on and touches nothing else
 // In and Out are whatever the Step reads and writes: a few pointers.
 //
@@ -29,12 +29,36 @@ inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
     for (;;) {
         const ptrdiff_t next = x + 2 * bytes <= whole ? x + bytes : whole - bytes;
         const auto ahead = Step::load(in, next);
-        Step::convert(out, x, pixels);
+        Step::write(out, x, pixels);
         if (next == x) break;
         x = next;
         pixels = ahead;
     }
     if (whole < width) Step::part(in, out, whole, 1);
+}
+
+// Moves `pairs` >= 1 pairs in steps of a vector: whole(i) does `bytes` of them from pair i on,
+// half(i) half as many, one(i) one. The last step ends at the last pair and may do some again.
+template <class Whole, class Half, class One>
+inline void in_pair_steps(ptrdiff_t pairs, Whole whole, Half half, One one) {
+    if (pairs < bytes / 2) {
+        for (ptrdiff_t i = 0; i < pairs; i++) one(i);
+        return;
+    }
+    if (pairs < bytes) {
+        half(0);
+        return half(pairs - bytes / 2);
+    }
+    ptrdiff_t i = 0;
+    for (; i + 2 * bytes <= pairs; i += 2 * bytes) {
+        whole(i);
+        whole(i + bytes);
+    }
+    if (i + bytes <= pairs) {
+        whole(i);
+        i += bytes;
+    }
+    if (i < pairs) whole(pairs - bytes);
 }
 
 }  // namespace simgp::SIMD_TARGET

@@ -2,46 +2,48 @@
 #ifndef SIMGP_VECTOR_TILE_H
 #define SIMGP_VECTOR_TILE_H
 
-#include "simgp/rows.h"
+#include "rows/tile.h"
 #include "simgp/vector/matrix.h"
 #include "simgp/vector/packer.h"
 
 namespace simgp::SIMD_TARGET {
 
-// A row of a tile is 64 bytes: one vector of the widest.
-inline constexpr ptrdiff_t tile_row = 64;
+static_assert(tile_width % bytes == 0);
 
 // The linear rows beside a tile are too many streams for the processor to foresee. Copies are held
-// up by that once they leave the caches, so they ask for the bytes beside the second tile to come:
-// a hint, which may point behind a plane.
-inline void fetch_ahead(const uint8_t *p) { __builtin_prefetch(p + 2 * tile_row); }
+// up by that once they leave the caches, so they ask for the bytes beside the second tile to come.
+// A hint may lead behind a plane, but no pointer may: hence the integer.
+inline void fetch_ahead(const uint8_t *p) {
+    __builtin_prefetch(
+        reinterpret_cast<const void *>(reinterpret_cast<uintptr_t>(p) + 2 * tile_width));
+}
 
-void detile(const uint8_t *tile, uint8_t *dst, ptrdiff_t stride, ptrdiff_t rows) {
-    for (ptrdiff_t r = 0; r < rows; r++) {
+static void detile(const uint8_t *tile, uint8_t *dst, ptrdiff_t stride, ptrdiff_t height) {
+    for (ptrdiff_t r = 0; r < height; r++) {
         fetch_ahead(dst + r * stride);
-        for (ptrdiff_t x = 0; x < tile_row; x += bytes)
-            store(dst + r * stride + x, load(tile + tile_row * r + x));
+        for (ptrdiff_t x = 0; x < tile_width; x += bytes)
+            store(dst + r * stride + x, load(tile + tile_width * r + x));
     }
 }
 
-void entile(const uint8_t *src, ptrdiff_t stride, uint8_t *tile, ptrdiff_t rows) {
-    for (ptrdiff_t r = 0; r < rows; r++) {
+static void entile(const uint8_t *src, ptrdiff_t stride, uint8_t *tile, ptrdiff_t height) {
+    for (ptrdiff_t r = 0; r < height; r++) {
         fetch_ahead(src + r * stride);
-        for (ptrdiff_t x = 0; x < tile_row; x += bytes)
-            store(tile + tile_row * r + x, load(src + r * stride + x));
+        for (ptrdiff_t x = 0; x < tile_width; x += bytes)
+            store(tile + tile_width * r + x, load(src + r * stride + x));
     }
 }
 
-void detile_unpack(const uint8_t *tile, uint8_t *a, ptrdiff_t stride_a, uint8_t *b,
-                   ptrdiff_t stride_b, ptrdiff_t rows) {
-    for (ptrdiff_t r = 0; r < rows; r++) {
-        const uint8_t *const from = tile + tile_row * r;
+static void detile_unpack(const uint8_t *tile, uint8_t *a, ptrdiff_t stride_a, uint8_t *b,
+                          ptrdiff_t stride_b, ptrdiff_t height) {
+    for (ptrdiff_t r = 0; r < height; r++) {
+        const uint8_t *const from = tile + tile_width * r;
         fetch_ahead(a + r * stride_a);
         fetch_ahead(b + r * stride_b);
-        if constexpr (bytes == tile_row) {
+        if constexpr (bytes == tile_width) {
             store_split(a + r * stride_a, b + r * stride_b, load(from));
         } else {
-            for (ptrdiff_t i = 0; i < tile_row / 2; i += bytes) {
+            for (ptrdiff_t i = 0; i < tile_width / 2; i += bytes) {
                 const pair_u8 v = load_split_natural(from + 2 * i);
                 store(a + r * stride_a + i, v.even);
                 store(b + r * stride_b + i, v.odd);
@@ -50,43 +52,45 @@ void detile_unpack(const uint8_t *tile, uint8_t *a, ptrdiff_t stride_a, uint8_t 
     }
 }
 
-void entile_pack(const uint8_t *a, ptrdiff_t stride_a, const uint8_t *b, ptrdiff_t stride_b,
-                 uint8_t *tile, ptrdiff_t rows) {
-    for (ptrdiff_t r = 0; r < rows; r++) {
+static void entile_pack(const uint8_t *a, ptrdiff_t stride_a, const uint8_t *b, ptrdiff_t stride_b,
+                        uint8_t *tile, ptrdiff_t height) {
+    for (ptrdiff_t r = 0; r < height; r++) {
         fetch_ahead(a + r * stride_a);
         fetch_ahead(b + r * stride_b);
-        for (ptrdiff_t x = 0; x < tile_row; x += bytes)
-            store(tile + tile_row * r + x,
+        for (ptrdiff_t x = 0; x < tile_width; x += bytes)
+            store(tile + tile_width * r + x,
                   load_zip(a + r * stride_a + x / 2, b + r * stride_b + x / 2));
     }
 }
 
 // Two rows at a time share their chroma.
 template <rgb_packing Packing>
-void tile_to_rgb(const uint8_t *luma, const uint8_t *chroma, uint8_t *dst, ptrdiff_t stride,
-                 ptrdiff_t rows) {
+static void tile_to_rgb(const uint8_t *luma, const uint8_t *chroma, uint8_t *dst, ptrdiff_t stride,
+                        ptrdiff_t height) {
     using to = packer<Packing>;
-    for (ptrdiff_t r = 0; r < rows; r += 2)
-        for (ptrdiff_t x = 0; x < tile_row; x += bytes) {
-            const u8v pairs = arrange<to::order>(load(chroma + tile_row * (r / 2) + x));
+    for (ptrdiff_t r = 0; r < height; r += 2)
+        for (ptrdiff_t x = 0; x < tile_width; x += bytes) {
+            const u8v pairs = arrange<to::order>(load(chroma + tile_width * (r / 2) + x));
             const chroma_terms c = bt601::chroma<pair_order::uv>(pairs);
-            const auto convert = [&](ptrdiff_t row) {
-                const u8v y = arrange<to::order>(load(luma + tile_row * row + x));
+            const auto write_row = [&](ptrdiff_t row) {
+                const u8v y = arrange<to::order>(load(luma + tile_width * row + x));
                 to::store(dst + row * stride + x * to::size, bt601::apply(bt601::luma_even(y), c),
                           bt601::apply(bt601::luma_odd(y), c));
             };
-            convert(r);
-            if (r + 1 < rows) convert(r + 1);
+            write_row(r);
+            if (r + 1 < height) write_row(r + 1);
         }
 }
 
-void fill_tile(rows &t) {
+void fill_tile(tile_rows &t) {
     t.detile = detile;
     t.entile = entile;
     t.detile_unpack = detile_unpack;
     t.entile_pack = entile_pack;
-    t.tile_to_rgb565 = tile_to_rgb<rgb_packing::rgb565>;
-    t.tile_to_bgra8888 = tile_to_rgb<rgb_packing::bgra8888>;
+#define FILL(name, from, to) \
+    t.to_rgb[size_t(formats::to.packing)] = tile_to_rgb<formats::to.packing>;
+    SIMGP_TILE_TO_RGB_KERNELS(FILL)
+#undef FILL
 }
 
 }  // namespace simgp::SIMD_TARGET

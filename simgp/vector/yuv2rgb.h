@@ -2,7 +2,7 @@
 #ifndef SIMGP_VECTOR_YUV2RGB_H
 #define SIMGP_VECTOR_YUV2RGB_H
 
-#include "simgp/rows.h"
+#include "rows/yuv2rgb.h"
 #include "simgp/vector/matrix.h"
 #include "simgp/vector/packer.h"
 #include "simgp/vector/source.h"
@@ -16,7 +16,7 @@ inline void part_through_stack(const samples &in, uint8_t *out, ptrdiff_t x, int
     staged to;
     uint8_t pixels[bytes * Step::size];
     Step::stage(to, in, x, count);
-    Step::convert(pixels, 0, Step::load(to.all(), 0));
+    Step::write(pixels, 0, Step::load(to.all(), 0));
     memcpy(out + x * Step::size, pixels, size_t(count) * Step::size);
 }
 
@@ -42,11 +42,11 @@ struct yuv_step : source<Layout> {
         to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c.even),
                   Matrix::apply(Matrix::luma_odd(y), c.odd));
     }
-    static void convert(uint8_t *out, ptrdiff_t x, const yuv_half &p) {
+    static void write(uint8_t *out, ptrdiff_t x, const yuv_half &p) {
         apply(out, x, p.y, terms(p));
     }
     // In this order, since the terms of even and odd pixels together would not fit 16 registers.
-    static void convert(uint8_t *out, ptrdiff_t x, const yuv_full &p) {
+    static void write(uint8_t *out, ptrdiff_t x, const yuv_full &p) {
         const auto even = Matrix::apply(Matrix::luma_even(p.y),
                                         Matrix::template chroma<from::pairs>(p.pairs_even));
         const auto odd =
@@ -79,7 +79,7 @@ struct pair_step : Step {
             Step::load(in.first, x), load_luma<Step::to::order>(in.second_y, x)};
     }
     template <class Pixels>
-    static void convert(const out_pair &out, ptrdiff_t x, const Pixels &p) {
+    static void write(const out_pair &out, ptrdiff_t x, const Pixels &p) {
         const auto terms = Step::terms(p.first);
         Step::apply(out.first, x, p.first.y, terms);
         Step::apply(out.second, x, p.second_y, terms);
@@ -101,7 +101,7 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
     static void stage(staged &to, const samples &in, ptrdiff_t x, int count) {
         memcpy(to.y, in.y + x, size_t(count));
     }
-    static void convert(uint8_t *out, ptrdiff_t x, u8v y) {
+    static void write(uint8_t *out, ptrdiff_t x, u8v y) {
         const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
         const u16v w = as_u16(y);
         store_zip8(out + x * size, bit_or(bits(shl<3>(w), 0xE0), bits(shr<3>(w), 0x1F)),
@@ -113,29 +113,35 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
 };
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
-void yuv_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
+static void to_rgb_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                       ptrdiff_t width) {
     row_of_steps<yuv_step<Layout, Matrix, Packing>>(samples{y, u, v}, dst, width);
 }
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
-void yuv_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
-                  uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
+static void to_rgb_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
+                            const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
     row_of_steps<pair_step<yuv_step<Layout, Matrix, Packing>>>(samples_pair{{y0, u, v}, y1},
                                                                out_pair{dst0, dst1}, width);
 }
 
-void fill_yuv2rgb(rows &t) {
-#define FILL(layout, packing)                                     \
-    t.yuv_to_rgb_slot(yuv_layout::layout, rgb_packing::packing) = \
-        yuv_row<yuv_layout::layout, bt601, rgb_packing::packing>;
-    SIMGP_YUV_TO_RGB_ROWS(FILL)
+template <yuv_layout Layout, bool TwoRows, rgb_packing Packing, yuv_matrix Matrix>
+static void fill_slot(yuv2rgb_rows &t) {
+    using matrix = matrix_named<Matrix>;
+    constexpr size_t m = size_t(Matrix), l = size_t(Layout), p = size_t(Packing);
+    if constexpr (TwoRows)
+        t.pair[m][l][p] = to_rgb_row_pair<Layout, matrix, Packing>;
+    else
+        t.row[m][l][p] = to_rgb_row<Layout, matrix, Packing>;
+}
+
+void fill_yuv2rgb(yuv2rgb_rows &t) {
+#define FILL(name, from, to, rule)                                                       \
+    fill_slot<formats::from.layout, serves_two_rows(formats::from), formats::to.packing, \
+              matrix_of(yuv_rule::rule)>(t);
+    SIMGP_YUV_TO_RGB_KERNELS(FILL)
+    SIMGP_PACKED_TO_RGB_KERNELS(FILL)
 #undef FILL
-#define FILL(layout, packing)                                          \
-    t.yuv_to_rgb_pair_slot(yuv_layout::layout, rgb_packing::packing) = \
-        yuv_row_pair<yuv_layout::layout, bt601, rgb_packing::packing>;
-    SIMGP_YUV_TO_RGB_PAIRS(FILL)
-#undef FILL
-    t.vu_to_rgb565_coarse_pair = yuv_row_pair<yuv_layout::vu, bt601_coarse, rgb_packing::rgb565>;
 }
 
 }  // namespace simgp::SIMD_TARGET

@@ -19,7 +19,7 @@ started=$("$readelf" -SW "$static_library" | grep -oE '\.(init_array|ctors|prein
 [ -z "$started" ] || fault "Objects have start-up code or thread-local data:" "$started"
 
 # What is asked of the C library. Allocation belongs to scmn/mem.cpp alone.
-allowed='memcpy|memmove|memset|memcmp|getauxval|pthread_once|abort|__stack_chk_(fail|guard)'
+allowed='memcpy|memmove|memset|memcmp|getauxval|sched_yield|abort|__stack_chk_(fail|guard)'
 allowed+='|__(memcpy|memmove|memset)_chk|__cxa_finalize|__gmon_start__|_ITM_.*|__tls_get_addr'
 allocators='malloc|calloc|realloc|free|posix_memalign|aligned_alloc|memalign'
 imports=$("$nm" -D --undefined-only "$shared_library" | awk '{ sub(/@.*/, "", $2); print $2 }' |

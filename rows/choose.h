@@ -1,8 +1,8 @@
 // Which instruction set the library uses.
-#ifndef SIMD_CHOOSE_H
-#define SIMD_CHOOSE_H
+#ifndef ROWS_CHOOSE_H
+#define ROWS_CHOOSE_H
 
-#include "simgp/rows.h"
+#include "rows/table.h"
 
 namespace simgp {
 
@@ -15,18 +15,18 @@ const char *target_name(target t);
 bool target_available(target t);
 
 // The rows of one target; t must be available.
-const rows &rows_of(target t);
+const row_table &rows_of(target t);
 
 // The rows in use: those of the most wanted target that is available, unless a test or a benchmark
 // has forced others. The choice is made at the first call, on whatever thread that is.
-const rows &live_rows();
+const row_table &live_rows();
 
 // The target in use.
 target live_target();
 
 // For tests and benchmarks: makes `table` the rows in use from now on, for all threads; null goes
 // back to the library's own choice.
-void force_rows(const rows *table);
+void force_rows(const row_table *table);
 
 }  // namespace simgp
 

@@ -1,11 +1,11 @@
-// The choice of the instruction set, made once and nowhere else.
-#include "simd/choose.h"
+// The choice of the instruction set: the one place that looks at the processor.
+#include "rows/choose.h"
 
-#include <pthread.h>
+#include <sched.h>
 
 #include <atomic>
 
-#include "simd/areas.h"
+#include "areas.h"  // SIMGP_AREAS, made by the build from its list
 
 #if defined(__x86_64__) || defined(__i386__)
 #include <cpuid.h>
@@ -16,7 +16,7 @@
 namespace simgp {
 
 // clang-format off
-#define DECLARE(family, area) void fill_##area(rows &);
+#define DECLARE(area) void fill_##area(area##_rows &);
 namespace scalar { SIMGP_AREAS(DECLARE) }
 namespace neon   { SIMGP_AREAS(DECLARE) }
 namespace sse41  { SIMGP_AREAS(DECLARE) }
@@ -29,6 +29,7 @@ namespace {
 
 struct cpu {
     bool neon = false, sse41 = false, avx2 = false, avx512 = false;
+    bool fast_strings = false;  // x86: ERMS
 };
 
 #if defined(__x86_64__) || defined(__i386__)
@@ -50,6 +51,7 @@ cpu detect() {
     const bool saves_ymm = (saved & 0x06) == 0x06;  // SSE and AVX state
     const bool saves_zmm = (saved & 0xE6) == 0xE6;  // and opmask, upper halves, upper registers
     if (!__get_cpuid_count(7, 0, &a, &b, &c, &d)) return has;
+    has.fast_strings = b & 1u << 9;
     has.avx2 = saves_ymm && (b & bit_AVX2);
     // The byte permutes (VBMI) came with the second generation, which no longer slows down for wide
     // integer code: the first generation is better served by AVX2.
@@ -76,29 +78,35 @@ cpu detect() { return {}; }
 
 #endif
 
-rows tables[size_t(target::count)];
+row_table tables[size_t(target::count)];
 bool available[size_t(target::count)];
 target best = target::scalar;
-pthread_once_t once = PTHREAD_ONCE_INIT;
-std::atomic<const rows *> live;
+std::atomic<const row_table *> live;
 
-void offer(target t, void (*const *fills)(rows &), size_t count) {
-    rows &table = tables[size_t(t)] = tables[size_t(target::scalar)];
-    for (size_t i = 0; i < count; i++) fills[i](table);
+// The rows of a target take the place of the scalar ones.
+row_table &add_table(target t) {
     available[size_t(t)] = true;
     best = t;
+    return tables[size_t(t)] = tables[size_t(target::scalar)];
 }
 
-#define FILL(family, area) fill_##area,
-#define OFFER(name)                                                 \
-    {                                                               \
-        using namespace name;                                       \
-        void (*const fills[])(rows &) = {SIMGP_AREAS(FILL)};        \
-        offer(target::name, fills, sizeof fills / sizeof fills[0]); \
+// Rows that suit the processor better than those of its instruction set in general.
+void fit(row_table &table, const cpu &has) {
+    if (has.fast_strings && table.mem.fill_with_strings)
+        table.mem.fill = table.mem.fill_with_strings;
+}
+
+#define FILL(area) fill_##area(table.area);
+#define OFFER(name)                                 \
+    {                                               \
+        using namespace name;                       \
+        row_table &table = add_table(target::name); \
+        SIMGP_AREAS(FILL)                           \
+        fit(table, has);                            \
     }
 
 void fill_tables() {
-    [[maybe_unused]] const cpu has = detect();
+    const cpu has = detect();
     OFFER(scalar)
 #ifdef SIMGP_HAVE_neon
     if (has.neon) OFFER(neon)
@@ -115,10 +123,21 @@ void fill_tables() {
     live.store(&tables[size_t(best)], std::memory_order_release);
 }
 
-#undef FILL
-#undef OFFER
+enum class progress : uint8_t { none, filling, done };
+std::atomic<progress> tables_are{progress::none};
 
-void ensure_tables() { pthread_once(&once, fill_tables); }
+// By whichever thread comes first; the others wait for the microsecond that it takes.
+void ensure_tables() {
+    progress now = tables_are.load(std::memory_order_acquire);
+    if (now == progress::none && tables_are.compare_exchange_strong(now, progress::filling)) {
+        fill_tables();
+        tables_are.store(now = progress::done, std::memory_order_release);
+    }
+    while (now != progress::done) {
+        sched_yield();
+        now = tables_are.load(std::memory_order_acquire);
+    }
+}
 
 }  // namespace
 
@@ -132,13 +151,13 @@ bool target_available(target t) {
     return available[size_t(t)];
 }
 
-const rows &rows_of(target t) {
+const row_table &rows_of(target t) {
     ensure_tables();
     return tables[size_t(t)];
 }
 
-const rows &live_rows() {
-    const rows *table = live.load(std::memory_order_acquire);
+const row_table &live_rows() {
+    const row_table *table = live.load(std::memory_order_acquire);
     if (!table) {
         ensure_tables();
         table = live.load(std::memory_order_acquire);
@@ -148,7 +167,7 @@ const rows &live_rows() {
 
 target live_target() { return target(&live_rows() - tables); }
 
-void force_rows(const rows *table) {
+void force_rows(const row_table *table) {
     ensure_tables();
     live.store(table ? table : &tables[size_t(best)], std::memory_order_release);
 }

@@ -1,0 +1,29 @@
+// The table of rows: every inner loop of the library, by area. Scalar rows define the results; each
+// instruction set has a table of its own, filled by its vector rows.
+#ifndef ROWS_TABLE_H
+#define ROWS_TABLE_H
+
+#include "rows/dither.h"
+#include "rows/keyframe.h"
+#include "rows/layout.h"
+#include "rows/mem.h"
+#include "rows/rgb2yuv.h"
+#include "rows/tile.h"
+#include "rows/yuv2rgb.h"
+
+namespace simgp {
+
+// A member for each area of the build's list (cmake/targets.cmake), under the area's name.
+struct row_table {
+    dither_rows dither;
+    keyframe_rows keyframe;
+    layout_rows layout;
+    mem_rows mem;
+    rgb2yuv_rows rgb2yuv;
+    tile_rows tile;
+    yuv2rgb_rows yuv2rgb;
+};
+
+}  // namespace simgp
+
+#endif

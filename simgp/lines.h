@@ -1,0 +1,48 @@
+// The lines of a plane.
+#ifndef SIMGP_LINES_H
+#define SIMGP_LINES_H
+
+#include <stddef.h>
+#include <stdint.h>
+#include <string.h>
+
+namespace simgp {
+
+// Of a plane that is not there, `first` is null, and so is every line.
+template <class Byte>
+struct plane_lines {
+    Byte *first;
+    ptrdiff_t stride;
+
+    Byte *line(ptrdiff_t y) const { return first ? first + y * stride : nullptr; }
+    Byte *fetch(ptrdiff_t y) const { return line(y); }  // as a source of lines, see walk.h
+    // The lines from byte x of line y on.
+    plane_lines from(ptrdiff_t x, ptrdiff_t y) const { return {line(y) + x, stride}; }
+
+    operator plane_lines<const Byte>() const { return {first, stride}; }
+};
+using lines = plane_lines<uint8_t>;
+using const_lines = plane_lines<const uint8_t>;
+
+// The lines of what a kernel gets as untyped memory.
+inline const_lines lines_of(const void *plane, ptrdiff_t stride) {
+    return {static_cast<const uint8_t *>(plane), stride};
+}
+inline lines lines_of(void *plane, ptrdiff_t stride) {
+    return {static_cast<uint8_t *>(plane), stride};
+}
+
+// Copies `height` lines of `width` bytes, which must not overlap. Lines without gaps are one.
+inline void copy_lines(const const_lines &src, const lines &dst, ptrdiff_t width,
+                       ptrdiff_t height) {
+    if (width < 1 || height < 1) return;
+    if (src.stride == width && dst.stride == width) {
+        width *= height;
+        height = 1;
+    }
+    for (ptrdiff_t y = 0; y < height; y++) memcpy(dst.line(y), src.line(y), size_t(width));
+}
+
+}  // namespace simgp
+
+#endif
