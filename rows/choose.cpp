@@ -122,6 +122,8 @@ void fill_tables() {
 #endif
     live.store(&tables[size_t(best)], std::memory_order_release);
 }
+#undef FILL
+#undef OFFER
 
 enum class progress : uint8_t { none, filling, done };
 std::atomic<progress> tables_are{progress::none};
