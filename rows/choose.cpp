@@ -125,7 +125,8 @@ void fill_tables() {
 #undef FILL
 #undef OFFER
 
-enum class progress : uint8_t { none, filling, done };
+// Of the size of an int: for smaller ones some processors have no atomic exchange, and GCC calls a library.
+enum class progress : int { none, filling, done };
 std::atomic<progress> tables_are{progress::none};
 
 // By whichever thread comes first; the others wait for the microsecond that it takes.
