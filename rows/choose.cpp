@@ -125,7 +125,7 @@ void fill_tables() {
 #undef FILL
 #undef OFFER
 
-// Of the size of an int: for smaller ones some processors have no atomic exchange, and GCC calls a library.
+// As large as an int: some processors have no atomic exchange of less, and GCC calls a library.
 enum class progress : int { none, filling, done };
 std::atomic<progress> tables_are{progress::none};
 
