@@ -98,7 +98,7 @@ class dithered_luma {
 };
 
 // The rule of the conversion without dithering.
-consteval yuv_rule rule_between(const format &from, const format &to) {
+constexpr yuv_rule rule_between(const format &from, const format &to) {
     yuv_rule found = yuv_rule::usual;
 #define LOOK(name, from_format, to_format, rule) \
     if (&from == &formats::from_format && &to == &formats::to_format) found = yuv_rule::rule;
