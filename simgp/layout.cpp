@@ -127,3 +127,4 @@ void simgp_csc_8b8b_unpck(const uint8_t *src, int32_t width, int32_t height, int
 #define DEFINE(name, from, to) \
     SIMGP_CSC_KERNEL(name, between_layouts<formats::from, formats::to>(args))
 SIMGP_LAYOUT_KERNELS(DEFINE)
+#undef DEFINE

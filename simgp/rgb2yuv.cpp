@@ -96,3 +96,4 @@ SIMGP_RGB_TO_YUV_KERNELS(DEFINE)
 #define DEFINE(name, from, to) \
     SIMGP_CSC_KERNEL(name, rgb_to_rgb565<formats::from, formats::to>(args))
 SIMGP_RGB_TO_RGB565_KERNELS(DEFINE)
+#undef DEFINE

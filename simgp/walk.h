@@ -12,7 +12,7 @@
 namespace simgp {
 
 // Whether some kernel needs a row, so that the tables have it.
-consteval bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, yuv_matrix matrix) {
+constexpr bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, yuv_matrix matrix) {
     bool found = false;
 #define LOOK(name, from, to, rule)                                                           \
     found |= formats::from.layout == layout && serves_two_rows(formats::from) == two_rows && \
