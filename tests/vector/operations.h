@@ -87,6 +87,9 @@ static const operation operations[] = {
     VECTOR("mul", u16, mul(a, b)),
     VECTOR("add_sat_u8", u8, add_sat_u8(a, b)),
     VECTOR("sub_sat_u8", u8, sub_sat_u8(a, b)),
+    VECTOR("add_u8", u8, add_u8(a, b)),
+    VECTOR("sub_u8", u8, sub_u8(a, b)),
+    VECTOR("half_u8", u8, half_u8(a)),
     VECTOR("greater, select", u8, select(greater(as_s16(as_u16(a)), as_s16(as_u16(b))), c, b)),
     MEMORY("greater, equal lanes", bytes, put(out, select(greater(s16(in, 0), s16(in, 0)), u8(in, 1), u8(in, 2)))),
     MEMORY("chain_before", 4 * bytes, chain_state state = chain_begin(in[-1] & 1);
@@ -129,6 +132,7 @@ static const operation operations[] = {
     VECTOR("zip_high 4", u8, zip_high<4>(a, b)),
     VECTOR("zip_low 8", u8, zip_low<8>(a, b)),
     VECTOR("zip_high 8", u8, zip_high<8>(a, b)),
+    VECTOR("blend_u32", u8, blend_u32(a, b)),
     VECTOR("shuffle", u8, shuffle(a, bit_and(b, set_u8(15)))),
     VECTOR("reverse_u8", u8, reverse_u8(a)),
     VECTOR("reverse_u16", u8, reverse_u16(a)),
