@@ -71,6 +71,7 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return _mm256_and_si256(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm256_or_si256(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm256_xor_si256(a, b); }
+inline u8v bit_not(u8v a) { return _mm256_xor_si256(a, _mm256_set1_epi8(-1)); }
 template <int N>
 inline u16v shl(u16v a) {
     static_assert(limits::shift<N>);

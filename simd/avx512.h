@@ -81,6 +81,9 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return _mm512_and_si512(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm512_or_si512(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm512_xor_si512(a, b); }
+// Of an exclusive or with ones GCC 12 makes a ternary operation whose first operand is whatever its
+// destination held: each round of a loop then waits for the one before.
+inline u8v bit_not(u8v a) { return _mm512_ternarylogic_epi32(a, a, a, 0x55); }
 template <int N>
 inline u16v shl(u16v a) {
     static_assert(limits::shift<N>);

@@ -142,6 +142,9 @@ inline u8v bit_or(u8v a, u8v b) {
 inline u8v bit_xor(u8v a, u8v b) {
     return make<u8v>([&](int i) { return a.lane[i] ^ b.lane[i]; });
 }
+inline u8v bit_not(u8v a) {
+    return make<u8v>([&](int i) { return ~a.lane[i]; });
+}
 inline u16v bit_and(u16v a, u16v b) {
     return make<u16v>([&](int i) { return a.lane[i] & b.lane[i]; });
 }

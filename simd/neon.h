@@ -55,6 +55,7 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return vandq_u8(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return vorrq_u8(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return veorq_u8(a, b); }
+inline u8v bit_not(u8v a) { return vmvnq_u8(a); }
 inline u16v bit_and(u16v a, u16v b) { return vandq_u16(a, b); }
 inline u16v bit_or(u16v a, u16v b) { return vorrq_u16(a, b); }
 template <int N>

@@ -57,6 +57,7 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return _mm_and_si128(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm_or_si128(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm_xor_si128(a, b); }
+inline u8v bit_not(u8v a) { return _mm_xor_si128(a, _mm_set1_epi8(-1)); }
 template <int N>
 inline u16v shl(u16v a) {
     static_assert(limits::shift<N>);

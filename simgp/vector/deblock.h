@@ -36,12 +36,11 @@ struct across {
 // at 255, for that is more than |step|. As t <= |step|, d1's parts are the smaller of t and those of
 // step.
 inline across filter(const across &v, u8v strength) {
-    const u8v ones = set_u8(255);
-    const u8v not_b = bit_xor(v.b, ones);
-    const u8v e = half_u8(avg_u8(v.a, bit_xor(v.d, ones)));     // + 64
+    const u8v not_b = bit_not(v.b);
+    const u8v e = half_u8(avg_u8(v.a, bit_not(v.d)));           // + 64
     const u8v even = bit_or(bit_xor(not_b, v.c), set_u8(254));  // 255 - parity
     const u8v x = avg_u8(v.c, not_b);
-    const u8v y = sub_u8(avg_u8(bit_xor(e, ones), even), set_u8(95));
+    const u8v y = sub_u8(avg_u8(bit_not(e), even), set_u8(95));
     const u8v up = sub_sat_u8(x, y), down = sub_sat_u8(y, x);              // of step
     const u8v size = bit_or(up, down), over = sub_sat_u8(size, strength);  // at most 160, 159
     const u8v t = sub_sat_u8(size, add_sat_u8(over, over));                // at most 160

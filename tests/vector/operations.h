@@ -70,6 +70,7 @@ static const operation operations[] = {
     VECTOR("bit_and u8", u8, bit_and(a, b)),
     VECTOR("bit_or u8", u8, bit_or(a, b)),
     VECTOR("bit_xor u8", u8, bit_xor(a, b)),
+    VECTOR("bit_not", u8, bit_not(a)),
     VECTOR("bit_and u16", u16, bit_and(a, b)),
     VECTOR("bit_or u16", u16, bit_or(a, b)),
     VECTOR("shl 1", u16, shl<1>(a)),
