@@ -122,8 +122,11 @@ void fill_tables() {
 #endif
     live.store(&tables[size_t(best)], std::memory_order_release);
 }
+#undef FILL
+#undef OFFER
 
-enum class progress : uint8_t { none, filling, done };
+// As large as an int: some processors have no atomic exchange of less, and GCC calls a library.
+enum class progress : int { none, filling, done };
 std::atomic<progress> tables_are{progress::none};
 
 // By whichever thread comes first; the others wait for the microsecond that it takes.
