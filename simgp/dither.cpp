@@ -97,17 +97,19 @@ class dithered_luma {
     ptrdiff_t final_ = 0;  // the rows before are
 };
 
-template <const format &, const format &>
-constexpr bool are_same = false;
-template <const format &F>
-constexpr bool are_same<F, F> = true;
+// GCC takes no addresses for constants where it looks for undefined behaviour.
+template <const format &A, const format &B>
+constexpr bool is_same_format = false;
+template <const format &A>
+constexpr bool is_same_format<A, A> = true;
 
 // The rule of the conversion without dithering.
 template <const format &From, const format &To>
-consteval yuv_rule rule_between() {
+constexpr yuv_rule rule_between() {
     yuv_rule found = yuv_rule::usual;
-#define LOOK(name, from, to, rule) \
-    if (are_same<From, formats::from> && are_same<To, formats::to>) found = yuv_rule::rule;
+#define LOOK(name, from, to, rule)                                              \
+    if (is_same_format<From, formats::from> && is_same_format<To, formats::to>) \
+        found = yuv_rule::rule;
     SIMGP_YUV_TO_RGB_KERNELS(LOOK)
 #undef LOOK
     return found;
