@@ -21,12 +21,12 @@ inline constexpr int64_t fetch_from = 1 << 19;
 // source. With even bytes the strides of src are those of the rows that are taken.
 //
 // Goes through the blocks of the destination row by row, from left to right: what is written of a
-// page stays together, and reading is the side that can be asked for ahead. The last blocks begin
-// early, where the plane allows it, to have a quarter of a side, or of bytes a quarter, half or all of it,
-// and move some samples again: that is quicker than what is odd.
+// page stays together, and reading is the side that can be asked for ahead. Where the plane allows
+// it, a last block begins early, to have at least a quarter of a side, and of bytes a quarter, half
+// or all of it: moving some samples again is quicker than an odd size.
 template <samples S>
 void transpose(const const_lines &src, ptrdiff_t columns, ptrdiff_t rows, const lines &dst) {
-    constexpr ptrdiff_t size = sample_size(S), gap = sample_gap(S), side = block_side(S);
+    constexpr ptrdiff_t size = sample_size<S>, gap = sample_gap<S>, side = block_side<S>;
     const auto fill_up = [](ptrdiff_t &start, ptrdiff_t &count, ptrdiff_t end) {
         if (end < side) return;
         ptrdiff_t full = side / 4;
@@ -64,7 +64,7 @@ template <samples S>
 void mirror(const const_lines &src, ptrdiff_t width, ptrdiff_t height, const lines &dst) {
     if (width < 1 || height < 1) return;
     reverse_row *const row = live_rows().rotate.reverse[size_t(S)];
-    const ptrdiff_t line = width * sample_size(S);
+    const ptrdiff_t line = width * sample_size<S>;
     if (src.stride == line && dst.stride == -line)
         return row(src.first, dst.line(height - 1), width * height);
     for (ptrdiff_t y = 0; y < height; y++) row(src.line(y), dst.line(y), width);

@@ -40,8 +40,8 @@ struct lines_ahead {
 // a time.
 template <samples S>
 struct transposition {
-    static constexpr int size = int(sample_size(S)), gap = int(sample_gap(S) / sample_size(S));
-    static constexpr ptrdiff_t side = block_side(S);
+    static constexpr int size = int(sample_size<S>), gap = int(sample_gap<S> / sample_size<S>);
+    static constexpr ptrdiff_t side = block_side<S>;
     static constexpr ptrdiff_t columns_of_square = 16 / size, rows_of_square = bytes / size;
     static constexpr int quads = int(columns_of_square / 4);  // of rows in a block of a vector
     static constexpr bool meets_in_registers = S == samples::words || registers == 32;
@@ -223,7 +223,7 @@ static u8v load_reversed(const uint8_t *p) {
 // samples again.
 template <samples S>
 static void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    constexpr ptrdiff_t size = sample_size(S);
+    constexpr ptrdiff_t size = sample_size<S>;
     const ptrdiff_t length = count * size;
     if (length < bytes) {
         for (ptrdiff_t i = 0; i < count; i++)
