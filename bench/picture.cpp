@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <map>
 
 extern "C" {
 #include <libavutil/log.h>
@@ -14,6 +15,7 @@ extern "C" {
 }
 
 #include "simgp/csc.h"
+#include "simgp/formats.h"
 
 namespace bench {
 namespace {
@@ -21,44 +23,62 @@ namespace {
 // A plane as a repeated group of bytes: Y U V R G B A, or w, W for the two bytes of a word of
 // 16-bit RGB.
 struct plane_shape {
-    const char *group;
+    std::string group;
     int group_pixels_log2, rows_log2;
 };
 struct format_shape {
-    int format;
-    const char *name;
-    AVPixelFormat swscale;
-    plane_shape planes[3];
+    const simgp::format *format;
+    std::vector<plane_shape> planes;
 };
 
-// clang-format off
-constexpr format_shape formats[] = {
-    {SIMGP_FMT_YUV400,   "yuv400",   AV_PIX_FMT_GRAY8,    {{"Y", 0, 0}}},
-    {SIMGP_FMT_YUV420,   "yuv420",   AV_PIX_FMT_YUV420P,  {{"Y", 0, 0}, {"U", 1, 1}, {"V", 1, 1}}},
-    {SIMGP_FMT_YUV422N,  "yuv422n",  AV_PIX_FMT_YUV422P,  {{"Y", 0, 0}, {"U", 1, 0}, {"V", 1, 0}}},
-    {SIMGP_FMT_YUV444,   "yuv444",   AV_PIX_FMT_YUV444P,  {{"Y", 0, 0}, {"U", 0, 0}, {"V", 0, 0}}},
-    {SIMGP_FMT_YV12,     "yv12",     AV_PIX_FMT_YUV420P,  {{"Y", 0, 0}, {"V", 1, 1}, {"U", 1, 1}}},
-    {SIMGP_FMT_YV16,     "yv16",     AV_PIX_FMT_YUV422P,  {{"Y", 0, 0}, {"V", 1, 0}, {"U", 1, 0}}},
-    {SIMGP_FMT_NV12,     "nv12",     AV_PIX_FMT_NV12,     {{"Y", 0, 0}, {"UV", 1, 1}}},
-    {SIMGP_FMT_NV21,     "nv21",     AV_PIX_FMT_NV21,     {{"Y", 0, 0}, {"VU", 1, 1}}},
-    {SIMGP_FMT_YUV422W,  "yuv422w",  AV_PIX_FMT_YUV440P,  {{"Y", 0, 0}, {"U", 0, 1}, {"V", 0, 1}}},
-    {SIMGP_FMT_T64X32,   "t64x32",   AV_PIX_FMT_NONE,     {{"Y", 0, 0}, {"UV", 1, 1}}},
-    {SIMGP_FMT_UYVY,     "uyvy",     AV_PIX_FMT_UYVY422,  {{"UYVY", 1, 0}}},
-    {SIMGP_FMT_YUYV,     "yuyv",     AV_PIX_FMT_YUYV422,  {{"YUYV", 1, 0}}},
-    {SIMGP_FMT_RGB565,   "rgb565",   AV_PIX_FMT_RGB565LE, {{"wW", 0, 0}}},
-    {SIMGP_FMT_BGR565,   "bgr565",   AV_PIX_FMT_BGR565LE, {{"wW", 0, 0}}},
-    {SIMGP_FMT_RGB888,   "rgb888",   AV_PIX_FMT_RGB24,    {{"RGB", 0, 0}}},
-    {SIMGP_FMT_BGR888,   "bgr888",   AV_PIX_FMT_BGR24,    {{"BGR", 0, 0}}},
-    {SIMGP_FMT_RGBA8888, "rgba8888", AV_PIX_FMT_RGBA,     {{"RGBA", 0, 0}}},
-    {SIMGP_FMT_BGRA8888, "bgra8888", AV_PIX_FMT_BGRA,     {{"BGRA", 0, 0}}},
-    {SIMGP_FMT_ARGB8888, "argb8888", AV_PIX_FMT_ARGB,     {{"ARGB", 0, 0}}},
-};
-// clang-format on
+format_shape shape_of(int code) {
+    const simgp::format *const f = simgp::find_format(code);
+    if (!f) fail("no such format: " + std::to_string(code));
+    format_shape shape{f, {}};
+    if (f->kind == simgp::format_kind::rgb) {
+        const simgp::pixel_bytes at = simgp::pixels_of[size_t(f->packing)];
+        std::string group = "wW";
+        if (at.size > 2) {
+            group.assign(size_t(at.size), 'A');
+            group[size_t(at.r)] = 'R', group[size_t(at.g)] = 'G', group[size_t(at.b)] = 'B';
+        }
+        shape.planes = {{group, 0, 0}};
+    } else if (f->kind == simgp::format_kind::packed) {
+        shape.planes = {{f->layout == simgp::yuv_layout::uyvy ? "UYVY" : "YUYV", 1, 0}};
+    } else {
+        shape.planes = {{"Y", 0, 0}};
+        for (int k = 1; k < f->planes; k++) {
+            const char *const group = f->u == f->v
+                                          ? f->layout == simgp::yuv_layout::vu ? "VU" : "UV"
+                                      : k == f->u ? "U"
+                                                  : "V";
+            shape.planes.push_back({group, f->x_shift[k], f->y_shift[k]});
+        }
+    }
+    return shape;
+}
 
-const format_shape &shape_of(int format) {
-    for (const format_shape &s : formats)
-        if (s.format == format) return s;
-    fail("no such format: " + std::to_string(format));
+std::string name_of(int code) { return shape_of(code).format->name; }
+bool blue_is_high(int code) {
+    const simgp::pixel_bytes at = simgp::pixels_of[size_t(simgp::find_format(code)->packing)];
+    return at.b > at.r;
+}
+
+// swscale's names.
+AVPixelFormat swscale_format(int code) {
+    static const std::map<int, AVPixelFormat> formats = {
+        {SIMGP_FMT_YUV400, AV_PIX_FMT_GRAY8},    {SIMGP_FMT_YUV420, AV_PIX_FMT_YUV420P},
+        {SIMGP_FMT_YUV422N, AV_PIX_FMT_YUV422P}, {SIMGP_FMT_YUV444, AV_PIX_FMT_YUV444P},
+        {SIMGP_FMT_YV12, AV_PIX_FMT_YUV420P},    {SIMGP_FMT_YV16, AV_PIX_FMT_YUV422P},
+        {SIMGP_FMT_NV12, AV_PIX_FMT_NV12},       {SIMGP_FMT_NV21, AV_PIX_FMT_NV21},
+        {SIMGP_FMT_YUV422W, AV_PIX_FMT_YUV440P}, {SIMGP_FMT_UYVY, AV_PIX_FMT_UYVY422},
+        {SIMGP_FMT_YUYV, AV_PIX_FMT_YUYV422},    {SIMGP_FMT_RGB565, AV_PIX_FMT_RGB565LE},
+        {SIMGP_FMT_BGR565, AV_PIX_FMT_BGR565LE}, {SIMGP_FMT_RGB888, AV_PIX_FMT_RGB24},
+        {SIMGP_FMT_BGR888, AV_PIX_FMT_BGR24},    {SIMGP_FMT_RGBA8888, AV_PIX_FMT_RGBA},
+        {SIMGP_FMT_BGRA8888, AV_PIX_FMT_BGRA},   {SIMGP_FMT_ARGB8888, AV_PIX_FMT_ARGB},
+    };
+    const auto found = formats.find(code);
+    return found == formats.end() ? AV_PIX_FMT_NONE : found->second;
 }
 
 // The value of a channel at (x, y), each 0 ... 1.
@@ -82,7 +102,7 @@ double channel(char name, double x, double y) {
 }
 
 int to_word(int format, int r, int g, int b) {
-    if (format == SIMGP_FMT_BGR565) std::swap(r, b);
+    if (blue_is_high(format)) std::swap(r, b);
     return r >> 3 << 11 | g >> 2 << 5 | b >> 3;
 }
 
@@ -92,7 +112,7 @@ void for_channels(int format, char name, const uint8_t *at, const F &f) {
     if (name == 'W') return;
     if (name != 'w') return f(name, *at);
     const int word = at[0] | at[1] << 8;
-    const bool bgr = format == SIMGP_FMT_BGR565;
+    const bool bgr = blue_is_high(format);
     f(bgr ? 'B' : 'R', (word >> 11) * 255 / 31);
     f('G', (word >> 5 & 63) * 255 / 63);
     f(bgr ? 'R' : 'B', (word & 31) * 255 / 31);
@@ -101,23 +121,26 @@ void for_channels(int format, char name, const uint8_t *at, const F &f) {
 // Calls f(name, byte, x, y), with x and y in 0 ... 1, for the bytes of all planes.
 template <class F>
 void for_bytes(const picture &p, const F &f) {
-    const format_shape &shape = shape_of(p.format);
-    for (int k = 0; k < 3 && shape.planes[k].group; k++) {
+    const format_shape shape = shape_of(p.format);
+    for (size_t k = 0; k < shape.planes.size(); k++) {
         const plane_shape &plane = shape.planes[k];
-        const int size = int(strlen(plane.group));
+        const int size = int(plane.group.size());
         const int groups =
             (p.width[0] + (1 << plane.group_pixels_log2) - 1) >> plane.group_pixels_log2;
         for (int y = 0; y < p.height[k]; y++) {
             uint8_t *line = p.plane[k] + ptrdiff_t(y) * p.stride[k];
             for (int g = 0; g < groups; g++)
                 for (int i = 0; i < size; i++)
-                    f(plane.group[i], line + g * size + i, double(g) / groups,
+                    f(plane.group[size_t(i)], line + g * size + i, double(g) / groups,
                       double(y) / p.height[k]);
         }
     }
 }
 
-bool v_before_u(int format) { return format == SIMGP_FMT_YV12 || format == SIMGP_FMT_YV16; }
+bool v_before_u(int code) {
+    const simgp::format &f = *simgp::find_format(code);
+    return f.v >= 0 && f.v < f.u;
+}
 
 simgp_img exchanged(simgp_img p) {
     std::swap(p.plane[1], p.plane[2]);
@@ -136,18 +159,18 @@ double microseconds(const std::function<void()> &f) {
 
 picture::picture(int format, int w, int h) : simgp_img{} {
     this->format = format;
-    const format_shape &shape = shape_of(format);
+    const format_shape shape = shape_of(format);
     size_t offsets[3] = {};
     bytes = 0;
-    for (int k = 0; k < 3 && shape.planes[k].group; k++) {
+    for (size_t k = 0; k < shape.planes.size(); k++) {
         const plane_shape &s = shape.planes[k];
         const int groups = (w + (1 << s.group_pixels_log2) - 1) >> s.group_pixels_log2;
         width[k] = k ? groups : w;
         height[k] = (h + (1 << s.rows_log2) - 1) >> s.rows_log2;
-        stride[k] = (groups * int(strlen(s.group)) + 63) & -64;
+        stride[k] = (groups * int(s.group.size()) + 63) & -64;
         offsets[k] = bytes;
         if (format == SIMGP_FMT_T64X32) {  // whole groups of four tiles
-            const size_t tile_rows = size_t(h / (k + 1) + 31) / 32;
+            const size_t tile_rows = size_t(h / int(k + 1) + 31) / 32;
             bytes += 8192 * (size_t(w + 127) / 128 * (tile_rows / 2) +
                              tile_rows % 2 * (size_t(w + 255) / 256));
         } else {
@@ -156,7 +179,7 @@ picture::picture(int format, int w, int h) : simgp_img{} {
     }
     memory.reset(static_cast<uint8_t *>(aligned_alloc(4096, (bytes + 4095) & ~size_t(4095))), free);
     memset(memory.get(), 0xA5, bytes);
-    for (int k = 0; k < 3 && shape.planes[k].group; k++) plane[k] = memory.get() + offsets[k];
+    for (size_t k = 0; k < shape.planes.size(); k++) plane[k] = memory.get() + offsets[k];
 }
 
 void paint(const picture &p) {
@@ -207,8 +230,8 @@ void expect_alike(const std::string &what, const picture &a, const picture &b, d
 
 simgp_img lines(const simgp_img &p, int y, int count) {
     simgp_img part = p;
-    const format_shape &shape = shape_of(p.format);
-    for (int k = 0; k < 3 && shape.planes[k].group; k++) {
+    const format_shape shape = shape_of(p.format);
+    for (size_t k = 0; k < shape.planes.size(); k++) {
         const int log2 = shape.planes[k].rows_log2;
         part.plane[k] += ptrdiff_t(y >> log2) * p.stride[k];
         part.height[k] = (count + (1 << log2) - 1) >> log2;
@@ -228,7 +251,7 @@ peer libyuv_peer(operation f) {
 }
 
 peer libyuv_peer(operation first, int between, operation second) {
-    return {std::string("libyuv via ") + shape_of(between).name,
+    return {std::string("libyuv via ") + name_of(between),
             [=](const simgp_img &s, const simgp_img &) -> operation {
                 constexpr int band = 8;
                 const picture temporary(between, s.width[0], band);
@@ -246,7 +269,7 @@ peer libyuv_peer(operation first, int between, operation second) {
 
 std::vector<peer> swscale_peer(int from, int to, int extra_flags, resizing how) {
     av_log_set_level(AV_LOG_ERROR);
-    const AVPixelFormat a = shape_of(from).swscale, b = shape_of(to).swscale;
+    const AVPixelFormat a = swscale_format(from), b = swscale_format(to);
     if (a == b && how == resizing::none) return {};
     if (!sws_isSupportedInput(a) || !sws_isSupportedOutput(b)) return {};
     const bool swap_src = v_before_u(from), swap_dst = v_before_u(to);
@@ -314,7 +337,7 @@ arena make_arena(const conversion &c, int from_format, const size &from, const s
 }  // namespace
 
 comparison compare(conversion c) {
-    if (c.name.empty()) c.name = std::string(shape_of(c.from).name) + "_to_" + shape_of(c.to).name;
+    if (c.name.empty()) c.name = name_of(c.from) + "_to_" + name_of(c.to);
     if (!c.ours)
         c.ours = [name = c.name](const simgp_img &s, const simgp_img &d) {
             if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
@@ -371,7 +394,7 @@ comparison compare(conversion c) {
         if (name == "1918x1078")
             twin("1080p", c.from, {1920, 1080}, 0.9);
         else if (c.twin_from >= 0)
-            twin(shape_of(c.twin_from).name, c.twin_from, from, usual ? 0.9 : 0);
+            twin(name_of(c.twin_from), c.twin_from, from, usual ? 0.9 : 0);
         return m;
     };
     return {c.name, c.sizes, make};

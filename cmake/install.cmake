@@ -1,23 +1,28 @@
-# Libraries, headers, CMake package and pkg-config file.
+# Libraries, headers, CMake package and pkg-config file. Components: runtime (the shared library), dev (what
+# compiling and linking needs) and tools.
 include(CMakePackageConfigHelpers)
 
-install(TARGETS simgp_shared simgp_static EXPORT simgp-targets)
+install(TARGETS ${libraries} EXPORT simgp-targets
+        LIBRARY COMPONENT runtime NAMELINK_COMPONENT dev
+        ARCHIVE COMPONENT dev)
 foreach(header IN LISTS SIMGP_PUBLIC_HEADERS)
   get_filename_component(folder ${header} DIRECTORY)
-  install(FILES ${header} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/${folder})
+  install(FILES ${header} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/${folder} COMPONENT dev)
 endforeach()
 
-set_target_properties(simgp_shared PROPERTIES EXPORT_NAME simgp)
+if(TARGET simgp_shared)
+  set_target_properties(simgp_shared PROPERTIES EXPORT_NAME simgp)
+endif()
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/simgp)
 if(NOT SIMGP_SANITIZE)
-  install(EXPORT simgp-targets NAMESPACE simgp:: DESTINATION ${package_dir})
+  install(EXPORT simgp-targets NAMESPACE simgp:: DESTINATION ${package_dir} COMPONENT dev)
 endif()
-file(WRITE ${PROJECT_BINARY_DIR}/simgp-config.cmake
-     "include(\${CMAKE_CURRENT_LIST_DIR}/simgp-targets.cmake)\n")
+configure_package_config_file(cmake/simgp-config.cmake.in ${PROJECT_BINARY_DIR}/simgp-config.cmake
+                              INSTALL_DESTINATION ${package_dir} NO_SET_AND_CHECK_MACRO)
 write_basic_package_version_file(${PROJECT_BINARY_DIR}/simgp-config-version.cmake
                                  COMPATIBILITY SameMajorVersion)
 install(FILES ${PROJECT_BINARY_DIR}/simgp-config.cmake ${PROJECT_BINARY_DIR}/simgp-config-version.cmake
-        DESTINATION ${package_dir})
+        DESTINATION ${package_dir} COMPONENT dev)
 
 # Found from where the file lies, so that the installed tree can be moved, unless folders are absolute.
 if(IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}" OR IS_ABSOLUTE "${CMAKE_INSTALL_INCLUDEDIR}")
@@ -32,4 +37,4 @@ else()
   set(pc_includedir "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}")
 endif()
 configure_file(cmake/simgp.pc.in ${PROJECT_BINARY_DIR}/simgp.pc @ONLY)
-install(FILES ${PROJECT_BINARY_DIR}/simgp.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+install(FILES ${PROJECT_BINARY_DIR}/simgp.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT dev)

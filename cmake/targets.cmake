@@ -1,8 +1,16 @@
 # The instruction sets that the processor family can have, and their compiler flags. Only the vector rows
 # are compiled with them; everything else is baseline code.
 set(SIMGP_TARGETS "")
-if(SIMGP_VECTOR)
-  string(TOLOWER "${CMAKE_SYSTEM_PROCESSOR}" processor)
+string(TOLOWER "${CMAKE_SYSTEM_PROCESSOR}" processor)
+# The vector layer counts on little-endian memory. The names are for compilers whose order CMake cannot tell.
+if(CMAKE_CXX_BYTE_ORDER STREQUAL "BIG_ENDIAN" OR processor MATCHES "^(aarch64_be|arm64_be|armeb|armv[0-9]+b)")
+  set(SIMGP_BIG_ENDIAN ON)
+else()
+  set(SIMGP_BIG_ENDIAN OFF)
+endif()
+if(SIMGP_VECTOR AND SIMGP_BIG_ENDIAN)
+  message(STATUS "simgp: '${CMAKE_SYSTEM_PROCESSOR}' is big-endian, scalar rows only")
+elseif(SIMGP_VECTOR)
   if(processor MATCHES "^(x86_64|amd64|i[3-6]86|x86)$")
     set(SIMGP_TARGETS sse41 avx2 avx512)
   elseif(processor MATCHES "^(aarch64|arm64)")

@@ -81,7 +81,7 @@ cpu detect() { return {}; }
 row_table tables[size_t(target::count)];
 bool available[size_t(target::count)];
 target best = target::scalar;
-std::atomic<const row_table *> live;
+std::atomic<const row_table *> live_table;
 
 // The rows of a target take the place of the scalar ones.
 row_table &add_table(target t) {
@@ -120,10 +120,13 @@ void fill_tables() {
 #ifdef SIMGP_HAVE_avx512
     if (has.avx512) OFFER(avx512)
 #endif
-    live.store(&tables[size_t(best)], std::memory_order_release);
+    live_table.store(&tables[size_t(best)], std::memory_order_release);
 }
+#undef FILL
+#undef OFFER
 
-enum class progress : uint8_t { none, filling, done };
+// As large as an int: some processors have no atomic exchange of less, and GCC calls a library.
+enum class progress : int { none, filling, done };
 std::atomic<progress> tables_are{progress::none};
 
 // By whichever thread comes first; the others wait for the microsecond that it takes.
@@ -157,10 +160,10 @@ const row_table &rows_of(target t) {
 }
 
 const row_table &live_rows() {
-    const row_table *table = live.load(std::memory_order_acquire);
+    const row_table *table = live_table.load(std::memory_order_acquire);
     if (!table) {
         ensure_tables();
-        table = live.load(std::memory_order_acquire);
+        table = live_table.load(std::memory_order_acquire);
     }
     return *table;
 }
@@ -169,7 +172,7 @@ target live_target() { return target(&live_rows() - tables); }
 
 void force_rows(const row_table *table) {
     ensure_tables();
-    live.store(table ? table : &tables[size_t(best)], std::memory_order_release);
+    live_table.store(table ? table : &tables[size_t(best)], std::memory_order_release);
 }
 
 }  // namespace simgp

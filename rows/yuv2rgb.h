@@ -29,8 +29,8 @@ struct yuv2rgb_rows {
         *pair[size_t(yuv_matrix::count)][size_t(yuv_layout::count)][size_t(rgb_packing::count)];
 };
 
-consteval bool serves_two_rows(const format &yuv) { return yuv.y_shift[yuv.u < 0 ? 0 : yuv.u]; }
-consteval yuv_matrix matrix_of(yuv_rule rule) {
+constexpr bool serves_two_rows(const format &yuv) { return yuv.y_shift[yuv.u < 0 ? 0 : yuv.u]; }
+constexpr yuv_matrix matrix_of(yuv_rule rule) {
     return rule == yuv_rule::coarse ? yuv_matrix::coarse : yuv_matrix::fine;
 }
 

@@ -98,7 +98,7 @@ class dithered_luma {
 };
 
 // The rule of the conversion without dithering.
-consteval yuv_rule rule_between(const format &from, const format &to) {
+constexpr yuv_rule rule_between(const format &from, const format &to) {
     yuv_rule found = yuv_rule::usual;
 #define LOOK(name, from_format, to_format, rule) \
     if (&from == &formats::from_format && &to == &formats::to_format) found = yuv_rule::rule;
@@ -150,7 +150,7 @@ void dither_and_convert(const csc_args &a) {
     X(yv12_to_bgr565_dither, YV12, BGR565)
 YV12_KERNELS(DEFINE)
 
-constexpr conversion conversions[] = {
+constexpr conversion dithered_conversions[] = {
     // clang-format off
     SIMGP_DITHER_KERNELS(SIMGP_CONVERSION)
     YV12_KERNELS(SIMGP_CONVERSION)
@@ -171,6 +171,7 @@ void dither_planes(const simgp_img &src, const simgp_img &dst) {
 using namespace simgp;
 
 SIMGP_DITHER_KERNELS(DEFINE)
+#undef DEFINE
 
 void simgp_dit_8b(const void *src, int32_t width, int32_t height, int32_t src_stride,
                   int32_t dst_stride, void *dst) {
@@ -186,5 +187,5 @@ int32_t simgp_csc_dither(const simgp_img *src, const simgp_img *dst) {
         dither_planes(*src, *dst);
         return SIMGP_OK;
     }
-    return convert_by(conversions, *src, *dst);
+    return convert_by(dithered_conversions, *src, *dst);
 }

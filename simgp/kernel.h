@@ -15,13 +15,10 @@ struct csc_args {
     uint8_t *const *dst_planes;
 };
 
-// The lines of a plane; of plane -1, those of none.
 inline const_lines src_lines(const csc_args &a, int plane) {
-    if (plane < 0) return {nullptr, 0};
     return {a.src_planes[plane], a.src_strides[plane]};
 }
 inline lines dst_lines(const csc_args &a, int plane) {
-    if (plane < 0) return {nullptr, 0};
     return {a.dst_planes[plane], a.dst_strides[plane]};
 }
 

@@ -101,8 +101,8 @@ void between_layouts(const csc_args &a) {
         simgp_plane_fn *const chroma = from_shift < to_shift   ? simgp_csc_1x2_to_1x1
                                        : from_shift > to_shift ? simgp_csc_1x1_to_1x2
                                                                : simgp_cpy_8b;
-        move(chroma, From.u, To.u);
-        move(chroma, From.v, To.v);
+        move(chroma, 1, From.u == 1 ? To.u : To.v);
+        move(chroma, 2, From.u == 2 ? To.u : To.v);
     }
 }
 
@@ -127,3 +127,4 @@ void simgp_csc_8b8b_unpck(const uint8_t *src, int32_t width, int32_t height, int
 #define DEFINE(name, from, to) \
     SIMGP_CSC_KERNEL(name, between_layouts<formats::from, formats::to>(args))
 SIMGP_LAYOUT_KERNELS(DEFINE)
+#undef DEFINE

@@ -8,13 +8,12 @@
 
 namespace simgp {
 
-// Of a plane that is not there, `first` is null, and so is every line.
 template <class Byte>
 struct plane_lines {
     Byte *first;
     ptrdiff_t stride;
 
-    Byte *line(ptrdiff_t y) const { return first ? first + y * stride : nullptr; }
+    Byte *line(ptrdiff_t y) const { return first + y * stride; }
     Byte *fetch(ptrdiff_t y) const { return line(y); }  // as a source of lines, see walk.h
     // The lines from byte x of line y on.
     plane_lines from(ptrdiff_t x, ptrdiff_t y) const { return {line(y) + x, stride}; }

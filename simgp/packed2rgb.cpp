@@ -21,3 +21,4 @@ void packed_to_rgb(const csc_args &a) {
 #define DEFINE(name, from, to, rule) \
     SIMGP_CSC_KERNEL(name, packed_to_rgb<formats::from, formats::to>(args))
 SIMGP_PACKED_TO_RGB_KERNELS(DEFINE)
+#undef DEFINE

@@ -70,8 +70,7 @@ void rgb_to_yuv(const csc_args &a) {
     rgb_to_yuv_row *const with_chroma = to_layout[size_t(To.layout)];
     rgb_to_yuv_row *const luma_only = to_layout[size_t(yuv_layout::grey)];
     const const_lines in = whole_pixel_lines(src_lines(a, 0), From.bytes[0]);
-    const lines luma = dst_lines(a, 0), u = dst_lines(a, To.u),
-                v = dst_lines(a, To.v == To.u ? -1 : To.v);
+    const lines luma = dst_lines(a, 0), u = dst_lines(a, To.u), v = dst_lines(a, To.v);
     for (ptrdiff_t y = 0; y < height; y++) {
         const bool chroma = !(y & 1) && y + 1 < height;
         (chroma ? with_chroma : luma_only)(in.line(y), luma.line(y), u.line(y >> 1), v.line(y >> 1),
@@ -97,3 +96,4 @@ SIMGP_RGB_TO_YUV_KERNELS(DEFINE)
 #define DEFINE(name, from, to) \
     SIMGP_CSC_KERNEL(name, rgb_to_rgb565<formats::from, formats::to>(args))
 SIMGP_RGB_TO_RGB565_KERNELS(DEFINE)
+#undef DEFINE

@@ -77,36 +77,36 @@ void for_each_tile(ptrdiff_t width, ptrdiff_t height, F f) {
 bool is_whole(const block &b) { return b.width == tile_width; }
 
 void copy_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, const lines &dst) {
-    const tile_rows &live = live_rows().tile;
+    const tile_rows &table = live_rows().tile;
     for_each_tile(width, height, [&](const block &b, ptrdiff_t offset) {
         const lines to = dst.from(b.x, b.y);
-        if (is_whole(b)) return live.detile(src + offset, to.first, to.stride, b.height);
+        if (is_whole(b)) return table.detile(src + offset, to.first, to.stride, b.height);
         copy_lines({src + offset, tile_width}, to, b.width, b.height);
     });
 }
 
 void copy_from_linear(const const_lines &src, ptrdiff_t width, ptrdiff_t height, uint8_t *dst) {
-    const tile_rows &live = live_rows().tile;
+    const tile_rows &table = live_rows().tile;
     for_each_tile(width, height, [&](const block &b, ptrdiff_t offset) {
         const const_lines from = src.from(b.x, b.y);
-        if (is_whole(b)) return live.entile(from.first, from.stride, dst + offset, b.height);
+        if (is_whole(b)) return table.entile(from.first, from.stride, dst + offset, b.height);
         copy_lines(from, {dst + offset, tile_width}, b.width, b.height);
     });
 }
 
 void unpack_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, const lines &u,
                       const lines &v) {
-    const row_table &live = live_rows();
+    const row_table &table = live_rows();
     for_each_tile(width, height, [&](const block &b, ptrdiff_t offset) {
         const uint8_t *const tile = src + offset;
         const lines to_u = u.from(b.x / 2, b.y), to_v = v.from(b.x / 2, b.y);
         if (is_whole(b))
-            return live.tile.detile_unpack(tile, to_u.first, u.stride, to_v.first, v.stride,
-                                           b.height);
+            return table.tile.detile_unpack(tile, to_u.first, u.stride, to_v.first, v.stride,
+                                            b.height);
         const ptrdiff_t pairs = b.width / 2;
         for (ptrdiff_t r = 0; r < b.height; r++) {
             const uint8_t *const from = tile + tile_width * r;
-            if (pairs > 0) live.layout.unpack(from, to_u.line(r), to_v.line(r), pairs);
+            if (pairs > 0) table.layout.unpack(from, to_u.line(r), to_v.line(r), pairs);
             if (b.width & 1) to_u.line(r)[pairs] = from[2 * pairs];
         }
     });
@@ -114,16 +114,16 @@ void unpack_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, con
 
 void pack_from_linear(const const_lines &u, const const_lines &v, ptrdiff_t width, ptrdiff_t height,
                       uint8_t *dst) {
-    const row_table &live = live_rows();
+    const row_table &table = live_rows();
     for_each_tile(width, height, [&](const block &b, ptrdiff_t offset) {
         const const_lines from_u = u.from(b.x / 2, b.y), from_v = v.from(b.x / 2, b.y);
         uint8_t *const tile = dst + offset;
         if (is_whole(b))
-            return live.tile.entile_pack(from_u.first, u.stride, from_v.first, v.stride, tile,
-                                         b.height);
+            return table.tile.entile_pack(from_u.first, u.stride, from_v.first, v.stride, tile,
+                                          b.height);
         for (ptrdiff_t r = 0; r < b.height; r++)
-            live.layout.pack(from_u.line(r), from_v.line(r), tile + tile_width * r,
-                             (b.width + 1) / 2);
+            table.layout.pack(from_u.line(r), from_v.line(r), tile + tile_width * r,
+                              (b.width + 1) / 2);
     });
 }
 
@@ -220,3 +220,4 @@ SIMGP_TILE_TO_RGB_KERNELS(DEFINE)
 #define DEFINE(name, from, to) \
     SIMGP_CSC_KERNEL(name, between_tiles<formats::from, formats::to>(args))
 SIMGP_TILE_KERNELS(DEFINE)
+#undef DEFINE

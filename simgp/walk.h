@@ -12,7 +12,7 @@
 namespace simgp {
 
 // Whether some kernel needs a row, so that the tables have it.
-consteval bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, yuv_matrix matrix) {
+constexpr bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, yuv_matrix matrix) {
     bool found = false;
 #define LOOK(name, from, to, rule)                                                           \
     found |= formats::from.layout == layout && serves_two_rows(formats::from) == two_rows && \
@@ -75,8 +75,9 @@ void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_spa
 template <const format &From, const format &To, yuv_rule Rule, class Luma>
 void convert_to_rgb(const csc_args &a, Luma &&luma) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
-    walk_yuv_to_rgb<From, To, Rule>(luma, src_lines(a, From.u),
-                                    src_lines(a, From.u == From.v ? -1 : From.v), dst_lines(a, 0),
+    // Rows do not look at the planes that their layout does not use.
+    constexpr int u = From.u < 0 ? 0 : From.u, v = From.v < 0 ? 0 : From.v;
+    walk_yuv_to_rgb<From, To, Rule>(luma, src_lines(a, u), src_lines(a, v), dst_lines(a, 0),
                                     {0, width, height}, lead_of(Rule, width, height));
 }
 

@@ -47,3 +47,4 @@ using namespace simgp;
     SIMGP_CSC_KERNEL(name, convert_to_rgb<formats::from, formats::to, yuv_rule::rule>( \
                                args, src_lines(args, 0)))
 SIMGP_YUV_TO_RGB_KERNELS(DEFINE)
+#undef DEFINE

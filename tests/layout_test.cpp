@@ -31,10 +31,11 @@ TEST(layout, every_kernel_at_every_size_on_every_target) {
                 rig::call(k.run, src, dst);
             };
             j.reference = [=](const rig::picture &src, const rig::picture &dst) {
+                static constexpr channel both[] = {channel::u, channel::v};
                 for (int y = 0; y < h; y++) std::copy_n(src.row(0, y), w, dst.row(0, y));
                 for (int row = 0; row < chroma_rows; row++)  // a row is for pixels from below * row
                     for (int x = 0; x < w; x++)
-                        for (channel c : {channel::u, channel::v})
+                        for (channel c : both)
                             *sample(dst, to, c, x, below * row) =
                                 *sample(src, from, c, x, below * row);
             };

@@ -1,21 +1,45 @@
 # Installs to a temporary prefix and builds a C program against the CMake package, shared and static, and
-# through pkg-config; each must convert a pixel.
+# through pkg-config; each must convert a pixel. The tools run from there.
 . "$(dirname "$0")/gate.sh" "$1"
 
-prefix=$scratch/prefix
-"$cmake" --install "$build_dir" --prefix "$prefix" >"$scratch/log" 2>&1 || {
-    cat "$scratch/log"
-    exit 1
+install_to() { # FOLDER [ARG ...]
+    "$cmake" --install "$build_dir" --prefix "$scratch/$1" "${@:2}" >"$scratch/log" 2>&1 || {
+        cat "$scratch/log"
+        exit 1
+    }
 }
+install_to first
+# The whole tree can be moved.
+prefix=$scratch/prefix
+mv "$scratch/first" "$prefix"
 user=$source_dir/tests/package/user
 
 # Another place than the one it was configured for, with nothing pointing back to the sources.
 backward=$(grep -rIlF -e "$source_dir" -e "$build_dir" "$prefix")
 [ -z "$backward" ] || fault "Installed files name the source or build folder:" "$backward"
 
-"$cmake" -G "$generator" -S "$user" -B "$scratch/user" -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_FIND_ROOT_PATH="$prefix" \
-    ${toolchain:+-DCMAKE_TOOLCHAIN_FILE="$toolchain"} -DCMAKE_C_COMPILER="$cc" >"$scratch/log" 2>&1 &&
-    "$cmake" --build "$scratch/user" >>"$scratch/log" 2>&1 || {
+# Each component has what its name says, and together they are everything.
+files() { (cd "$scratch/$1" && find . ! -type d | sort); }
+for component in runtime dev tools; do install_to $component --component $component; done
+expected='libsimgp\.so\.[0-9.]*$'
+[ -n "$(files runtime)" ] && ! files runtime | grep -vqE "/$expected" || fault "Component runtime has:" "$(files runtime)"
+! files dev | grep -qE "/bin/|/$expected" || fault "Component dev has:" "$(files dev)"
+[ "$(files tools | xargs -rn 1 basename | xargs)" = "$(xargs <<<"$tools")" ] ||
+    fault "Component tools has:" "$(files tools)"
+rest=$(comm -3 <(files prefix) <({ files runtime && files dev && files tools; } | sort))
+[ -z "$rest" ] || fault "In no component, or in two:" "$rest"
+
+for tool in $tools; do
+    $emulator "$prefix/bin/$tool" --help >/dev/null || fault "$tool does not run where it is installed."
+    ldd "$prefix/bin/$tool" | grep -q "libsimgp.* => $prefix/" ||
+        fault "$tool takes the library from elsewhere:" "$(ldd "$prefix/bin/$tool" | grep libsimgp)"
+done
+
+configure_user() { # FOLDER [ARG ...]
+    "$cmake" -G "$generator" -S "$user" -B "$scratch/$1" -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_FIND_ROOT_PATH="$prefix" \
+        ${toolchain:+-DCMAKE_TOOLCHAIN_FILE="$toolchain"} -DCMAKE_C_COMPILER="$cc" "${@:2}" >"$scratch/log" 2>&1
+}
+configure_user user && "$cmake" --build "$scratch/user" >>"$scratch/log" 2>&1 || {
     cat "$scratch/log"
     exit 1
 }
@@ -23,6 +47,7 @@ for program in user_shared user_static; do
     # shellcheck disable=SC2086
     $emulator "$scratch/user/$program" || fault "$program, built with find_package, failed."
 done
+configure_user refused -DCOMPONENTS=nonsense && fault "The package has a component 'nonsense'."
 
 if command -v pkg-config >/dev/null; then
     PKG_CONFIG_PATH=$(dirname "$(find "$prefix" -name simgp.pc)")

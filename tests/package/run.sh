@@ -1,0 +1,43 @@
+# ./run builds where SIMGP_BUILD_DIR says, keeps what was said in a log, and shows its progress on a terminal
+# alone. Stand-ins for cmake and the package manager make it quick.
+. "$(dirname "$0")/gate.sh" "$1"
+
+command -v script >/dev/null || skip "script is missing (Debian: bsdutils)."
+mkdir "$scratch/bin" "$scratch/elsewhere"
+cat >"$scratch/bin/cmake" <<'END'
+#!/bin/bash
+case $1 in
+    --preset) printf '%s\n' "$@" | grep -x -A 1 -e -B | tail -n 1 >>"$SEEN" ;;
+    --build)
+        echo "[1/2] Building first"
+        echo "[2/2] Building second"
+        echo "a remark"
+        mkdir -p "$2/bench"
+        printf '#!/bin/sh\necho measured "$@"\n' >"$2/bench/simgp-bench"
+        chmod +x "$2/bench/simgp-bench"
+        [ -z "${BREAK:-}" ] || { echo "error: broken"; exit 1; }
+        ;;
+esac
+END
+printf '#!/bin/sh\necho installed\n' >"$scratch/bin/dpkg-query"
+chmod +x "$scratch"/bin/*
+export PATH=$scratch/bin:$PATH SEEN=$scratch/seen
+
+# From another folder, to one named from there.
+cd "$scratch" || exit 1
+said=$(SIMGP_BUILD_DIR=elsewhere "$source_dir/run" bench some thing 2>&1)
+[ "$said" = "Building simgp-bench
+measured some thing" ] || fault "Not on a terminal, ./run bench said:" "$said"
+grep -q 'a remark' elsewhere/bench/build.log || fault "There is no build log in SIMGP_BUILD_DIR."
+grep -qxF "$scratch/elsewhere/bench" "$SEEN" || fault "CMake was asked to build elsewhere:" "$(cat "$SEEN")"
+
+rm elsewhere/bench/build.log
+said=$(SIMGP_BUILD_DIR=$scratch/elsewhere script -qec "'$source_dir/run' bench" /dev/null 2>&1)
+grep -q '\[1/2\] Building first' <<<"$said" || fault "No progress is shown on a terminal."
+! grep -q 'a remark' <<<"$said" || fault "More than the progress is shown on a terminal."
+grep -q '\[2/2\] Building second' elsewhere/bench/build.log || fault "On a terminal there is no build log."
+
+BREAK=yes SIMGP_BUILD_DIR=elsewhere script -qec "'$source_dir/run' bench" /dev/null >"$scratch/log" 2>&1 &&
+    fault "On a terminal, a build that failed went unnoticed."
+grep -q 'error: broken' "$scratch/log" || fault "On a terminal, a build failed without a word."
+finish
