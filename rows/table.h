@@ -8,6 +8,7 @@
 #include "rows/layout.h"
 #include "rows/mem.h"
 #include "rows/rgb2yuv.h"
+#include "rows/rotate.h"
 #include "rows/tile.h"
 #include "rows/yuv2rgb.h"
 
@@ -20,6 +21,7 @@ struct row_table {
     layout_rows layout;
     mem_rows mem;
     rgb2yuv_rows rgb2yuv;
+    rotate_rows rotate;
     tile_rows tile;
     yuv2rgb_rows yuv2rgb;
 };
