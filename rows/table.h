@@ -7,6 +7,7 @@
 #include "rows/keyframe.h"
 #include "rows/layout.h"
 #include "rows/mem.h"
+#include "rows/resize.h"
 #include "rows/rgb2yuv.h"
 #include "rows/tile.h"
 #include "rows/yuv2rgb.h"
@@ -19,6 +20,7 @@ struct row_table {
     keyframe_rows keyframe;
     layout_rows layout;
     mem_rows mem;
+    resize_rows resize;
     rgb2yuv_rows rgb2yuv;
     tile_rows tile;
     yuv2rgb_rows yuv2rgb;

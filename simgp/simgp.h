@@ -48,6 +48,7 @@
 #include "simgp/img.h"
 #include "simgp/layout.h"
 #include "simgp/packed2rgb.h"
+#include "simgp/resize.h"
 #include "simgp/rgb2yuv.h"
 #include "simgp/tile.h"
 #include "simgp/yuv2rgb.h"
