@@ -39,6 +39,7 @@ set(SIMGP_AREAS
   scmn/mem
   simgp/dither
   simgp/layout
+  simgp/resize
   simgp/rgb2yuv
   simgp/rotate
   simgp/tile
