@@ -36,8 +36,8 @@
  * pictures, simgp_plane_fn on one plane (both in img.h).
  *
  * Names give the operation and then the formats in the direction of the data:
- * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dit
- * dithering, rot turns and mirrors, rsz resizing.
+ * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dbf8x8
+ * deblocking, dit dithering, rot turns and mirrors, rsz resizing.
  */
 #ifndef SIMGP_SIMGP_H
 #define SIMGP_SIMGP_H
@@ -45,6 +45,7 @@
 #include "simgp/copy.h"
 #include "simgp/csc.h"
 #include "simgp/csc_rot.h"
+#include "simgp/deblock.h"
 #include "simgp/dither.h"
 #include "simgp/img.h"
 #include "simgp/layout.h"
