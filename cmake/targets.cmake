@@ -41,6 +41,7 @@ set(SIMGP_AREAS
   simgp/dither
   simgp/layout
   simgp/rgb2yuv
+  simgp/rotate
   simgp/tile
   simgp/yuv2rgb)
 set(area_macro "#define SIMGP_AREAS(X)")

@@ -9,6 +9,7 @@
 #include "rows/layout.h"
 #include "rows/mem.h"
 #include "rows/rgb2yuv.h"
+#include "rows/rotate.h"
 #include "rows/tile.h"
 #include "rows/yuv2rgb.h"
 
@@ -22,6 +23,7 @@ struct row_table {
     layout_rows layout;
     mem_rows mem;
     rgb2yuv_rows rgb2yuv;
+    rotate_rows rotate;
     tile_rows tile;
     yuv2rgb_rows yuv2rgb;
 };

@@ -37,19 +37,22 @@
  *
  * Names give the operation and then the formats in the direction of the data:
  * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dbf8x8
- * deblocking, dit dithering.
+ * deblocking, dit dithering, rot turns and mirrors, rsz resizing.
  */
 #ifndef SIMGP_SIMGP_H
 #define SIMGP_SIMGP_H
 
 #include "simgp/copy.h"
 #include "simgp/csc.h"
+#include "simgp/csc_rot.h"
 #include "simgp/deblock.h"
 #include "simgp/dither.h"
 #include "simgp/img.h"
 #include "simgp/layout.h"
 #include "simgp/packed2rgb.h"
+#include "simgp/resize_rot.h"
 #include "simgp/rgb2yuv.h"
+#include "simgp/rotate.h"
 #include "simgp/tile.h"
 #include "simgp/yuv2rgb.h"
 
