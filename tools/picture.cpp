@@ -52,6 +52,7 @@ constexpr auto table = [] {
 }();
 
 int even(int n) { return n + (n & 1); }
+int whole_fours(int n) { return (n + 3) & ~3; }
 int shifted_up(int n, int shift) { return (n + (1 << shift) - 1) >> shift; }
 
 // As simgp/tile.h says: whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one,
@@ -138,8 +139,8 @@ picture::picture(const picture_shape &shape) : shape_(shape) {
         }
         lines_[k] = shifted_up(height(), p.y_shift);
         line_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
-        stride_[k] = ptrdiff_t(shifted_up(even(width()), p.x_shift)) * p.bytes;
-        total += size_t(stride_[k]) * shifted_up(even(height()), p.y_shift);
+        stride_[k] = ptrdiff_t(shifted_up(whole_fours(width()), p.x_shift)) * p.bytes;
+        total += size_t(stride_[k]) * shifted_up(whole_fours(height()), p.y_shift);
     }
     memory_.resize(total);
 }

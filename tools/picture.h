@@ -72,8 +72,8 @@ void check_size(int64_t width, int64_t height, const std::string &where);
 // Reads "640x480", anything else ends in a fault; `what` names the text in it.
 void parse_size(std::string_view text, const std::string &what, int &width, int &height);
 
-// A picture in memory. Lines and columns are allocated up to the next even number, so that the
-// chroma of the last odd column and line always has the pixels that it belongs to.
+// A picture in memory. Lines and columns are allocated up to the next multiple of four, so that a
+// last odd column and line, of luma and of chroma, can always be taken for the first of a pair.
 class picture {
   public:
     picture() = default;
