@@ -11,11 +11,14 @@ namespace simgp {
 enum class samples : uint8_t { bytes, words, even_bytes, count };
 
 // The bytes of a sample, and from one to the next in the source.
-consteval ptrdiff_t sample_size(samples s) { return s == samples::words ? 2 : 1; }
-consteval ptrdiff_t sample_gap(samples s) { return s == samples::bytes ? 1 : 2; }
+template <samples S>
+inline constexpr ptrdiff_t sample_size = S == samples::words ? 2 : 1;
+template <samples S>
+inline constexpr ptrdiff_t sample_gap = S == samples::bytes ? 1 : 2;
 
 // The largest block has this many columns, and as many rows: a cache line of samples.
-consteval ptrdiff_t block_side(samples s) { return 64 / sample_size(s); }
+template <samples S>
+inline constexpr ptrdiff_t block_side = 64 / sample_size<S>;
 
 // Transposes a block: sample x of row y of src becomes sample y of row x of dst. There are 1 to
 // block_side columns x, and as many rows y. Strides may be negative; src and dst share no memory.

@@ -6,8 +6,8 @@
 
 SIMGP_BEGIN_DECLS
 
-/* Converts a picture of planar 4:2:2 to 4:2:0 and turns it as `rot` says. Luma is turned; of chroma,
- * rows 0, 2, 4, ... are kept, and turned.
+/* Converts a picture of planar 4:2:2 to 4:2:0 and turns it as `rot` says. Luma is turned. Of
+ * chroma, rows 0, 2, 4, ... are kept and turned.
  *
  *   src   the source: format, and of planes 0 to 2 width[], height[], stride[] and plane[] are read
  *   rot   SIMGP_ROT_NONE, SIMGP_ROT_90L or SIMGP_ROT_90R (img.h)

@@ -14,13 +14,13 @@ void transpose(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst, ptrdiff_t
                ptrdiff_t columns, ptrdiff_t rows, ptrdiff_t) {
     for (ptrdiff_t x = 0; x < columns; x++)
         for (ptrdiff_t y = 0; y < rows; y++)
-            memcpy(dst + x * dst_stride + y * sample_size(S),
-                   src + y * src_stride + x * sample_gap(S), size_t(sample_size(S)));
+            memcpy(dst + x * dst_stride + y * sample_size<S>,
+                   src + y * src_stride + x * sample_gap<S>, size_t(sample_size<S>));
 }
 
 template <samples S>
 void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    constexpr ptrdiff_t size = sample_size(S);
+    constexpr ptrdiff_t size = sample_size<S>;
     for (ptrdiff_t i = 0; i < count; i++)
         memcpy(dst + i * size, src + (count - 1 - i) * size, size_t(size));
 }
@@ -57,7 +57,7 @@ void mirror_across(const plane_args &a) {
 }
 template <samples S>
 void mirror_down(const plane_args &a) {
-    copy_lines(a.src, a.dst.upside_down(a.height), a.width * sample_size(S), a.height);
+    copy_lines(a.src, a.dst.upside_down(a.height), a.width * sample_size<S>, a.height);
 }
 
 }  // namespace

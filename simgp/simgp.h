@@ -51,6 +51,7 @@
 #include "simgp/layout.h"
 #include "simgp/packed2rgb.h"
 #include "simgp/resize.h"
+#include "simgp/resize_csc.h"
 #include "simgp/resize_rot.h"
 #include "simgp/rgb2yuv.h"
 #include "simgp/rotate.h"

@@ -40,8 +40,8 @@ struct lines_ahead {
 // a time.
 template <samples S>
 struct transposition {
-    static constexpr int size = int(sample_size(S)), gap = int(sample_gap(S) / sample_size(S));
-    static constexpr ptrdiff_t side = block_side(S);
+    static constexpr int size = int(sample_size<S>), gap = int(sample_gap<S> / sample_size<S>);
+    static constexpr ptrdiff_t side = block_side<S>;
     static constexpr ptrdiff_t columns_of_square = 16 / size, rows_of_square = bytes / size;
     static constexpr int quads = int(columns_of_square / 4);  // of rows in a block of a vector
     static constexpr bool meets_in_registers = S == samples::words || registers == 32;
@@ -49,9 +49,9 @@ struct transposition {
     // [columns 4 k / size ...][rows 4 q ... 4 q + 3]
     using square = u8v[4][quads];
 
-    // Quad q of the square, from four rows of which the first is p; blocks lie `step` bytes apart.
-    static void collect(square &to, int q, const uint8_t *p, ptrdiff_t stride, ptrdiff_t step) {
-        const auto row = [=](int r, int x) { return load_blocks(p + r * stride + x, step); };
+    // Quad q of the square; row(r, x) loads row r of the four from byte x on.
+    template <class Row>
+    static void collect(square &to, int q, Row row) {
         u8v lo01, hi01, lo23, hi23;
         if constexpr (S == samples::even_bytes) {
             // Bytes 0, 2, ... 14 and 16, 18, ... 30, these from the upper halves of words that begin
@@ -118,9 +118,12 @@ struct transposition {
                     for (int q = 0; q < quads; q++) {
                         if (next) ahead.fetch(int(side) / steps);
                         const uint8_t *const line = src + (y(j) + 4 * q) * src_stride;
-                        for (int i = 0; i < Across && more(i); i++)
-                            collect(between[i][j], q, line + x(i) * gap * size, src_stride,
-                                    wide * src_stride);
+                        for (int i = 0; i < Across && more(i); i++) {
+                            const uint8_t *const p = line + x(i) * gap * size;
+                            collect(between[i][j], q, [=](int r, int at) {
+                                return load_blocks(p + r * src_stride + at, wide * src_stride);
+                            });
+                        }
                     }
                 for (int i = 0; i < Across && more(i); i++)
                     for (int j = 0; j < Down && below(j); j++) {
@@ -152,9 +155,13 @@ struct transposition {
         for (ptrdiff_t c = 0; c * wide < columns; c++) {
             const ptrdiff_t x = start(c, wide, columns);
             square between;
-            for (int q = 0; q < quads; q++)
-                collect(between, q, src + x * gap * size + 4 * q * src_stride, src_stride,
-                        16 * gap);
+            for (int q = 0; q < quads; q++) {
+                const uint8_t *const p = src + 4 * q * src_stride + x * gap * size;
+                collect(between, q, [=](int r, int at) {
+                    const uint8_t *const from = p + r * src_stride + at;
+                    return gap == 1 ? load(from) : load_blocks(from, 16 * gap);
+                });
+            }
             place(between, [=](int k, u8v v) {
                 store_blocks(dst + (x + k) * dst_stride, columns_of_square * dst_stride, v);
             });
@@ -216,7 +223,7 @@ static u8v load_reversed(const uint8_t *p) {
 // samples again.
 template <samples S>
 static void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    constexpr ptrdiff_t size = sample_size(S);
+    constexpr ptrdiff_t size = sample_size<S>;
     const ptrdiff_t length = count * size;
     if (length < bytes) {
         for (ptrdiff_t i = 0; i < count; i++)
