@@ -103,6 +103,7 @@ using namespace simgp;
 DEBLOCK_KERNEL(simgp_dbf8x8, edges::both, at_most(12, strength))
 DEBLOCK_KERNEL(simgp_dbf8x8_h263_hor, edges::horizontal, strength)
 DEBLOCK_KERNEL(simgp_dbf8x8_h263_ver, edges::vertical, strength)
+#undef DEBLOCK_KERNEL
 
 int32_t simgp_dbf8x8_yuv(const simgp_img *img, int16_t strength) {
     if (strength < 0 || strength > 15) return SIMGP_ERR_PARAM;

@@ -18,8 +18,8 @@ SIMGP_BEGIN_DECLS
  *     A' = A - d2    B' = B + d1    C' = C - d1    D' = D + d2
  *
  * where B' and C' are limited to 0 ... 255; A' and D' never leave that range. With s = 4, 100 100 |
- * 112 112 becomes 102 104 | 108 110, and 50 50 | 150 150 stays. With s = 0 or below nothing changes,
- * and from 160 on, which |d| never exceeds, all strengths do the same.
+ * 112 112 becomes 102 104 | 108 110, and 50 50 | 150 150 stays. With s = 0 or below nothing
+ * changes, and from 160 on, which |d| never exceeds, all strengths do the same.
  *
  * Edges lie before line 8 k and before column 8 k, for k = 1 ... (height >> 3) - 1 and k = 1 ...
  * (width >> 3) - 1: not at the border, nor at or behind the last whole block. The horizontal edges

@@ -19,7 +19,7 @@ struct across {
 //
 // Called `step` below. Signed values carry a bias, and ~v is 255 - v:
 //
-//   avg(x, ~y)                              = 128 + ((x - y) >> 1)     0 ... 255
+//   avg(p, ~q)                              = 128 + ((p - q) >> 1)     0 ... 255
 //   e + 64     = avg(a, ~d) >> 1                                       0 ... 127
 //   step + 160 = avg(c, ~b) + ((e + 64 + parity) >> 1)                 0 ... 319
 //
