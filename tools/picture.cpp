@@ -66,10 +66,8 @@ size_t tiled_plane_bytes(size_t line_bytes, size_t lines) {
 }  // namespace
 
 int pixel_format::chroma() const {
-    if (is_rgb()) return 4;
-    if (is_tiled()) return 1;
-    if (channels[1].step == 0) return 0;
-    return 4 >> (channels[1].x_shift + channels[1].y_shift);
+    const bool grey = kind == family::planar && plane_count == 1;
+    return grey ? 0 : 4 >> (chroma_x_shift() + chroma_y_shift());
 }
 
 std::span<const pixel_format> formats() { return table; }

@@ -44,6 +44,10 @@ struct pixel_format {
     bool is_packed() const { return kind == family::packed; }
     // Every sample is a byte with a place that `channels` gives.
     bool has_samples() const { return !is_tiled() && !is_rgb16(); }
+    // A chroma sample stands for 2^chroma_x_shift() x 2^chroma_y_shift() pixels; shifts of 0 where
+    // there is no chroma.
+    int chroma_x_shift() const { return is_packed() ? 1 : planes[plane_count - 1].x_shift; }
+    int chroma_y_shift() const { return planes[plane_count - 1].y_shift; }
     // Chroma samples per four pixels (0, 1, 2, 4): what a road through this format keeps of it.
     int chroma() const;
 };

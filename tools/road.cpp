@@ -22,7 +22,9 @@ int step_cost(const pixel_format &from, const pixel_format &to, method how) {
     int cost = how == method::samples ? 12 : 2;
     if (to.is_rgb16() && !from.is_rgb16()) cost += 10;
     if (from.is_rgb() != to.is_rgb()) cost += 2;
-    if (to.chroma() < from.chroma() && !from.is_rgb()) cost += 3;
+    const bool coarser =
+        to.chroma_x_shift() > from.chroma_x_shift() || to.chroma_y_shift() > from.chroma_y_shift();
+    if (!from.is_rgb() && (coarser || to.chroma() < from.chroma())) cost += 3;
     return cost;
 }
 
@@ -39,14 +41,12 @@ int resize_cost(const pixel_format &f, const size &from, const size &to, const p
 // Of an odd number of columns (lines), the last one has a chroma sample of its own. If it comes
 // first, that sample is taken for two columns, and every other one is a column off.
 int turn_cost(const pixel_format &f, const size &from, int turn) {
-    if (f.chroma() == 0 || f.is_rgb()) return 2;
-    const plane_shape &chroma = f.planes[f.plane_count - 1];
     const bool columns_turn =
         turn == SIMGP_ROT_90L || turn == SIMGP_ROT_180 || turn == SIMGP_ROT_HORI;
     const bool lines_turn =
         turn == SIMGP_ROT_90R || turn == SIMGP_ROT_180 || turn == SIMGP_ROT_VERT;
-    const bool off = (columns_turn && chroma.x_shift && from.width % 2) ||
-                     (lines_turn && chroma.y_shift && from.height % 2);
+    const bool off = (columns_turn && f.chroma_x_shift() && from.width % 2) ||
+                     (lines_turn && f.chroma_y_shift() && from.height % 2);
     return off ? 8 : 2;
 }
 
@@ -131,7 +131,7 @@ struct plan {
                         (!f.is_tiled() || tiles_hold_last_chroma(from.height)))
                         go(done + 1, g, method::resize_csc, step_cost(f, g, method::csc));
                 if (done + 1 < parts.size() && offered(f, after, method::resize_turn, turn))
-                    go(done + 2, after, method::resize_turn, cost + turn_cost(f, to, turn) - 1);
+                    go(done + 2, after, method::resize_turn, cost + turn_cost(f, to, turn));
                 break;
             }
             case method::turn:
@@ -253,11 +253,9 @@ std::string road::loss() const {
     int x_shift = 0, y_shift = 0;
     bool grey = false;
     const auto pass = [&](const pixel_format &f) {
-        if (f.is_rgb()) return;
-        const plane_shape &chroma = f.planes[f.plane_count - 1];
         grey |= f.chroma() == 0;
-        x_shift = std::max(x_shift, f.is_packed() ? 1 : chroma.x_shift);
-        y_shift = std::max(y_shift, chroma.y_shift);
+        x_shift = std::max(x_shift, f.chroma_x_shift());
+        y_shift = std::max(y_shift, f.chroma_y_shift());
     };
     pass(*from_.format);
     for (const step &s : steps_) {

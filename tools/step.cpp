@@ -193,26 +193,28 @@ picture &step::run(picture &from) {
 }
 
 std::string step::note() const {
-    const std::string turn(how_ == method::deblock ? "" : turn_names[code_]);
+    const auto turning = [this](const char *how) {
+        return std::string(how).append(turn_names[code_]);
+    };
     switch (how_) {
         case method::dither:
             return "dithered";
         case method::samples:
             return "samples moved by the tool";
         case method::deblock:
-            return "simgp_dbf8x8_yuv " + std::to_string(code_);
+            return std::string("simgp_dbf8x8_yuv ").append(std::to_string(code_));
         case method::resize:
             return "simgp_rsz";
         case method::resize_csc:
             return "simgp_rsz_csc";
         case method::resize_turn:
-            return "simgp_rsz_rot " + turn;
+            return turning("simgp_rsz_rot ");
         case method::turn:
-            return "simgp_rot " + turn;
+            return turning("simgp_rot ");
         case method::csc_turn:
-            return "simgp_csc_rot " + turn;
+            return turning("simgp_csc_rot ");
         case method::turn_bytes:
-            return "simgp_rot_8b_" + turn + ", byte by byte";
+            return turning("byte by byte, simgp_rot_8b_");
         case method::thumbnail:
             return "simgp_rsz_8b_rot_90r_quarter";
         default:
