@@ -2,7 +2,7 @@
 // source come. The kernels that resize share it:
 //
 //     const resampling r(resize_kind::bytes1, step_x, step_y);
-//     resample_memory<12288> memory;
+//     resample_memory<10752> memory;
 //     r.for_each_strip(width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
 //         const resize_strip strip = r.plan(x, columns, r.whole_rows(width), memory.bytes);
 //         resampled_lines lines(r, strip, src, memory.bytes + r.plan_bytes(columns));

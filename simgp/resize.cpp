@@ -137,7 +137,7 @@ void resize(const resize_args &a) {
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
-    resample_memory<12288> memory;
+    resample_memory<10752> memory;
     r.for_each_strip(a.width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
         const resize_strip strip = r.plan(x, columns, r.whole_rows(a.width), memory.bytes);
         resampled_lines made(r, strip, src, memory.bytes + r.plan_bytes(columns));

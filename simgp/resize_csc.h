@@ -8,15 +8,23 @@ SIMGP_BEGIN_DECLS
 
 /* Resizes a picture of 4:2:0 to the size of the destination's descriptor and converts it to RGB565.
  *
- *   src   YUV420 or T64X32: format, and of each plane width[], height[], stride[] and plane[] are
- *         read; of T64X32, width[0], height[0] and plane[] only
- *   dst   RGB565: format, width[0], height[0], stride[0] and plane[0] are read
+ *   src   format and plane[] are read, and
+ *         of YUV420: width[] and height[] of planes 0 and 1, whose size plane 2 has as well, and
+ *         stride[] of all three;
+ *         of T64X32: width[0] and height[0]
+ *   dst   format, RGB565, width[0], height[0], stride[0] and plane[0] are read
  *
  * Luma and chroma are resized as simgp_rsz does (resize.h), from the size of their planes to W x H
- * samples of luma, and to ceil(W / 2) x ceil(H / 2) of chroma; pixel (x, y) takes chroma sample
- * (x / 2, y / 2), and the matrix of simgp_csc_yuv420_to_rgb565 (yuv2rgb.h). So this is what a
- * resize of the planes and a conversion give, without the picture between them. Of T64X32, chroma
- * has width[0] / 2 pairs in a row and is resized from ceil(height[0] / 2) rows.
+ * samples of luma and ceil(W / 2) x ceil(H / 2) of chroma; pixel (x, y) takes chroma sample
+ * (x / 2, y / 2), and the matrix of the other conversions (yuv2rgb.h). So this is what a resize of
+ * the planes and a conversion give, without the picture between them. The exceptions are odd heights, where
+ * some of the conversions give the first row a chroma line of its own, and pictures that
+ * keep their size, which are resampled here as well.
+ *
+ * Of T64X32, chroma is resized from width[0] / 2 pairs in a row, at least one, and from
+ * ceil(height[0] / 2) rows. If height[0] is odd, the last of these is not in the plane: it is the
+ * row that its tile has all the same; where there is no such tile the row above again, and mid-grey
+ * if there is none.
  *
  * Returns SIMGP_OK; SIMGP_ERR_PARAM if both formats are the same; SIMGP_ERR_UNSUPPORTED for every
  * other pair; SIMGP_ERR_PARAM if a width or height that is read is below 1 or larger than the steps

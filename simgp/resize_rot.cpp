@@ -35,7 +35,7 @@ struct line_block {
     ptrdiff_t used;
 };
 
-constexpr ptrdiff_t block_memory = 11264;
+constexpr ptrdiff_t block_memory = 10752;
 
 // Calls f(x, columns, block, made) for the columns of a resized plane of `width` columns; made.make()
 // makes their lines, for which `block` has room.
@@ -57,7 +57,7 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
 template <samples S, bool Right>
 void quarter_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size(S), side = block_side(S), band = 32;
+    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
@@ -82,7 +82,7 @@ void quarter_turn(const resize_args &args) {
 
 template <samples S>
 void half_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size(S), band = 2;
+    constexpr ptrdiff_t size = sample_size<S>, band = 2;
     if (args.width < 1 || args.height < 1) return;
     const resize_args a = whole_samples(args, int(size));
     const lines dst = a.dst.upside_down(a.height);

@@ -127,8 +127,7 @@ struct plan {
                 const int cost = resize_cost(f, from, to, source, target);
                 if (offered(f, f, method::resize)) go(done + 1, f, method::resize, cost);
                 for (const pixel_format &g : formats())
-                    if (offered(f, g, method::resize_csc) &&
-                        (!f.is_tiled() || tiles_hold_last_chroma(from.height)))
+                    if (offered(f, g, method::resize_csc))
                         go(done + 1, g, method::resize_csc, step_cost(f, g, method::csc));
                 if (done + 1 < parts.size() && offered(f, after, method::resize_turn, turn))
                     go(done + 2, after, method::resize_turn, cost + turn_cost(f, to, turn));

@@ -50,6 +50,10 @@ void check(int32_t result, const picture &src, const picture &dst) {
                     ": result ", result);
 }
 
+// True if a tiled picture has room for the chroma of an odd last line: unless the chroma line would
+// begin a tile row of its own, it lies in the last one.
+bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
+
 // Converts one picture. The library may leave out the chroma of a last odd column or line; given
 // the next even size it does not, and as chroma is never averaged, nothing of what is added shows.
 // Conversions from YUV to RGB have their own rules for odd sizes, which are kept.
@@ -117,8 +121,6 @@ const pixel_format &turned(const pixel_format &format, int turn) {
         return format_coded(SIMGP_FMT_YUV422W);
     return format;
 }
-
-bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
 
 bool offered(const pixel_format &from, const pixel_format &to, method how, int turn) {
     const std::span<const pixel_format> all = formats();

@@ -38,10 +38,6 @@ const pixel_format &turned(const pixel_format &format, int turn);
 // picture, where it has a say. `turn` is the rotation code of the methods that turn.
 bool offered(const pixel_format &from, const pixel_format &to, method how, int turn = 0);
 
-// Whether a tiled picture has room for the chroma of an odd last line: unless the chroma line would
-// begin a tile row of its own, it lies in the last one.
-bool tiles_hold_last_chroma(int height);
-
 // A step, with the picture that it makes.
 class step {
   public:
