@@ -126,8 +126,8 @@ simgp_rsz_fn *const simgp_tbl_fn_rsz_8b8b_rot[6] = {
 // Of the source's even rows, the even bytes: as many columns as the destination has rows.
 void simgp_rsz_8b_rot_90r_quarter(const void *src_plane, int32_t src_stride, int32_t dst_width,
                                   int32_t dst_height, int32_t dst_stride, void *dst_plane) {
-    turn_right<samples::even_bytes>(lines_of(src_plane, 2 * ptrdiff_t(src_stride)), dst_height,
-                                    dst_width, lines_of(dst_plane, dst_stride));
+    turn_right<sample_kind::even_bytes>(lines_of(src_plane, 2 * ptrdiff_t(src_stride)), dst_height,
+                                        dst_width, lines_of(dst_plane, dst_stride));
 }
 
 int32_t simgp_rsz_rot(const simgp_img *src, int32_t rot, const simgp_img *dst) {
