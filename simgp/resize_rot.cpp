@@ -8,8 +8,8 @@
 namespace simgp {
 namespace {
 
-constexpr resize_kind kind_of(samples s) {
-    return s == samples::words ? resize_kind::bytes2 : resize_kind::bytes1;
+constexpr resize_kind kind_of(sample_kind s) {
+    return s == sample_kind::words ? resize_kind::bytes2 : resize_kind::bytes1;
 }
 
 resize_args whole_samples(const resize_args &a, int size) {
@@ -55,7 +55,7 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 }
 
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
-template <samples S, bool Right>
+template <sample_kind S, bool Right>
 void quarter_turn(const resize_args &args) {
     constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
@@ -80,7 +80,7 @@ void quarter_turn(const resize_args &args) {
         });
 }
 
-template <samples S>
+template <sample_kind S>
 void half_turn(const resize_args &args) {
     constexpr ptrdiff_t size = sample_size<S>, band = 2;
     if (args.width < 1 || args.height < 1) return;
@@ -107,12 +107,12 @@ void half_turn(const resize_args &args) {
 
 using namespace simgp;
 
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn<samples::bytes, false>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn<samples::bytes, true>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn<samples::bytes>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l, quarter_turn<samples::words, false>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r, quarter_turn<samples::words, true>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn<samples::words>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn<sample_kind::bytes, false>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn<sample_kind::bytes, true>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn<sample_kind::bytes>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l, quarter_turn<sample_kind::words, false>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r, quarter_turn<sample_kind::words, true>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn<sample_kind::words>(args))
 
 simgp_rsz_fn *const simgp_tbl_fn_rsz_8b_rot[6] = {
     simgp_rsz_8b, simgp_rsz_8b_rot_90l, simgp_rsz_8b_rot_90r, simgp_rsz_8b_rot_180, nullptr,
