@@ -82,7 +82,7 @@ video_traits edited_traits(video_traits traits, const picture_shape &from, const
         from.height == to.height)
         return traits;
     // Lines no longer belong to one field or the other.
-    if (traits.interlacing != "p") traits.interlacing = "?";
+    if (traits.interlacing != "p") traits.interlacing.assign(1, '?');
     // Pixels as wide as `across` and as high as `down`, unless that is unknown.
     int64_t across = 0, down = 0;
     if (sscanf(traits.aspect.c_str(), "%" SCNd64 ":%" SCNd64, &across, &down) != 2) return traits;
