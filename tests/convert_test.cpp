@@ -292,6 +292,12 @@ TEST_F(convert_test, turned_twice_is_the_picture_again) {
             }
         }
     }
+    // V before U or after it: what becomes of the planes has U first.
+    for (const std::string edit : {"--rotate 90l", "--rotate 90r --resize 40x60", "--thumbnail"}) {
+        good("testcard:98x52 -o n " + edit + " --format yuv422n && $C testcard:98x52 -o v " + edit +
+             " --format yv16");
+        EXPECT_EQ(read("n"), read("v")) << edit;
+    }
     // Alpha, which no conversion keeps, is turned as well.
     write("one.rgba8888", "RGBArgba");
     good("one.rgba8888 --size 2x1 -o two.rgba8888 --rotate hori");
