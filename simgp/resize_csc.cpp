@@ -71,41 +71,76 @@ struct no_lines {
     const uint8_t *fetch(ptrdiff_t) const { return nullptr; }
 };
 
-// A tiled plane of width bytes x height rows: the bytes of a row from `first` on, put together in
-// `row`. It may have one row more than the plane: that of its tile, although it lies below the last
-// row of the plane, the last row again where there is no such tile, and mid-grey where there is no
-// row.
-class tiled_rows {
-  public:
-    tiled_rows(const uint8_t *plane, ptrdiff_t width, ptrdiff_t height, ptrdiff_t first,
-               ptrdiff_t count, uint8_t *row)
-        : plane_(plane), width_(width), height_(height), first_(first), count_(count), row_(row) {}
+// A plane of tiles, `width` bytes x `height` rows, that is wanted from byte `first`, a multiple of
+// tile_width, to byte `end` of its rows, up to row `rows` - 1. There may be one row more than the
+// plane has: that of its tile, although it lies below the last row of the plane, the last row again
+// where there is no such tile, and mid-grey where there is no row.
+struct tiled_part {
+    const uint8_t *plane;
+    ptrdiff_t width, height, first, end, rows;
 
-    const uint8_t *fetch(ptrdiff_t y) const {
-        if (y >= height_ && y % tile_height == 0) y = height_ - 1;
-        if (y < 0) {
-            memset(row_, 128, size_t(count_));
-            return row_;
+    const uint8_t *at(ptrdiff_t x, ptrdiff_t y) const {
+        return plane + tile_offset(width, height, x, y);
+    }
+};
+
+// Its rows in one piece, as a source of lines: bands of rows that lie in the same tiles are put
+// together at once, and the latest of them stay.
+class untiled_rows {
+  public:
+    // Rows that are asked for one at a time; or four of them, which span at most five rows (of a
+    // plane that is not decimated), or lie apart.
+    enum class access { single, near, far };
+    static constexpr int max_bands = 4;
+    static constexpr int rows_of(access a) {
+        return a == access::single ? 2 : a == access::near ? 6 : 4;
+    }
+
+    // `memory` has rows_of(a) rows.
+    untiled_rows(const tiled_part &part, access a, uint8_t *memory, ptrdiff_t stride)
+        : part_(part),
+          band_(a == access::far ? 1 : 2),
+          bands_(rows_of(a) / band_),
+          memory_(memory),
+          stride_(stride),
+          detile_(live_rows().tile.detile) {}
+
+    const uint8_t *fetch(ptrdiff_t y) {
+        if (y >= part_.height && y % tile_height == 0) y = part_.height - 1;
+        const ptrdiff_t band = y < 0 ? 0 : y / band_ * band_;
+        int at = 0;
+        while (at < bands_ && held_[at] != band) at++;
+        if (at == bands_) {
+            at = next_;
+            next_ = next_ + 1 < bands_ ? next_ + 1 : 0;
+            held_[at] = band;
+            if (y < 0)
+                memset(line(at), 128, size_t(part_.end - part_.first));
+            else
+                put_together(line(at), band);
         }
-        const auto bytes_at = [this, y](ptrdiff_t x) {
-            return plane_ + tile_offset(width_, height_, x, y);
-        };
-        ptrdiff_t i = 0;
-        const ptrdiff_t start = first_ % tile_width;
-        if (start > 0) {
-            i = count_ < tile_width - start ? count_ : tile_width - start;
-            memcpy(row_, bytes_at(first_), size_t(i));
-        }
-        for (; i + tile_width <= count_; i += tile_width)
-            memcpy(row_ + i, bytes_at(first_ + i), tile_width);
-        if (i < count_) memcpy(row_ + i, bytes_at(first_ + i), size_t(count_ - i));
-        return row_;
+        return line(at) + (y < 0 ? 0 : y - band) * stride_;
     }
 
   private:
-    const uint8_t *plane_;
-    ptrdiff_t width_, height_, first_, count_;
-    uint8_t *row_;
+    uint8_t *line(int band) const { return memory_ + band * band_ * stride_; }
+
+    void put_together(uint8_t *to, ptrdiff_t y) const {
+        const ptrdiff_t rows = part_.rows - y < band_ ? part_.rows - y : band_;
+        ptrdiff_t x = part_.first;
+        for (; x + tile_width <= part_.end; x += tile_width, to += tile_width)
+            detile_(part_.at(x, y), to, stride_, rows);
+        if (x < part_.end)
+            copy_lines({part_.at(x, y), tile_width}, {to, stride_}, part_.end - x, rows);
+    }
+
+    tiled_part part_;
+    int band_, bands_;
+    uint8_t *memory_;
+    ptrdiff_t stride_;
+    detile_rows *detile_;
+    ptrdiff_t held_[max_bands] = {-1, -1, -1, -1};
+    int next_ = 0;
 };
 
 // What one strip needs of memory for luma or chroma: a plan, and for each plane what is kept and two
@@ -130,20 +165,18 @@ struct span {
     span chroma() const { return {x / 2, (columns + 1) / 2}; }
 };
 
-// The columns, resampled and converted. Rows of tiles have to be put together, one at a time.
+// The columns, resampled and converted.
 template <const format &From>
 class fused {
     static constexpr bool tiled = From.kind == format_kind::tiled;
     static constexpr int chroma_planes = From.u == From.v ? 1 : 2;
     static constexpr ptrdiff_t memory_size = 10240;
+    // Whose rows convert it.
+    static constexpr const format &like = tiled ? formats::NV12 : From;
 
   public:
     fused(const grids &sizes, uint8_t *const *planes, const int32_t *strides, const lines &dst)
-        : width_(sizes.luma.dst_width),
-          height_(sizes.luma.dst_height),
-          src_width_(sizes.luma.src_width),
-          src_height_(sizes.luma.src_height),
-          chroma_height_(sizes.chroma.dst_height),
+        : sizes_(sizes),
           luma_(resampling_of(resize_kind::bytes1, sizes.luma)),
           chroma_(resampling_of(chroma_planes == 1 ? resize_kind::bytes2 : resize_kind::bytes1,
                                 sizes.chroma)),
@@ -152,80 +185,98 @@ class fused {
           dst_(dst) {}
 
     void run() const {
-        const ptrdiff_t columns = columns_of_strips(width_, [this](ptrdiff_t n) {
+        const ptrdiff_t width = sizes_.luma.dst_width;
+        const ptrdiff_t columns = columns_of_strips(width, [this](ptrdiff_t n) {
             memory_pieces wanted{nullptr};
             const memory all(wanted, *this, {0, n});
             return wanted.used <= memory_size;
         });
         resample_memory<memory_size> room;
-        for (ptrdiff_t x = 0; x < width_; x += columns)
-            convert({x, width_ - x < columns ? width_ - x : columns}, {room.bytes});
+        for (ptrdiff_t x = 0; x < width; x += columns)
+            convert({x, width - x < columns ? width - x : columns}, {room.bytes});
     }
 
   private:
+    static resampling resampling_of(resize_kind kind, const grid &g) {
+        return {kind, resize_spread(g.src_width, g.dst_width).packed(),
+                resize_spread(g.src_height, g.dst_height).packed()};
+    }
+
     // The whole of it.
     struct memory {
         plane_memory luma, chroma;
-        uint8_t *row;
+        uint8_t *luma_rows, *chroma_rows;
 
         memory(memory_pieces &from, const fused &f, const span &at)
             : luma(from, f.luma_, at.columns, 1),
               chroma(from, f.chroma_, at.chroma().columns, chroma_planes),
-              row(tiled ? from.take(f.most_bytes(at.columns)) : nullptr) {}
+              luma_rows(rows(from, f.luma_, at)),
+              chroma_rows(rows(from, f.chroma_, at.chroma())) {}
+
+      private:
+        static uint8_t *rows(memory_pieces &from, const resampling &r, const span &at) {
+            if (!tiled) return nullptr;
+            return from.take(untiled_rows::rows_of(access_of(r)) * row_stride(r, at.columns));
+        }
     };
-    // Of a row of tiles, for so many columns.
-    ptrdiff_t most_bytes(ptrdiff_t columns) const {
-        const ptrdiff_t y = luma_.most_of_rows(columns);
-        const ptrdiff_t pairs = 2 * chroma_.most_of_rows((columns + 1) / 2);
-        return y > pairs ? y : pairs;
-    }
 
-    static resampling resampling_of(resize_kind kind, const grid &g) {
-        return {kind, resize_spread(g.src_width, g.dst_width).packed(),
-                resize_spread(g.src_height, g.dst_height).packed(), tiled};
+    // Rows of tiles that are put together: how they are asked for, and the room for one.
+    static untiled_rows::access access_of(const resampling &r) {
+        using access = untiled_rows::access;
+        return r.keeps() ? access::single : r.y.shift == 0 ? access::near : access::far;
     }
-
-    // The lines of a plane as the strip wants them.
-    source_span span_of(const resampling &r, const span &at, ptrdiff_t width) const {
-        return tiled ? r.part_of_rows(at.x, at.columns) : r.whole_rows(width);
+    static ptrdiff_t row_stride(const resampling &r, ptrdiff_t columns) {
+        const ptrdiff_t most = r.most_of_rows(columns) * r.pixel_bytes + tile_width - 1;
+        return (most + tile_width - 1) & -tile_width;
     }
-    auto rows_of(int plane, const source_span &part, uint8_t *row) const {
-        if constexpr (tiled)
-            return tiled_rows(planes_[plane], src_width_, plane ? src_height_ / 2 : src_height_,
-                              (plane ? 2 : 1) * part.first, (plane ? 2 : 1) * part.columns, row);
-        else
+    // Which columns of the source a span needs: of tiles, from the begin of one.
+    source_span span_of(const resampling &r, const span &at, const grid &g) const {
+        if (!tiled) return r.whole_rows(g.dst_width);
+        const source_span part = r.part_of_rows(at.x, at.columns);
+        const ptrdiff_t first = part.first & -(tile_width / r.pixel_bytes);
+        return {first, part.first + part.columns - first};
+    }
+    auto rows_of(int plane, const resampling &r, const span &at, const grid &g,
+                 uint8_t *memory) const {
+        if constexpr (tiled) {
+            const source_span part = span_of(r, at, g);
+            const ptrdiff_t first = part.first * r.pixel_bytes;
+            return untiled_rows({planes_[plane], sizes_.luma.src_width,
+                                 plane ? sizes_.luma.src_height / 2 : sizes_.luma.src_height, first,
+                                 first + part.columns * r.pixel_bytes, r.y.extent(g.dst_height)},
+                                access_of(r), memory, row_stride(r, at.columns));
+        } else {
             return const_lines{planes_[plane], strides_[plane]};
+        }
     }
 
     void convert(const span &at, memory_pieces pieces) const {
         const memory m(pieces, *this, at);
-        const span chroma_at = at.chroma();
-        const source_span of_luma = span_of(luma_, at, width_),
-                          of_chroma = span_of(chroma_, chroma_at, (width_ + 1) / 2);
-        const resize_strip luma = luma_.plan(at.x, at.columns, of_luma, m.luma.plan);
+        const grid &of_luma = sizes_.luma, &of_chroma = sizes_.chroma;
+        const span pairs = at.chroma();
+        const resize_strip luma =
+            luma_.plan(at.x, at.columns, span_of(luma_, at, of_luma), m.luma.plan);
         const resize_strip chroma =
-            chroma_.plan(chroma_at.x, chroma_at.columns, of_chroma, m.chroma.plan);
+            chroma_.plan(pairs.x, pairs.columns, span_of(chroma_, pairs, of_chroma), m.chroma.plan);
 
-        line_pairs y(luma_, luma, rows_of(0, of_luma, m.row), height_, m.luma.ring[0],
-                     m.luma.lines[0]);
-        const auto of_plane = [&](int plane, int k) {
-            return line_pairs(chroma_, chroma, rows_of(plane, of_chroma, m.row), chroma_height_,
-                              m.chroma.ring[k], m.chroma.lines[k]);
+        line_pairs y(luma_, luma, rows_of(0, luma_, at, of_luma, m.luma_rows), of_luma.dst_height,
+                     m.luma.ring[0], m.luma.lines[0]);
+        const auto plane = [&](int which, int k) {
+            return line_pairs(chroma_, chroma,
+                              rows_of(which, chroma_, pairs, of_chroma, m.chroma_rows),
+                              of_chroma.dst_height, m.chroma.ring[k], m.chroma.lines[k]);
         };
         const auto walk = [&](auto &&u, auto &&v) {
-            walk_yuv_to_rgb<like_, formats::RGB565, yuv_rule::usual>(
-                y, u, v, dst_, {at.x, at.columns, height_}, 0);
+            walk_yuv_to_rgb<like, formats::RGB565, yuv_rule::usual>(
+                y, u, v, dst_, {at.x, at.columns, of_luma.dst_height}, 0);
         };
         if constexpr (chroma_planes == 1)
-            walk(of_plane(From.u, 0), no_lines());
+            walk(plane(From.u, 0), no_lines());
         else
-            walk(of_plane(From.u, 0), of_plane(From.v, 1));
+            walk(plane(From.u, 0), plane(From.v, 1));
     }
 
-    // Whose rows convert it.
-    static constexpr const format &like_ = tiled ? formats::NV12 : From;
-
-    ptrdiff_t width_, height_, src_width_, src_height_, chroma_height_;
+    grids sizes_;
     resampling luma_, chroma_;
     uint8_t *const *planes_;
     const int32_t *strides_;
