@@ -37,10 +37,12 @@ message(STATUS "simgp: vector rows for: ${SIMGP_TARGETS}")
 set(SIMGP_AREAS
   scmn/keyframe
   scmn/mem
+  simgp/deblock
   simgp/dither
   simgp/layout
   simgp/resize
   simgp/rgb2yuv
+  simgp/rotate
   simgp/tile
   simgp/yuv2rgb)
 set(area_macro "#define SIMGP_AREAS(X)")

@@ -3,12 +3,14 @@
 #ifndef ROWS_TABLE_H
 #define ROWS_TABLE_H
 
+#include "rows/deblock.h"
 #include "rows/dither.h"
 #include "rows/keyframe.h"
 #include "rows/layout.h"
 #include "rows/mem.h"
 #include "rows/resize.h"
 #include "rows/rgb2yuv.h"
+#include "rows/rotate.h"
 #include "rows/tile.h"
 #include "rows/yuv2rgb.h"
 
@@ -16,12 +18,14 @@ namespace simgp {
 
 // A member for each area of the build's list (cmake/targets.cmake), under the area's name.
 struct row_table {
+    deblock_rows deblock;
     dither_rows dither;
     keyframe_rows keyframe;
     layout_rows layout;
     mem_rows mem;
     resize_rows resize;
     rgb2yuv_rows rgb2yuv;
+    rotate_rows rotate;
     tile_rows tile;
     yuv2rgb_rows yuv2rgb;
 };

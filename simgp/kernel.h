@@ -36,6 +36,25 @@ struct plane_args {
     lines dst;
 };
 
+// Planes of 16-bit samples: their lines advance by whole samples.
+inline plane_args whole_words(const plane_args &a) {
+    return {whole_pixel_lines(a.src, 2), a.width, a.height, whole_pixel_lines(a.dst, 2)};
+}
+
+// Runs a kernel of one plane from a plane of one picture to a plane of another.
+inline void run_plane(simgp_plane_fn *kernel, const simgp_img &src, int from, const simgp_img &dst,
+                      int to) {
+    kernel(src.plane[from], src.width[from], src.height[from], src.stride[from], dst.stride[to],
+           dst.plane[to]);
+}
+
+// Runs kernels for all planes of a picture: one for planes of bytes, one for those of 16-bit samples.
+inline void run_planes(const format &planes, const simgp_img &src, const simgp_img &dst,
+                       simgp_plane_fn *of_bytes, simgp_plane_fn *of_words) {
+    for (int k = 0; k < planes.planes; k++)
+        run_plane(planes.bytes[k] == 2 ? of_words : of_bytes, src, k, dst, k);
+}
+
 }  // namespace simgp
 
 // Heads the definition of an exported conversion kernel, whose body then finds the arguments in

@@ -35,7 +35,7 @@ struct grey_matrix {
 };
 
 // The samples of pixel x of a row of `width` pixels.
-struct samples {
+struct yuv_samples {
     const uint8_t *y, *u, *v;
     ptrdiff_t width;
 };
@@ -44,13 +44,13 @@ struct yuv {
 };
 // Packed 4:2:2: byte y0 of a group is its first luma, the second lies two bytes on; then U and V.
 // Of a group with a single pixel V lies outside the row: the group before lends its own.
-inline yuv read_packed(const samples &s, ptrdiff_t x, int y0, int u, int v) {
+inline yuv read_packed(const yuv_samples &s, ptrdiff_t x, int y0, int u, int v) {
     const uint8_t *group = s.y + (x >> 1) * 4;
     const bool whole = (x | 1) < s.width;
     return {group[y0 + 2 * (x & 1)], group[u], whole ? group[v] : x ? group[v - 4] : 128};
 }
 template <yuv_layout Layout>
-yuv read_yuv(const samples &s, ptrdiff_t x) {
+yuv read_yuv(const yuv_samples &s, ptrdiff_t x) {
     const ptrdiff_t pair = x >> 1;
     if constexpr (Layout == yuv_layout::grey) return {s.y[x], 128, 128};
     if constexpr (Layout == yuv_layout::half) return {s.y[x], s.u[pair], s.v[pair]};
@@ -98,7 +98,7 @@ void write_rgb(uint8_t *dst, ptrdiff_t x, const rgb &c) {
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
 void to_rgb_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                 ptrdiff_t width) {
-    const samples s{y, u, v, width};
+    const yuv_samples s{y, u, v, width};
     for (ptrdiff_t x = 0; x < width; x++) {
         const yuv p = read_yuv<Layout>(s, x);
         write_rgb<Packing>(dst, x,

@@ -2,7 +2,7 @@
 // source come. The kernels that resize share it:
 //
 //     const resampling r(resize_kind::bytes1, step_x, step_y);
-//     resample_memory<12288> memory;
+//     resample_memory<10752> memory;
 //     r.for_each_strip(width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
 //         const resize_strip strip = r.plan(x, columns, r.whole_rows(width), memory.bytes);
 //         resampled_lines lines(r, strip, src, memory.bytes + r.plan_bytes(columns));
@@ -13,6 +13,7 @@
 
 #include "rows/choose.h"
 #include "simgp/kernel.h"
+#include "simgp/resize.h"
 
 namespace simgp {
 
@@ -46,6 +47,32 @@ struct resample_memory {
     static constexpr ptrdiff_t size = Size;
     alignas(resize_alignment) uint8_t bytes[Size];
 };
+
+// Memory that is handed out piece by piece. Without memory it only adds up what is asked for.
+struct memory_pieces {
+    uint8_t *memory;
+    ptrdiff_t used = 0;
+
+    uint8_t *take(ptrdiff_t size) {
+        uint8_t *const piece = memory ? memory + used : nullptr;
+        used += (size + resize_alignment - 1) & -ptrdiff_t(resize_alignment);
+        return piece;
+    }
+};
+
+// How wide strips are that `fits` says yes to: as many columns as suit all instruction sets, or an even
+// number, or 1, which always fits.
+template <class Fits>
+ptrdiff_t columns_of_strips(ptrdiff_t width, Fits fits) {
+    constexpr ptrdiff_t suits = 128;
+    for (ptrdiff_t strips = 1;; strips++) {
+        const ptrdiff_t least = (width + strips - 1) / strips;
+        const ptrdiff_t unit = least > suits ? suits : 2;
+        const ptrdiff_t columns = (least + unit - 1) & -unit;
+        if (fits(columns < width ? columns : width)) return columns;
+        if (least == 1) return 1;
+    }
+}
 
 // What all strips of a resize share.
 class resampling {
@@ -119,6 +146,10 @@ class resampling {
     source_span part_of_rows(ptrdiff_t at, ptrdiff_t columns) const {
         const ptrdiff_t first = x.cell(at);
         return {first, x.next(at + columns - 1) + 1 - first};
+    }
+    // No part of so many columns is larger.
+    ptrdiff_t most_of_rows(ptrdiff_t columns) const {
+        return x.cell(columns - 1) + (columns > 1 ? 2 : 1) * x.tap() + 1;
     }
 
   private:
@@ -205,6 +236,44 @@ class resampled_lines {
     uint8_t *ring_[2];
     ptrdiff_t held_[2] = {-1, -1};
 };
+
+// Spreads `to` samples over `from`. The step is a number of 29 bits, with its sign, and so are
+// positions of 32: within 8192 units, and less than 1024 of them from a sample to the next.
+struct resize_spread {
+    bool fits = false;
+    int32_t step = 0, shift = 0;
+
+    resize_spread(int32_t from, int32_t to) {
+        if (from < 1 || to < 1) return;
+        while (shift < 4 && from / to > 2 << shift) shift++;
+        const int32_t units = (from - 1) >> shift;
+        if (units >= 1 << 13 || units / to >= 1 << 10) return;
+        step = units * (1 << 18) / to;
+        fits = true;
+    }
+    int32_t packed() const { return fits ? step * 8 | shift : 0; }
+};
+
+inline bool is_quarter_turn(int32_t rot) { return rot == SIMGP_ROT_90L || rot == SIMGP_ROT_90R; }
+
+// Whether plane k of src can be resized to that of dst, which a quarter turn then exchanges the sides
+// of.
+inline bool plane_fits(const simgp_img &src, const simgp_img &dst, int k,
+                       int32_t rot = SIMGP_ROT_NONE) {
+    const bool quarter = is_quarter_turn(rot);
+    return resize_spread(src.width[k], quarter ? dst.height[k] : dst.width[k]).fits &&
+           resize_spread(src.height[k], quarter ? dst.width[k] : dst.height[k]).fits;
+}
+
+// Resizes it, by the kernel that turns it as `rot` says.
+inline void resize_plane(simgp_rsz_fn *kernel, const simgp_img &src, const simgp_img &dst, int k,
+                         int32_t rot = SIMGP_ROT_NONE) {
+    int32_t step_x, step_y;
+    simgp_rsz_get_step(src.width[k], src.height[k], dst.width[k], dst.height[k], rot, &step_x,
+                       &step_y);
+    kernel(src.plane[k], src.stride[k], dst.width[k], dst.height[k], dst.stride[k], dst.plane[k],
+           step_x, step_y);
+}
 
 // The arguments of a kernel that resizes a plane.
 struct resize_args {

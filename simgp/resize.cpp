@@ -137,30 +137,13 @@ void resize(const resize_args &a) {
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
-    resample_memory<12288> memory;
+    resample_memory<10752> memory;
     r.for_each_strip(a.width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
         const resize_strip strip = r.plan(x, columns, r.whole_rows(a.width), memory.bytes);
         resampled_lines made(r, strip, src, memory.bytes + r.plan_bytes(columns));
         made.make(0, a.height, dst.first + x * unit, dst.stride);
     });
 }
-
-// Spreads `to` samples over `from`. The step is a number of 29 bits, with its sign, and so are
-// positions of 32: within 8192 units, and less than 1024 of them from a sample to the next.
-struct spread {
-    bool fits = false;
-    int32_t step = 0, shift = 0;
-
-    spread(int32_t from, int32_t to) {
-        if (from < 1 || to < 1) return;
-        while (shift < 4 && from / to > 2 << shift) shift++;
-        const int32_t units = (from - 1) >> shift;
-        if (units >= 1 << 13 || units / to >= 1 << 10) return;
-        step = units * (1 << 18) / to;
-        fits = true;
-    }
-    int32_t packed() const { return fits ? step * 8 | shift : 0; }
-};
 
 // The planes that are resized; null: the format has no rule. A code without a name has 32 bits.
 constexpr int32_t unnamed_32_bits = 503;
@@ -192,18 +175,6 @@ void copy_plane(const format &f, const simgp_img &src, const simgp_img &dst, int
                ptrdiff_t(src.width[k]) * f.bytes[k], src.height[k]);
 }
 
-bool plane_fits(const simgp_img &src, const simgp_img &dst, int k) {
-    return spread(src.width[k], dst.width[k]).fits && spread(src.height[k], dst.height[k]).fits;
-}
-
-void resize_plane(const format &f, const simgp_img &src, const simgp_img &dst, int k) {
-    int32_t step_x, step_y;
-    simgp_rsz_get_step(src.width[k], src.height[k], dst.width[k], dst.height[k], SIMGP_ROT_NONE,
-                       &step_x, &step_y);
-    kernel_of(f, k)(src.plane[k], src.stride[k], dst.width[k], dst.height[k], dst.stride[k],
-                    dst.plane[k], step_x, step_y);
-}
-
 }  // namespace
 }  // namespace simgp
 
@@ -228,9 +199,9 @@ SIMGP_RESIZE_KERNEL(simgp_rsz_5b6b5b, resize<resize_kind::word565>(args))
 
 void simgp_rsz_get_step(int32_t src_width, int32_t src_height, int32_t dst_width,
                         int32_t dst_height, int32_t mode, int32_t *step_x, int32_t *step_y) {
-    const bool turned = mode == SIMGP_ROT_90L || mode == SIMGP_ROT_90R;
-    *step_x = spread(src_width, turned ? dst_height : dst_width).packed();
-    *step_y = spread(src_height, turned ? dst_width : dst_height).packed();
+    const bool turned = is_quarter_turn(mode);
+    *step_x = resize_spread(src_width, turned ? dst_height : dst_width).packed();
+    *step_y = resize_spread(src_height, turned ? dst_width : dst_height).packed();
 }
 
 int32_t simgp_rsz(const simgp_img *src, const simgp_img *dst) {
@@ -243,6 +214,6 @@ int32_t simgp_rsz(const simgp_img *src, const simgp_img *dst) {
     }
     for (int k = 0; k < f->planes; k++)
         if (!plane_fits(*src, *dst, k)) return SIMGP_ERR_PARAM;
-    for (int k = 0; k < f->planes; k++) resize_plane(*f, *src, *dst, k);
+    for (int k = 0; k < f->planes; k++) resize_plane(kernel_of(*f, k), *src, *dst, k);
     return SIMGP_OK;
 }

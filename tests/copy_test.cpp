@@ -3,6 +3,7 @@
 #include <cstring>
 
 #include "simgp/simgp.h"
+#include "tests/kept_planes.h"
 #include "tests/rig.h"
 
 namespace {
@@ -54,24 +55,13 @@ TEST(copy, empty_planes_are_left_alone) {
         }
 }
 
-// How many planes a format has, and the bytes of a sample of each; none: refused.
-std::vector<int> sample_bytes(int format) {
-    if (format == 0) return {1};
-    if (format == 6 || format == 7) return {1, 2};
-    if (format >= 1 && format <= 99 && format != 11) return {1, 1, 1};
-    if (format >= 200 && format <= 299) return {2};
-    return {};
-}
-
 TEST(copy, pictures_of_every_format) {
     rig::rng random(rig::seed());
-    std::vector<int> codes = {-1, -3, INT32_MIN, INT32_MAX, 65536, 256 * 256 * 256};
-    for (int format = 0; format <= 600; format++) codes.push_back(format);
-    for (int format : codes) {
+    for (int format : rig::format_codes()) {
         SCOPED_TRACE(format);
         std::vector<rig::plane_shape> shapes;
         int width = 37, height = 5;
-        for (int bytes : sample_bytes(format)) {
+        for (int bytes : rig::kept_planes(format)) {
             shapes.push_back(rig::samples(width, height, bytes));
             width = 19, height = 3;
         }

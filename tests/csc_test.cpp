@@ -3,19 +3,13 @@
 
 #include "simgp/simgp.h"
 #include "tests/conversions.h"
+#include "tests/kept_planes.h"
 #include "tests/rig.h"
 
 namespace {
 
 using rig::conversion;
 using rig::conversions;
-
-// Every code there may be, with room for more, and some far away.
-std::vector<int> codes() {
-    std::vector<int> all = {65536 + 1, 0x01000001, INT32_MIN, INT32_MAX};
-    for (int code = -3; code < 620; code++) all.push_back(code);
-    return all;
-}
 
 TEST(csc, every_expected_conversion_has_a_test_of_what_it_computes) {
     for (const conversion &c : conversions)
@@ -51,7 +45,7 @@ TEST(csc, all_other_pairs_are_refused) {
     const std::vector<rig::plane_shape> nothing(4, rig::samples(0, 0));
     rig::picture src(nothing), dst(nothing);
     dst.fill_pattern(2);
-    const std::vector<int> all = codes();
+    const std::vector<int> all = rig::format_codes();
     for (int size : {0, 64}) {
         for (int k = 0; k < 4; k++) src.widths[k] = src.heights[k] = size;
         for (int from : all)
