@@ -342,7 +342,8 @@ comparison compare(conversion c) {
         c.ours = [name = c.name](const simgp_img &s, const simgp_img &d) {
             if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
         };
-    for (peer &p : swscale_peer(c.from, c.to, 0, c.how)) c.peers.push_back(std::move(p));
+    if (c.against_swscale)
+        for (peer &p : swscale_peer(c.from, c.to, 0, c.how)) c.peers.push_back(std::move(p));
     if (c.sizes.empty()) c.sizes = {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"};
 
     const auto make = [c](const std::string &name) {
@@ -382,7 +383,9 @@ comparison compare(conversion c) {
         // Where a goal asks for the speed of memory, it is that of pictures beyond the cache, and
         // the peer's that of those inside.
         const std::string start = name.substr(0, name.find(' '));
-        const bool in_cache = start == "320x240", usual = in_cache || start == "1920x1080";
+        // Of a resize every size that it names counts.
+        const bool in_cache = start == "320x240";
+        const bool usual = in_cache || start == "1920x1080" || any_size;
         m.goals.scalar = usual ? c.goals.scalar : 0;
         m.goals.peer = (c.goals.limit > 0 ? in_cache : usual) ? c.goals.peer : 0;
         m.goals.limit = start == "3840x2160" ? c.goals.limit : 0;

@@ -86,7 +86,7 @@ struct size {
 struct conversion {
     int from, to;
     goal goals;
-    std::vector<peer> peers = {};  // besides swscale
+    std::vector<peer> peers = {};  // besides swscale, if that is asked for
     std::string name = {};         // of itself "nv12_to_rgb565"
     operation ours = {};           // of itself simgp_csc
     double tolerance = 4;          // for peers, see expect_alike; 0: they are not held against ours
@@ -104,6 +104,7 @@ struct conversion {
     std::function<size(const size &from)> to_size = {};
     resizing how = resizing::none;
     std::vector<std::string> sizes = {};  // names; of itself the usual ones
+    bool against_swscale = true;
     // `ours` and the peers get one picture as source and destination, as it was painted, each time.
     bool in_place = false;
 };
