@@ -8,8 +8,8 @@
 namespace simgp {
 namespace {
 
-constexpr resize_kind kind_of(samples s) {
-    return s == samples::words ? resize_kind::bytes2 : resize_kind::bytes1;
+constexpr resize_kind kind_of(sample_kind s) {
+    return s == sample_kind::words ? resize_kind::bytes2 : resize_kind::bytes1;
 }
 
 resize_args whole_samples(const resize_args &a, int size) {
@@ -55,15 +55,16 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 }
 
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
-template <samples S, bool Right>
+template <sample_kind S, bool Right>
 void quarter_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
+    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32, step = 4;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
     const lines dst = Right ? a.dst : a.dst.upside_down(width);
     transpose_block *const transpose = live_rows().rotate.transpose[size_t(S)];
     const resampling r(kind_of(S), a.step_x, a.step_y);
+    const bool fetch = int64_t(width) * height * size >= fetch_from;
     for_each_block_of_lines(
         r, a.src, width, band,
         [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
@@ -71,8 +72,15 @@ void quarter_turn(const resize_args &args) {
                 const ptrdiff_t rows = height - y < band ? height - y : band;
                 const lines in{block.first, block.stride};
                 const lines to = Right ? in.upside_down(rows) : in;
-                made.make(y, rows, to.first, to.stride);
                 const ptrdiff_t column = Right ? height - y - rows : y;
+                uintptr_t ahead = reinterpret_cast<uintptr_t>(dst.line(x) + column * size);
+                const ptrdiff_t each = (columns * step + rows - 1) / rows;
+                for (ptrdiff_t k = 0; k < rows; k += step) {
+                    if (fetch)
+                        for (ptrdiff_t i = 0; i < each; i++, ahead += uintptr_t(dst.stride))
+                            __builtin_prefetch(reinterpret_cast<const void *>(ahead), 1);
+                    made.make(y + k, rows - k < step ? rows - k : step, to.line(k), to.stride);
+                }
                 for (ptrdiff_t i = 0; i < columns; i += side)
                     transpose(in.first + i * size, in.stride, dst.line(x + i) + column * size,
                               dst.stride, columns - i < side ? columns - i : side, rows, 0);
@@ -80,7 +88,7 @@ void quarter_turn(const resize_args &args) {
         });
 }
 
-template <samples S>
+template <sample_kind S>
 void half_turn(const resize_args &args) {
     constexpr ptrdiff_t size = sample_size<S>, band = 2;
     if (args.width < 1 || args.height < 1) return;
@@ -107,12 +115,12 @@ void half_turn(const resize_args &args) {
 
 using namespace simgp;
 
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn<samples::bytes, false>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn<samples::bytes, true>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn<samples::bytes>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l, quarter_turn<samples::words, false>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r, quarter_turn<samples::words, true>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn<samples::words>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn<sample_kind::bytes, false>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn<sample_kind::bytes, true>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn<sample_kind::bytes>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l, quarter_turn<sample_kind::words, false>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r, quarter_turn<sample_kind::words, true>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn<sample_kind::words>(args))
 
 simgp_rsz_fn *const simgp_tbl_fn_rsz_8b_rot[6] = {
     simgp_rsz_8b, simgp_rsz_8b_rot_90l, simgp_rsz_8b_rot_90r, simgp_rsz_8b_rot_180, nullptr,
