@@ -21,30 +21,29 @@ resize_args whole_samples(const resize_args &a, int size) {
 
 // The resized lines of some columns lie in a block on the stack.
 struct line_block {
-    uint8_t *plan, *ring, *first;
+    memory_pieces memory;
+    uint8_t *plan, *ring;
     ptrdiff_t stride;
+    uint8_t *first;
 
-    line_block(memory_pieces from, const resampling &r, ptrdiff_t columns, ptrdiff_t lines)
-        : plan(from.take(r.plan_bytes(columns))),
-          ring(from.take(r.ring_bytes(columns))),
-          first(nullptr),
-          stride((columns * r.pixel_bytes + resize_alignment - 1) & -ptrdiff_t(resize_alignment)) {
-        first = from.take(lines * stride);
-        used = from.used;
-    }
-    ptrdiff_t used;
+    line_block(const memory_pieces &from, const resampling &r, ptrdiff_t columns, ptrdiff_t lines)
+        : memory(from),
+          plan(memory.take(r.plan_bytes(columns))),
+          ring(memory.take(r.ring_bytes(columns))),
+          stride((columns * r.pixel_bytes + resize_alignment - 1) & -ptrdiff_t(resize_alignment)),
+          first(memory.take(lines * stride)) {}
 };
 
 constexpr ptrdiff_t block_memory = 10752;
 
-// Calls f(x, columns, block, made) for the columns of a resized plane of `width` columns; made.make()
-// makes their lines, for which `block` has room.
+// Calls f(x, columns, block, made) for the columns of a resized plane of `width` columns. `block` has
+// room for so many of their lines, and made.make() makes them.
 template <class F>
 void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdiff_t width,
                              ptrdiff_t lines, F f) {
     resample_memory<block_memory> memory;
     const ptrdiff_t most = columns_of_strips(width, [&](ptrdiff_t n) {
-        return line_block({nullptr}, r, n, lines).used <= block_memory;
+        return line_block({nullptr}, r, n, lines).memory.used <= block_memory;
     });
     for (ptrdiff_t x = 0; x < width; x += most) {
         const ptrdiff_t columns = width - x < most ? width - x : most;
@@ -55,6 +54,8 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 }
 
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
+// Of large planes the lines of the destination are asked for meanwhile, some between every `step`
+// lines that are made: they lie far apart, and no processor foresees them.
 template <sample_kind S, bool Right>
 void quarter_turn(const resize_args &args) {
     constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32, step = 4;
