@@ -1,5 +1,5 @@
-// Resize and conversion in one pass: strips of columns, whose lines of luma and chroma are resampled
-// on the stack and converted from there.
+// Resize and conversion in one pass: the lines of luma and chroma of a strip of columns are resampled
+// on the stack, and converted from there.
 #include "simgp/resize_csc.h"
 
 #include "simgp/resample.h"
@@ -143,8 +143,7 @@ class untiled_rows {
     int next_ = 0;
 };
 
-// What one strip needs of memory for luma or chroma: a plan, and for each plane what is kept and two
-// lines.
+// The memory of a strip for luma or chroma: a plan, and for each plane what is kept and two lines.
 struct plane_memory {
     uint8_t *plan, *ring[2], *lines[2];
 
@@ -157,8 +156,7 @@ struct plane_memory {
     }
 };
 
-// Columns of luma and the columns of chroma that serve them: luma.x is even, unless there is but one
-// column.
+// Columns of luma, and those of chroma that serve them. x is even, unless there is but one column.
 struct span {
     ptrdiff_t x, columns;
 

@@ -8,18 +8,16 @@ SIMGP_BEGIN_DECLS
 
 /* Resizes a picture of 4:2:0 to the size of the destination's descriptor and converts it to RGB565.
  *
- *   src   format and plane[] are read, and
- *         of YUV420: width[] and height[] of planes 0 and 1, whose size plane 2 has as well, and
- *         stride[] of all three;
- *         of T64X32: width[0] and height[0]
+ *   src   format and plane[] are read; of YUV420 also stride[], and width[] and height[] of planes
+ *         0 and 1, plane 2 having the size of plane 1; of T64X32 also width[0] and height[0]
  *   dst   format, RGB565, width[0], height[0], stride[0] and plane[0] are read
  *
  * Luma and chroma are resized as simgp_rsz does (resize.h), from the size of their planes to W x H
  * samples of luma and ceil(W / 2) x ceil(H / 2) of chroma; pixel (x, y) takes chroma sample
  * (x / 2, y / 2), and the matrix of the other conversions (yuv2rgb.h). So this is what a resize of
- * the planes and a conversion give, without the picture between them. The exceptions are odd heights, where
- * some of the conversions give the first row a chroma line of its own, and pictures that
- * keep their size, which are resampled here as well.
+ * the planes and a conversion give, without the picture between them. It differs where a conversion
+ * gives the first row of an odd height a chroma line of its own, and where a picture keeps its
+ * size, which is resampled here as well.
  *
  * Of T64X32, chroma is resized from width[0] / 2 pairs in a row, at least one, and from
  * ceil(height[0] / 2) rows. If height[0] is odd, the last of these is not in the plane: it is the
@@ -35,7 +33,7 @@ SIMGP_API int32_t simgp_rsz_csc(const simgp_img *src, const simgp_img *dst);
 
 /* The arrays are those of the two descriptors, entry k for plane k; the entries that are read are
  * those named above. Sizes are not checked, and a destination of 0 x 0 pixels or less writes
- * nothing. The destination's stride is rounded down to an even number; planes need no alignment. */
+ * nothing. The destination's stride is rounded down to an even number. Planes need no alignment. */
 typedef void simgp_rsz_csc_fn(uint8_t *const *src_planes, const int32_t *src_widths,
                               const int32_t *src_heights, const int32_t *src_strides,
                               const int32_t *dst_widths, const int32_t *dst_heights,

@@ -21,30 +21,29 @@ resize_args whole_samples(const resize_args &a, int size) {
 
 // The resized lines of some columns lie in a block on the stack.
 struct line_block {
-    uint8_t *plan, *ring, *first;
+    memory_pieces memory;
+    uint8_t *plan, *ring;
     ptrdiff_t stride;
+    uint8_t *first;
 
-    line_block(memory_pieces from, const resampling &r, ptrdiff_t columns, ptrdiff_t lines)
-        : plan(from.take(r.plan_bytes(columns))),
-          ring(from.take(r.ring_bytes(columns))),
-          first(nullptr),
-          stride((columns * r.pixel_bytes + resize_alignment - 1) & -ptrdiff_t(resize_alignment)) {
-        first = from.take(lines * stride);
-        used = from.used;
-    }
-    ptrdiff_t used;
+    line_block(const memory_pieces &from, const resampling &r, ptrdiff_t columns, ptrdiff_t lines)
+        : memory(from),
+          plan(memory.take(r.plan_bytes(columns))),
+          ring(memory.take(r.ring_bytes(columns))),
+          stride((columns * r.pixel_bytes + resize_alignment - 1) & -ptrdiff_t(resize_alignment)),
+          first(memory.take(lines * stride)) {}
 };
 
 constexpr ptrdiff_t block_memory = 10752;
 
-// Calls f(x, columns, block, made) for the columns of a resized plane of `width` columns; made.make()
-// makes their lines, for which `block` has room.
+// Calls f(x, columns, block, made) for the columns of a resized plane of `width` columns. `block` has
+// room for so many of their lines, and made.make() makes them.
 template <class F>
 void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdiff_t width,
                              ptrdiff_t lines, F f) {
     resample_memory<block_memory> memory;
     const ptrdiff_t most = columns_of_strips(width, [&](ptrdiff_t n) {
-        return line_block({nullptr}, r, n, lines).used <= block_memory;
+        return line_block({nullptr}, r, n, lines).memory.used <= block_memory;
     });
     for (ptrdiff_t x = 0; x < width; x += most) {
         const ptrdiff_t columns = width - x < most ? width - x : most;
@@ -55,15 +54,18 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 }
 
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
+// Of large planes the lines of the destination are asked for meanwhile, some between every `step`
+// lines that are made: they lie far apart, and no processor foresees them.
 template <sample_kind S, bool Right>
 void quarter_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
+    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32, step = 4;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
     const lines dst = Right ? a.dst : a.dst.upside_down(width);
     transpose_block *const transpose = live_rows().rotate.transpose[size_t(S)];
     const resampling r(kind_of(S), a.step_x, a.step_y);
+    const bool fetch = int64_t(width) * height * size >= fetch_from;
     for_each_block_of_lines(
         r, a.src, width, band,
         [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
@@ -71,8 +73,15 @@ void quarter_turn(const resize_args &args) {
                 const ptrdiff_t rows = height - y < band ? height - y : band;
                 const lines in{block.first, block.stride};
                 const lines to = Right ? in.upside_down(rows) : in;
-                made.make(y, rows, to.first, to.stride);
                 const ptrdiff_t column = Right ? height - y - rows : y;
+                uintptr_t ahead = reinterpret_cast<uintptr_t>(dst.line(x) + column * size);
+                const ptrdiff_t each = (columns * step + rows - 1) / rows;
+                for (ptrdiff_t k = 0; k < rows; k += step) {
+                    if (fetch)
+                        for (ptrdiff_t i = 0; i < each; i++, ahead += uintptr_t(dst.stride))
+                            __builtin_prefetch(reinterpret_cast<const void *>(ahead), 1);
+                    made.make(y + k, rows - k < step ? rows - k : step, to.line(k), to.stride);
+                }
                 for (ptrdiff_t i = 0; i < columns; i += side)
                     transpose(in.first + i * size, in.stride, dst.line(x + i) + column * size,
                               dst.stride, columns - i < side ? columns - i : side, rows, 0);

@@ -23,8 +23,8 @@ SIMGP_BEGIN_DECLS
  *
  * Returns, in this order: SIMGP_ERR_PARAM if the formats differ; SIMGP_ERR_UNSUPPORTED for a code
  * outside 0 to 5; what simgp_rot does, if plane 0 keeps its size; SIMGP_ERR_UNSUPPORTED for every
- * other format, and for SIMGP_ROT_HORI and SIMGP_ROT_VERT; SIMGP_ERR_PARAM if a width or height of a
- * plane is below 1 or larger than the steps can hold (simgp_rsz_get_step); SIMGP_OK. A call that
+ * other format, and for SIMGP_ROT_HORI and SIMGP_ROT_VERT; SIMGP_ERR_PARAM if a width or height of
+ * a plane is below 1 or larger than the steps can hold (simgp_rsz_get_step); SIMGP_OK. A call that
  * fails has written nothing. Source and destination must not share memory. Any number of calls may
  * run at once on separate destinations. */
 SIMGP_API int32_t simgp_rsz_rot(const simgp_img *src, int32_t rot, const simgp_img *dst);
