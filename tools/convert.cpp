@@ -67,7 +67,7 @@ int main(int argc, char **argv) {
         ->check(CLI::PositiveNumber);
     app.add_option("--as", job.as, "kind of output, whatever its name says")
         ->check(CLI::IsMember({"png", "ppm", "y4m", "raw"}));
-    app.add_flag("-v,--verbose", job.verbose, "say which conversions are used");
+    app.add_flag("-v,--verbose", job.verbose, "say which way the frames go, and who does what");
     app.add_flag("-q,--quiet", job.quiet, "no progress bar, no notes");
     app.add_flag("--list", list, "list all conversions");
     app.add_option("--demo", demo,
