@@ -137,30 +137,10 @@ void resize(const resize_args &a) {
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
-    resample_memory<12288> memory;
-    r.for_each_strip(a.width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
-        const resize_strip strip = r.plan(x, columns, r.whole_rows(a.width), memory.bytes);
-        resampled_lines made(r, strip, src, memory.bytes + r.plan_bytes(columns));
+    resample_plane(r, src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t) {
         made.make(0, a.height, dst.first + x * unit, dst.stride);
     });
 }
-
-// Spreads `to` samples over `from`. The step is a number of 29 bits, with its sign, and so are
-// positions of 32: within 8192 units, and less than 1024 of them from a sample to the next.
-struct spread {
-    bool fits = false;
-    int32_t step = 0, shift = 0;
-
-    spread(int32_t from, int32_t to) {
-        if (from < 1 || to < 1) return;
-        while (shift < 4 && from / to > 2 << shift) shift++;
-        const int32_t units = (from - 1) >> shift;
-        if (units >= 1 << 13 || units / to >= 1 << 10) return;
-        step = units * (1 << 18) / to;
-        fits = true;
-    }
-    int32_t packed() const { return fits ? step * 8 | shift : 0; }
-};
 
 // The planes that are resized; null: the format has no rule. A code without a name has 32 bits.
 constexpr int32_t unnamed_32_bits = 503;
@@ -193,7 +173,8 @@ void copy_plane(const format &f, const simgp_img &src, const simgp_img &dst, int
 }
 
 bool plane_fits(const simgp_img &src, const simgp_img &dst, int k) {
-    return spread(src.width[k], dst.width[k]).fits && spread(src.height[k], dst.height[k]).fits;
+    return resize_spread(src.width[k], dst.width[k]).fits &&
+           resize_spread(src.height[k], dst.height[k]).fits;
 }
 
 void resize_plane(const format &f, const simgp_img &src, const simgp_img &dst, int k) {
@@ -209,16 +190,7 @@ void resize_plane(const format &f, const simgp_img &src, const simgp_img &dst, i
 
 using namespace simgp;
 
-// clang-format off
-#define WEIGHTS(fx, fy) (8 - fx) * (8 - fy), fx * (8 - fy), (8 - fx) * fy, fx * fy
-#define ROW(fx) \
-    WEIGHTS(fx, 0), WEIGHTS(fx, 1), WEIGHTS(fx, 2), WEIGHTS(fx, 3), \
-    WEIGHTS(fx, 4), WEIGHTS(fx, 5), WEIGHTS(fx, 6), WEIGHTS(fx, 7)
-const uint8_t simgp_tbl_rsz_weight[256] = {ROW(0), ROW(1), ROW(2), ROW(3),
-                                           ROW(4), ROW(5), ROW(6), ROW(7)};
-#undef ROW
-#undef WEIGHTS
-// clang-format on
+const uint8_t simgp_tbl_rsz_weight[256] = SIMGP_RESIZE_WEIGHTS;
 
 SIMGP_RESIZE_KERNEL(simgp_rsz_8b, resize<resize_kind::bytes1>(args))
 SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b, resize<resize_kind::bytes2>(args))
@@ -229,8 +201,8 @@ SIMGP_RESIZE_KERNEL(simgp_rsz_5b6b5b, resize<resize_kind::word565>(args))
 void simgp_rsz_get_step(int32_t src_width, int32_t src_height, int32_t dst_width,
                         int32_t dst_height, int32_t mode, int32_t *step_x, int32_t *step_y) {
     const bool turned = mode == SIMGP_ROT_90L || mode == SIMGP_ROT_90R;
-    *step_x = spread(src_width, turned ? dst_height : dst_width).packed();
-    *step_y = spread(src_height, turned ? dst_width : dst_height).packed();
+    *step_x = resize_spread(src_width, turned ? dst_height : dst_width).packed();
+    *step_y = resize_spread(src_height, turned ? dst_width : dst_height).packed();
 }
 
 int32_t simgp_rsz(const simgp_img *src, const simgp_img *dst) {
