@@ -81,7 +81,7 @@ cpu detect() { return {}; }
 row_table tables[size_t(target::count)];
 bool available[size_t(target::count)];
 target best = target::scalar;
-std::atomic<const row_table *> live;
+std::atomic<const row_table *> live_table;
 
 // The rows of a target take the place of the scalar ones.
 row_table &add_table(target t) {
@@ -120,7 +120,7 @@ void fill_tables() {
 #ifdef SIMGP_HAVE_avx512
     if (has.avx512) OFFER(avx512)
 #endif
-    live.store(&tables[size_t(best)], std::memory_order_release);
+    live_table.store(&tables[size_t(best)], std::memory_order_release);
 }
 #undef FILL
 #undef OFFER
@@ -160,10 +160,10 @@ const row_table &rows_of(target t) {
 }
 
 const row_table &live_rows() {
-    const row_table *table = live.load(std::memory_order_acquire);
+    const row_table *table = live_table.load(std::memory_order_acquire);
     if (!table) {
         ensure_tables();
-        table = live.load(std::memory_order_acquire);
+        table = live_table.load(std::memory_order_acquire);
     }
     return *table;
 }
@@ -172,7 +172,7 @@ target live_target() { return target(&live_rows() - tables); }
 
 void force_rows(const row_table *table) {
     ensure_tables();
-    live.store(table ? table : &tables[size_t(best)], std::memory_order_release);
+    live_table.store(table ? table : &tables[size_t(best)], std::memory_order_release);
 }
 
 }  // namespace simgp

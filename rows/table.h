@@ -3,6 +3,7 @@
 #ifndef ROWS_TABLE_H
 #define ROWS_TABLE_H
 
+#include "rows/deblock.h"
 #include "rows/dither.h"
 #include "rows/keyframe.h"
 #include "rows/layout.h"
@@ -16,6 +17,7 @@ namespace simgp {
 
 // A member for each area of the build's list (cmake/targets.cmake), under the area's name.
 struct row_table {
+    deblock_rows deblock;
     dither_rows dither;
     keyframe_rows keyframe;
     layout_rows layout;

@@ -71,6 +71,7 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return _mm256_and_si256(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm256_or_si256(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm256_xor_si256(a, b); }
+inline u8v bit_not(u8v a) { return _mm256_xor_si256(a, _mm256_set1_epi8(-1)); }
 template <int N>
 inline u16v shl(u16v a) {
     static_assert(limits::shift<N>);
@@ -96,6 +97,12 @@ inline u16v mul(u16v a, u16v b) { return _mm256_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm256_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm256_subs_epu8(a, b); }
+
+inline u8v add_u8(u8v a, u8v b) { return _mm256_add_epi8(a, b); }
+inline u8v sub_u8(u8v a, u8v b) { return _mm256_sub_epi8(a, b); }
+inline u8v half_u8(u8v a) {
+    return _mm256_and_si256(_mm256_srli_epi16(a, 1), _mm256_set1_epi8(127));
+}
 
 // All bits of a lane that is true.
 using mask16 = __m256i;
@@ -190,6 +197,7 @@ inline u8v zip_high(u8v a, u8v b) {
     if constexpr (N == 4) return _mm256_unpackhi_epi32(a, b);
     if constexpr (N == 8) return _mm256_unpackhi_epi64(a, b);
 }
+inline u8v blend_u32(u8v a, u8v b) { return _mm256_blend_epi32(a, b, 0xAA); }
 inline u8v shuffle(u8v v, u8v index) { return _mm256_shuffle_epi8(v, index); }
 // Each block reversed, then the blocks exchanged.
 inline u8v reverse_blocks(u8v v, __m128i order) {

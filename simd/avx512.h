@@ -81,6 +81,9 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return _mm512_and_si512(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm512_or_si512(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm512_xor_si512(a, b); }
+// Of an exclusive or with ones GCC 12 makes a ternary operation whose first operand is whatever its
+// destination held: each round of a loop then waits for the one before.
+inline u8v bit_not(u8v a) { return _mm512_ternarylogic_epi32(a, a, a, 0x55); }
 template <int N>
 inline u16v shl(u16v a) {
     static_assert(limits::shift<N>);
@@ -106,6 +109,12 @@ inline u16v mul(u16v a, u16v b) { return _mm512_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm512_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm512_subs_epu8(a, b); }
+
+inline u8v add_u8(u8v a, u8v b) { return _mm512_add_epi8(a, b); }
+inline u8v sub_u8(u8v a, u8v b) { return _mm512_sub_epi8(a, b); }
+inline u8v half_u8(u8v a) {
+    return _mm512_and_si512(_mm512_srli_epi16(a, 1), _mm512_set1_epi8(127));
+}
 
 using mask16 = __mmask32;
 inline mask16 greater(s16v a, s16v b) { return _mm512_cmpgt_epi16_mask(a, b); }
@@ -190,6 +199,7 @@ inline u8v zip_high(u8v a, u8v b) {
     if constexpr (N == 4) return _mm512_unpackhi_epi32(a, b);
     if constexpr (N == 8) return _mm512_unpackhi_epi64(a, b);
 }
+inline u8v blend_u32(u8v a, u8v b) { return _mm512_mask_blend_epi32(0xAAAA, a, b); }
 inline u8v shuffle(u8v v, u8v index) { return _mm512_shuffle_epi8(v, index); }
 struct reverse_index {
     alignas(64) uint8_t u8[64], u16[64];

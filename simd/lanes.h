@@ -142,6 +142,9 @@ inline u8v bit_or(u8v a, u8v b) {
 inline u8v bit_xor(u8v a, u8v b) {
     return make<u8v>([&](int i) { return a.lane[i] ^ b.lane[i]; });
 }
+inline u8v bit_not(u8v a) {
+    return make<u8v>([&](int i) { return ~a.lane[i]; });
+}
 inline u16v bit_and(u16v a, u16v b) {
     return make<u16v>([&](int i) { return a.lane[i] & b.lane[i]; });
 }
@@ -192,6 +195,17 @@ inline u8v add_sat_u8(u8v a, u8v b) {
 }
 inline u8v sub_sat_u8(u8v a, u8v b) {
     return make<u8v>([&](int i) { return clamp_to(0, 255, a.lane[i] - b.lane[i]); });
+}
+
+// Sums and differences of bytes, wrapping, and bytes shifted right by one.
+inline u8v add_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] + b.lane[i]; });
+}
+inline u8v sub_u8(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return a.lane[i] - b.lane[i]; });
+}
+inline u8v half_u8(u8v a) {
+    return make<u8v>([&](int i) { return a.lane[i] >> 1; });
 }
 
 // Truths, one for each 16-bit lane. select takes both bytes of a lane from `yes` or from `no`.
@@ -322,6 +336,10 @@ inline u8v zip_low(u8v a, u8v b) {
 template <int N>
 inline u8v zip_high(u8v a, u8v b) {
     return zip_half<N>(a, b, 1);
+}
+// Lanes of 32 bits: the even ones from a, the odd ones from b.
+inline u8v blend_u32(u8v a, u8v b) {
+    return make<u8v>([&](int i) { return (i / 4 & 1 ? b : a).lane[i]; });
 }
 // Within blocks: byte i is byte index[i] of the same block of v; indices are 0 ... 15.
 inline u8v shuffle(u8v v, u8v index) {

@@ -55,6 +55,7 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return vandq_u8(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return vorrq_u8(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return veorq_u8(a, b); }
+inline u8v bit_not(u8v a) { return vmvnq_u8(a); }
 inline u16v bit_and(u16v a, u16v b) { return vandq_u16(a, b); }
 inline u16v bit_or(u16v a, u16v b) { return vorrq_u16(a, b); }
 template <int N>
@@ -82,6 +83,10 @@ inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return vqsubq_u8(a, b); }
+
+inline u8v add_u8(u8v a, u8v b) { return vaddq_u8(a, b); }
+inline u8v sub_u8(u8v a, u8v b) { return vsubq_u8(a, b); }
+inline u8v half_u8(u8v a) { return vshrq_n_u8(a, 1); }
 
 // All bits of a lane that is true.
 using mask16 = uint16x8_t;
@@ -196,6 +201,9 @@ inline u8v zip_high(u8v a, u8v b) {
     if constexpr (N == 8) return vcombine_u8(vget_high_u8(a), vget_high_u8(b));
 }
 #undef SIMD_ZIP
+inline u8v blend_u32(u8v a, u8v b) {
+    return vbslq_u8(vreinterpretq_u8_u64(vdupq_n_u64(0xFFFFFFFF)), a, b);
+}
 inline u8v shuffle(u8v v, u8v index) {
 #ifdef __aarch64__
     return vqtbl1q_u8(v, index);

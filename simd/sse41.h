@@ -57,6 +57,7 @@ inline int first_zero(u8v v) {
 inline u8v bit_and(u8v a, u8v b) { return _mm_and_si128(a, b); }
 inline u8v bit_or(u8v a, u8v b) { return _mm_or_si128(a, b); }
 inline u8v bit_xor(u8v a, u8v b) { return _mm_xor_si128(a, b); }
+inline u8v bit_not(u8v a) { return _mm_xor_si128(a, _mm_set1_epi8(-1)); }
 template <int N>
 inline u16v shl(u16v a) {
     static_assert(limits::shift<N>);
@@ -82,6 +83,10 @@ inline u16v mul(u16v a, u16v b) { return _mm_mullo_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm_subs_epu8(a, b); }
+
+inline u8v add_u8(u8v a, u8v b) { return _mm_add_epi8(a, b); }
+inline u8v sub_u8(u8v a, u8v b) { return _mm_sub_epi8(a, b); }
+inline u8v half_u8(u8v a) { return _mm_and_si128(_mm_srli_epi16(a, 1), _mm_set1_epi8(127)); }
 
 // All bits of a lane that is true.
 using mask16 = __m128i;
@@ -172,6 +177,7 @@ inline u8v zip_high(u8v a, u8v b) {
     if constexpr (N == 4) return _mm_unpackhi_epi32(a, b);
     if constexpr (N == 8) return _mm_unpackhi_epi64(a, b);
 }
+inline u8v blend_u32(u8v a, u8v b) { return _mm_blend_epi16(a, b, 0xCC); }
 inline u8v shuffle(u8v v, u8v index) { return _mm_shuffle_epi8(v, index); }
 inline u8v reverse_u8(u8v v) {
     return shuffle(v, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));

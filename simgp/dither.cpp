@@ -97,11 +97,17 @@ class dithered_luma {
     ptrdiff_t final_ = 0;  // the rows before are
 };
 
+template <const format &, const format &>
+constexpr bool are_same = false;
+template <const format &F>
+constexpr bool are_same<F, F> = true;
+
 // The rule of the conversion without dithering.
-constexpr yuv_rule rule_between(const format &from, const format &to) {
+template <const format &From, const format &To>
+consteval yuv_rule rule_between() {
     yuv_rule found = yuv_rule::usual;
-#define LOOK(name, from_format, to_format, rule) \
-    if (&from == &formats::from_format && &to == &formats::to_format) found = yuv_rule::rule;
+#define LOOK(name, from, to, rule) \
+    if (are_same<From, formats::from> && are_same<To, formats::to>) found = yuv_rule::rule;
     SIMGP_YUV_TO_RGB_KERNELS(LOOK)
 #undef LOOK
     return found;
@@ -109,7 +115,7 @@ constexpr yuv_rule rule_between(const format &from, const format &to) {
 
 template <const format &From, const format &To, class Luma>
 void luma_to_rgb(const csc_args &a, Luma &&luma) {
-    convert_to_rgb<From, To, rule_between(From, To)>(a, luma);
+    convert_to_rgb<From, To, rule_between<From, To>()>(a, luma);
 }
 
 // Grey is dithered in full height. Of other pictures the last 4 rows, the tail, are converted like a

@@ -36,14 +36,15 @@
  * pictures, simgp_plane_fn on one plane (both in img.h).
  *
  * Names give the operation and then the formats in the direction of the data:
- * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dit
- * dithering.
+ * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dbf8x8
+ * deblocking, dit dithering.
  */
 #ifndef SIMGP_SIMGP_H
 #define SIMGP_SIMGP_H
 
 #include "simgp/copy.h"
 #include "simgp/csc.h"
+#include "simgp/deblock.h"
 #include "simgp/dither.h"
 #include "simgp/img.h"
 #include "simgp/layout.h"
