@@ -83,6 +83,7 @@ std::vector<comparison> copy_comparisons();
 std::vector<comparison> tile_comparisons();
 std::vector<comparison> dither_comparisons();
 std::vector<comparison> deblock_comparisons();
+std::vector<comparison> irsz_comparisons();
 std::vector<comparison> scmn_comparisons();
 
 }  // namespace bench

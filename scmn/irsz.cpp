@@ -22,14 +22,19 @@ struct irsz_format {
 };
 
 // Lines that become words come into being in twos, since the resampler likes to make two at once.
+// They take their part of the stack, or of the cache, from the strips.
 constexpr ptrdiff_t lines_packed = 2, most_packed = 512;
-
-template <const irsz_format &F>
-constexpr ptrdiff_t most_columns = F.packs ? most_packed : PTRDIFF_MAX;
+constexpr ptrdiff_t most_columns(const irsz_format &f) {
+    return f.packs ? most_packed : PTRDIFF_MAX;
+}
+constexpr ptrdiff_t strip_memory(const irsz_format &f) {
+    return resample_stack - (f.packs ? lines_packed * most_packed * f.src_bytes : 0);
+}
 
 // Writes lines first ... first + count - 1 of a strip.
 template <const irsz_format &F, class Lines>
-void write(Lines &made, ptrdiff_t columns, ptrdiff_t first, ptrdiff_t count, const lines &dst) {
+void write_lines(Lines &made, ptrdiff_t columns, ptrdiff_t first, ptrdiff_t count,
+                 const lines &dst) {
     if constexpr (F.packs) {
         const ptrdiff_t stride = columns * F.src_bytes;
         uint8_t some[lines_packed * most_packed * F.src_bytes];
@@ -44,19 +49,16 @@ void write(Lines &made, ptrdiff_t columns, ptrdiff_t first, ptrdiff_t count, con
     }
 }
 
-// A part of the stack is for lines that become words.
-constexpr size_t stack_memory = 9216;
-
 // From a source of lines.
 template <const irsz_format &F, class Source>
 void resize(const resampling &r, const Source &src, ptrdiff_t width, ptrdiff_t first,
             ptrdiff_t count, const lines &dst) {
-    resample_plane<stack_memory>(
+    resample_plane<strip_memory(F)>(
         r, src, width,
         [&](auto &made, ptrdiff_t x, ptrdiff_t columns) {
-            write<F>(made, columns, first, count, dst.from(x * F.dst_bytes, 0));
+            write_lines<F>(made, columns, first, count, dst.from(x * F.dst_bytes, 0));
         },
-        most_columns<F>);
+        most_columns(F));
 }
 
 template <const irsz_format &F>
@@ -79,7 +81,7 @@ void resize_row(const void *const *of, const uint8_t *wrow, int32_t width, int32
     if (width < 1) return;
     // Of phase 0 across, the weight of the lower line is 8 times the phase down. Row 1, with a step
     // of two lines and this phase, lies where it should; with a step as long no row is kept.
-    const int32_t phase = wrow[2] >> 3, step_y = 2 << 18 | phase << 15;
+    const int32_t phase = wrow[2] >> 3 & 7, step_y = 2 << 18 | phase << 15;
     const int32_t step_x = int32_t(uint32_t(inc_x) << 3 | uint32_t(shift_x));
     resize<F>(resampling(F.kind, step_x, step_y << 3), line_pair{of}, width, 1, 1,
               lines_of(dst, 0));
@@ -148,7 +150,8 @@ void resize_band(band_resizer &b, const uint8_t *src, ptrdiff_t first, ptrdiff_t
         const lines dst = lines_of(b.dst, stride).from(0, next);
         for (ptrdiff_t k = 0; k < b.count; k++) {
             band_strip &s = b.strips[k];
-            write<F>(s.made, s.plan.columns, next, row - next, dst.from(s.x * F.dst_bytes, 0));
+            write_lines<F>(s.made, s.plan.columns, next, row - next,
+                           dst.from(s.x * F.dst_bytes, 0));
         }
     }
 
@@ -242,8 +245,7 @@ scmn_irsz_ctx *make_whole(const scmn_irsz_ctx &c) {
 scmn_irsz_ctx *make_for_bands(const scmn_irsz_ctx &c, const irsz_format &f, int32_t src_w) {
     const resampling r(f.kind, c.inc_x << 3 | c.shift_x, c.inc_y << 3 | c.shift_y);
     // As wide as those of the kernels are, so that what a strip works on stays in the cache.
-    const ptrdiff_t columns =
-        r.strip_width(c.dst_w, stack_memory, f.packs ? most_packed : PTRDIFF_MAX);
+    const ptrdiff_t columns = r.strip_width(c.dst_w, strip_memory(f), most_columns(f));
     const ptrdiff_t count = (c.dst_w + columns - 1) / columns;
     const ptrdiff_t strip_bytes = r.plan_bytes(columns) + r.ring_bytes(columns);
     const uint64_t size = sizeof(band_resizer) + resize_alignment +

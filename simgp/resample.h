@@ -55,7 +55,8 @@ struct source_span {
     ptrdiff_t first, columns;
 };
 
-// Stack memory for plans and kept rows.
+// Stack memory for plans and kept rows, as much as a kernel has for them.
+inline constexpr ptrdiff_t resample_stack = 12288;
 template <size_t Size>
 struct resample_memory {
     static constexpr ptrdiff_t size = Size;
@@ -226,7 +227,7 @@ class resampled_lines {
 // Calls write(made, x, columns) for all strips of a plane of `width` columns: what is made are the
 // lines of the strip from column x on. No strip has more than `most` columns. The source is one of
 // whole rows.
-template <size_t Memory = 12288, class Source, class Write>
+template <size_t Memory = resample_stack, class Source, class Write>
 void resample_plane(const resampling &r, const Source &src, ptrdiff_t width, Write write,
                     ptrdiff_t most = PTRDIFF_MAX) {
     resample_memory<Memory> memory;
