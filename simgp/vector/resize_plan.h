@@ -71,10 +71,27 @@ inline int32_t begin_of_step(const resize_strip &s, int32_t step) {
     return step + 1 < s.steps ? step * bytes : s.last;
 }
 
+// Eight lanes are planned at once, in vectors of the compiler's, of which two are needed where they
+// have 16 bytes: there is a plan for every strip, and of a small picture it is a good part of the
+// work.
+using plan_vector = int32_t __attribute__((vector_size(bytes < 32 ? 16 : 32)));
+using unsigned_plan_vector = uint32_t __attribute__((vector_size(sizeof(plan_vector))));
+using plan_pairs = uint16_t __attribute__((vector_size(sizeof(plan_vector) / 2)));
+inline constexpr int plan_parts = 32 / sizeof(plan_vector);
+
+// Bytes low[0], high[0], low[1], ... of numbers 0 ... 255.
+[[gnu::always_inline]] inline plan_pairs pairs_of(const plan_vector &low, const plan_vector &high) {
+    return __builtin_convertvector(low | high << 8, plan_pairs);
+}
+// Those of part h of eight.
+[[gnu::always_inline]] inline void put_pairs(uint8_t *to, int h, const plan_pairs &pairs) {
+    memcpy(to + h * int(sizeof pairs), &pairs, sizeof pairs);
+}
+
 // Pixel and channel of the lanes that follow one of channel k of its pixel.
 template <int C>
 struct following {
-    int32_t pixel[C][8], channel[C][8];
+    alignas(32) int32_t pixel[C][8], channel[C][8];
     constexpr following() : pixel(), channel() {
         for (int k = 0; k < C; k++)
             for (int i = 0; i < 8; i++) {
@@ -88,34 +105,46 @@ struct following {
 template <int C>
 struct eight_lanes {
     static constexpr following<C> after{};
-    int32_t p[8], q[8], phase[8];
-    int32_t first;  // the lowest of them
+    plan_vector p[plan_parts], q[plan_parts], phase[plan_parts];
+    int32_t first;  // the lowest of the bytes
 
     [[gnu::always_inline]] eight_lanes(const resize_strip &s, int32_t lane) {
-        const int32_t last_column = s.x + s.columns - 1;
+        const int32_t last_column = s.x + s.columns - 1, origin = C * s.first;
+        const bool whole = lane + 8 <= s.lanes;
         if (lane >= s.lanes) lane = s.lanes - 1;
-        const int32_t column = s.x + lane / C, k = lane % C, tap = C << s.shift;
-        const int32_t origin = C * s.first;
-        for (int i = 0; i < 8; i++) {
-            int32_t x = column + after.pixel[k][i];
-            x = x < last_column ? x : last_column;
-            const int32_t eighths = int32_t(uint32_t(x) * s.step) >> 15;
-            phase[i] = eighths & 7;
-            p[i] = ((eighths >> 3) << s.shift) * C + after.channel[k][i] - origin;
-            q[i] = p[i] + (phase[i] ? tap : 0);
+        const int32_t column = s.x + lane / C, k = lane % C;
+        for (int h = 0; h < plan_parts; h++) {
+            plan_vector x, channel;
+            memcpy(&x, after.pixel[k] + 8 / plan_parts * h, sizeof x);
+            memcpy(&channel, after.channel[k] + 8 / plan_parts * h, sizeof channel);
+            x += column;
+            if (!whole) {
+                const plan_vector inside = x < last_column;
+                x = (x & inside) | (last_column & ~inside);
+            }
+            const plan_vector eighths = (plan_vector)((unsigned_plan_vector)x * s.step) >> 15;
+            phase[h] = eighths & 7;
+            p[h] = ((eighths >> 3) << s.shift) * C + (channel - origin);
+            q[h] = p[h] + ((phase[h] != 0) & (C << s.shift));
         }
         // That of the first lane, or channel 0 of the next pixel where that lies before it.
-        first = p[0];
-        if (C > 1 && k > 0 && p[C - k] < first) first = p[C - k];
+        const auto pixel = [&](int32_t x) {
+            return ((int32_t(uint32_t(x) * s.step) >> 18) << s.shift) * C - origin;
+        };
+        first = pixel(column) + k;
+        if (C > 1 && k > 0) {
+            const int32_t next = pixel(column < last_column ? column + 1 : column);
+            first = next < first ? next : first;
+        }
+    }
+    // The weights of p and q, 8 * scale together.
+    [[gnu::always_inline]] void put_weights(uint8_t *to, int scale) const {
+        for (int h = 0; h < plan_parts; h++)
+            put_pairs(to, h, pairs_of((8 - phase[h]) * scale, phase[h] * scale));
     }
 };
 
-// Bytes low[0], high[0], low[1], ...
-[[gnu::always_inline]] inline void put_pairs(uint8_t *to, const int32_t *low, const int32_t *high) {
-    uint16_t pair[8];
-    for (int i = 0; i < 8; i++) pair[i] = uint16_t((low[i] & 255) | high[i] << 8);
-    memcpy(to, pair, sizeof pair);
-}
+inline constexpr uint8_t in_order[16] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
 
 // The part of a step in block j of vector v. Returns whether its pairs lie in the row as they are.
 template <int C, int Scale, int W>
@@ -123,30 +152,32 @@ template <int C, int Scale, int W>
                                               int32_t lane) {
     const eight_lanes<C> l(s, lane);
     const int32_t limit = s.row_bytes > 16 ? s.row_bytes - 16 : 0;
-    int32_t low[8], high[8];
-    for (int i = 0; i < 8; i++) {
-        low[i] = Scale * (8 - l.phase[i]);
-        high[i] = Scale * l.phase[i];
-    }
-    put_pairs(p.weight[v] + 16 * j, low, high);
-    int32_t other = 0;
+    l.put_weights(p.weight[v] + 16 * j, Scale);
+    plan_pairs moved = {};
     for (int w = 0; w < W; w++) {
         const int32_t from = l.first + 16 * w;
         const int32_t base = s.shared && v ? p.at[0][0][j] : from < limit ? from : limit;
         p.at[v][w][j] = base;
-        for (int i = 0; i < 8; i++) {
-            low[i] = l.p[i] - base;
-            high[i] = l.q[i] - base;
+        for (int h = 0; h < plan_parts; h++) {
+            plan_vector low = l.p[h] - base, high = l.q[h] - base;
+            if constexpr (W > 1) {
+                const plan_vector in_low = ((l.p[h] - from) & ~15) == 0;
+                const plan_vector in_high = ((l.q[h] - from) & ~15) == 0;
+                low = (low & in_low) | (0x80 & ~in_low);
+                high = (high & in_high) | (0x80 & ~in_high);
+            }
+            const plan_pairs index = pairs_of(low, high);
+            put_pairs(p.index[v][w] + 16 * j, h, index);
             if constexpr (W == 1) {
-                other |= (low[i] ^ 2 * i) | (high[i] ^ (2 * i + 1));
-            } else {
-                low[i] = ((l.p[i] - from) & ~15) == 0 ? low[i] : 0x80;
-                high[i] = ((l.q[i] - from) & ~15) == 0 ? high[i] : 0x80;
+                plan_pairs as_they_are;
+                memcpy(&as_they_are, in_order + 16 / plan_parts * h, sizeof as_they_are);
+                moved |= index ^ as_they_are;
             }
         }
-        put_pairs(p.index[v][w] + 16 * j, low, high);
     }
-    return other == 0;
+    uint64_t any[sizeof moved / 8];
+    memcpy(any, &moved, sizeof moved);
+    return W == 1 && (any[0] | any[sizeof moved / 8 - 1]) == 0;
 }
 
 // A run of steps whose pairs lie in the row as they are, and end to end, is noted down: these need
@@ -184,12 +215,14 @@ static void plan_far(resize_strip &s) {
         for (int v = 0; v < 2; v++)
             for (int j = 0; j < blocks; j++) {
                 const eight_lanes<C> l(s, begin_of_step(s, t) + 16 * j + 8 * v);
+                l.put_weights(plan[t].weight[v] + 16 * j, Scale);
+                int32_t *const at = plan[t].at + v * bytes + 16 * j;
+                int32_t p[8], q[8];
+                memcpy(p, l.p, sizeof p);
+                memcpy(q, l.q, sizeof q);
                 for (int i = 0; i < 8; i++) {
-                    const int k = 16 * j + 2 * i;
-                    plan[t].weight[v][k] = uint8_t(Scale * (8 - l.phase[i]));
-                    plan[t].weight[v][k + 1] = uint8_t(Scale * l.phase[i]);
-                    plan[t].at[v * bytes + k] = l.p[i];
-                    plan[t].at[v * bytes + k + 1] = l.q[i];
+                    at[2 * i] = p[i];
+                    at[2 * i + 1] = q[i];
                 }
             }
 }
