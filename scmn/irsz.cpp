@@ -21,14 +21,25 @@ struct irsz_format {
     int32_t unit;  // bytes that lengths count in
 };
 
-// Lines that become words come into being in twos, since the resampler likes to make two at once.
-// They take their part of the stack, or of the cache, from the strips.
+// Lines that become words wait in a part of the stack, as many as the resampler makes at once, which
+// strips of so many columns leave for them.
 constexpr ptrdiff_t lines_packed = 2, most_packed = 512;
 constexpr ptrdiff_t most_columns(const irsz_format &f) {
     return f.packs ? most_packed : PTRDIFF_MAX;
 }
 constexpr ptrdiff_t strip_memory(const irsz_format &f) {
     return resample_stack - (f.packs ? lines_packed * most_packed * f.src_bytes : 0);
+}
+
+// Packs a line. The two lines below come next: a strip's short lines are too many streams for the
+// processor to see what will be written.
+void pack_line(rgb_to_rgb_row *pack, const uint8_t *src, const lines &dst, ptrdiff_t y,
+               ptrdiff_t columns) {
+    const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst.first) +
+                            uintptr_t(y + lines_packed) * uintptr_t(dst.stride);
+    for (ptrdiff_t x = 0; x < 2 * columns; x += 64)
+        __builtin_prefetch(reinterpret_cast<const void *>(ahead + uintptr_t(x)), 1);
+    pack(src, dst.line(y), columns);
 }
 
 // Writes lines first ... first + count - 1 of a strip.
@@ -39,10 +50,10 @@ void write_lines(Lines &made, ptrdiff_t columns, ptrdiff_t first, ptrdiff_t coun
         const ptrdiff_t stride = columns * F.src_bytes;
         uint8_t some[lines_packed * most_packed * F.src_bytes];
         const auto pack = live_rows().rgb2yuv.to_rgb565[size_t(rgb_packing::rgb888)];
-        for (ptrdiff_t y = 0; y < count; y += lines_packed) {
-            const ptrdiff_t n = count - y < lines_packed ? count - y : lines_packed;
-            made.make(first + y, n, some, stride);
-            for (ptrdiff_t i = 0; i < n; i++) pack(some + i * stride, dst.line(y + i), columns);
+        for (ptrdiff_t y = 0; y < count;) {
+            const ptrdiff_t end = y + made.make_some(first + y, first + count, some, stride);
+            for (const uint8_t *line = some; y < end; y++, line += stride)
+                pack_line(pack, line, dst, y, columns);
         }
     } else {
         made.make(first, count, dst.first, dst.stride);
@@ -135,6 +146,16 @@ struct band_resizer : scmn_irsz_ctx {
     ptrdiff_t count;
 };
 
+// How many rows need no line from `end` on: those whose position, in whole eighths, is that of the
+// last line with taps before `end`, or less.
+ptrdiff_t rows_before(const band_resizer &b, ptrdiff_t end) {
+    constexpr ptrdiff_t units = 1 << 13;  // positions are below
+    const ptrdiff_t last = (end - 1) >> b.r.y.shift, step = b.inc_y;
+    if (last >= units || step == 0) return b.dst_h;
+    const ptrdiff_t beyond = (8 * last + 1) * (1 << 15), rows = (beyond - 1) / step + 1;
+    return rows < b.dst_h ? rows : b.dst_h;
+}
+
 template <const irsz_format &F>
 void resize_band(band_resizer &b, const uint8_t *src, ptrdiff_t first, ptrdiff_t count) {
     if (count < 1) return;
@@ -143,9 +164,8 @@ void resize_band(band_resizer &b, const uint8_t *src, ptrdiff_t first, ptrdiff_t
     b.now.given = {src, ptrdiff_t(b.src_line) * F.unit};
     b.now.first = first;
 
-    const ptrdiff_t next = b.row - b.carry;
-    ptrdiff_t row = next;
-    while (row < b.dst_h && y.next(row) < end) row++;
+    const ptrdiff_t next = b.row - b.carry, ready = rows_before(b, end);
+    const ptrdiff_t row = ready > next ? ready : next;
     if (row > next) {
         const lines dst = lines_of(b.dst, stride).from(0, next);
         for (ptrdiff_t k = 0; k < b.count; k++) {

@@ -166,11 +166,17 @@ class resampled_lines {
     // rising order.
     void make(ptrdiff_t first, ptrdiff_t count, uint8_t *dst, ptrdiff_t stride) {
         for (const ptrdiff_t end = first + count; first < end;) {
-            const int made = r_.keeps() ? make_from_kept(first, end, dst, stride)
-                                        : make_from_rows(first, end, dst, stride);
+            const int made = make_some(first, end, dst, stride);
             first += made;
             dst += made * stride;
         }
+    }
+
+    // Makes line `first` and, where that goes well together and it lies before `end`, the next.
+    // Returns how many.
+    int make_some(ptrdiff_t first, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
+        return r_.keeps() ? make_from_kept(first, end, dst, stride)
+                          : make_from_rows(first, end, dst, stride);
     }
 
   private:
