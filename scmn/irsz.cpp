@@ -148,18 +148,19 @@ struct band_resizer : scmn_irsz_ctx {
 
 // How many rows need no line from `end` on: those whose position, in whole eighths, is that of the
 // last line with taps before `end`, or less.
-ptrdiff_t rows_before(const band_resizer &b, ptrdiff_t end) {
-    constexpr ptrdiff_t units = 1 << 13;  // positions are below
-    const ptrdiff_t last = (end - 1) >> b.r.y.shift, step = b.inc_y;
-    if (last >= units || step == 0) return b.dst_h;
-    const ptrdiff_t beyond = (8 * last + 1) * (1 << 15), rows = (beyond - 1) / step + 1;
+ptrdiff_t rows_before(const band_resizer &b, int64_t end) {
+    constexpr int64_t units = 1 << 13;  // positions are below
+    const int64_t last = (end - 1) >> b.shift_y;
+    if (last >= units || b.inc_y == 0) return b.dst_h;
+    const int32_t beyond = (8 * int32_t(last) + 1) * (1 << 15), rows = (beyond - 1) / b.inc_y + 1;
     return rows < b.dst_h ? rows : b.dst_h;
 }
 
 template <const irsz_format &F>
-void resize_band(band_resizer &b, const uint8_t *src, ptrdiff_t first, ptrdiff_t count) {
-    if (count < 1) return;
-    const ptrdiff_t end = first + count, stride = ptrdiff_t(b.dst_line) * F.unit;
+void resize_band(band_resizer &b, const uint8_t *src, int32_t first, int32_t count) {
+    if (first < 0 || count < 1) return;
+    const int64_t end = int64_t(first) + count;
+    const ptrdiff_t stride = ptrdiff_t(b.dst_line) * F.unit;
     const resize_axis &y = b.r.y;
     b.now.given = {src, ptrdiff_t(b.src_line) * F.unit};
     b.now.first = first;

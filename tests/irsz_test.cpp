@@ -347,6 +347,10 @@ void check_bands(const kind &k, const picture_case &c, rig::rng &random) {
         band.fill(rig::content::random, random);
         line += lines;
 
+        // Bands that are none change nothing.
+        scmn_irsz(resizer, nullptr, line, 0);
+        scmn_irsz(resizer, nullptr, -1, 1);
+
         // What could be written has been, and nothing else.
         const int since = written;
         while (written < to.height && y.lower(written) < line) written++;
