@@ -87,6 +87,7 @@ std::vector<comparison> deblock_comparisons();
 std::vector<comparison> rotate_comparisons();
 std::vector<comparison> resize_rot_comparisons();
 std::vector<comparison> resize_csc_comparisons();
+std::vector<comparison> irsz_comparisons();
 std::vector<comparison> scmn_comparisons();
 
 }  // namespace bench

@@ -5,6 +5,7 @@
  *   mem.h        32-byte aligned blocks, strided block copy, fast fills, log2, the build stamp
  *   bits.h       bit readers (most or least significant bit first) and a bit writer
  *   tags.h       FourCC and WAVE format tag -> media type
+ *   irsz.h       a resizer for pictures that arrive in bands of lines
  *   keyframe.h   may playback start at this coded picture?
  *
  * A demultiplexer uses the last two like this. It has the tag of the video track as the container
@@ -26,9 +27,9 @@
  *   hold pointers are native.
  * - Nothing outside the buffers that are given is read or written, unless the function says so; no
  *   buffer needs padding or alignment.
- * - Nothing is allocated but by the aligned allocator. No threads, no state that a caller can see,
- *   nothing to start up or shut down. All functions may run on any number of threads at once, on
- *   separate contexts and destinations.
+ * - Nothing is allocated but by the aligned allocator and by scmn_irsz_create. No threads, no state
+ *   that a caller can see, nothing to start up or shut down. All functions may run on any number of
+ *   threads at once, on separate contexts and destinations.
  * - Failures are reported in the returned value and nowhere else. Arguments outside their range are
  *   not checked, unless the function says what it does with them; no pointer may be NULL, unless it
  *   says so.
@@ -37,6 +38,7 @@
 #define SCMN_SCMN_H
 
 #include "scmn/bits.h"
+#include "scmn/irsz.h"
 #include "scmn/keyframe.h"
 #include "scmn/mem.h"
 #include "scmn/tags.h"

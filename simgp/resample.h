@@ -2,11 +2,8 @@
 // source come. The kernels that resize share it:
 //
 //     const resampling r(resize_kind::bytes1, step_x, step_y);
-//     resample_memory<10752> memory;
-//     r.for_each_strip(width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
-//         const resize_strip strip = r.plan(x, columns, r.whole_rows(width), memory.bytes);
-//         resampled_lines lines(r, strip, src, memory.bytes + r.plan_bytes(columns));
-//         lines.make(0, height, dst.line(0) + x * r.pixel_bytes, dst.stride);
+//     resample_plane(r, src, width, [&](auto &made, ptrdiff_t x, ptrdiff_t) {
+//         made.make(0, height, dst.first + x * r.pixel_bytes, dst.stride);
 //     });
 #ifndef SIMGP_RESAMPLE_H
 #define SIMGP_RESAMPLE_H
@@ -36,12 +33,31 @@ struct resize_axis {
     ptrdiff_t extent(ptrdiff_t n) const { return next(n - 1) + 1; }
 };
 
+// The step of an axis that spreads `to` samples over `from`. Packed it is a number of 29 bits, with
+// its sign, and positions are of 32: within 8192 units, and less than 1024 of them from a sample to
+// the next.
+struct resize_spread {
+    bool fits = false;
+    int32_t step = 0, shift = 0;
+
+    resize_spread(int32_t from, int32_t to) {
+        if (from < 1 || to < 1) return;
+        while (shift < 4 && from / to > 2 << shift) shift++;
+        const int32_t units = (from - 1) >> shift;
+        if (units >= 1 << 13 || units / to >= 1 << 10) return;
+        step = units * (1 << 18) / to;
+        fits = true;
+    }
+    int32_t packed() const { return fits ? step * 8 | shift : 0; }
+};
+
 // Which part of the source's rows is handed over: from a column on, so many columns.
 struct source_span {
     ptrdiff_t first, columns;
 };
 
-// Stack memory for plans and kept rows.
+// Stack memory for plans and kept rows, as much as a kernel has for them.
+inline constexpr ptrdiff_t resample_stack = 12288;
 template <size_t Size>
 struct resample_memory {
     static constexpr ptrdiff_t size = Size;
@@ -113,16 +129,18 @@ class resampling {
         const ptrdiff_t loss = (1 + 2 * sources) * (resize_alignment - 1);
         return step == 0 ? PTRDIFF_MAX : (memory - loss) / step * strip_.step_bytes / pixel_bytes;
     }
-    // Calls f(x, columns) for strips of about the same width that fit the memory.
+    // The width of strips that fit the memory, of about the same width all, and of `most` columns.
+    ptrdiff_t strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t most = PTRDIFF_MAX) const {
+        const ptrdiff_t fit = columns_in(memory);
+        if (fit < most) most = fit;
+        if (width <= most) return width;
+        const ptrdiff_t strips = (width + most - 1) / most;
+        const ptrdiff_t columns = round_up((width + strips - 1) / strips, strip_.step_bytes);
+        return columns < most ? columns : most;
+    }
+    // Calls f(x, columns) for each of them.
     template <class F>
-    void for_each_strip(ptrdiff_t width, ptrdiff_t memory, F f) const {
-        const ptrdiff_t most = columns_in(memory);
-        ptrdiff_t columns = width;
-        if (width > most) {
-            const ptrdiff_t strips = (width + most - 1) / most;
-            columns = round_up((width + strips - 1) / strips, strip_.step_bytes);
-            if (columns > most) columns = most;
-        }
+    void for_each_strip(ptrdiff_t width, ptrdiff_t columns, F f) const {
         for (ptrdiff_t at = 0; at < width; at += columns)
             f(at, width - at < columns ? width - at : columns);
     }
@@ -179,11 +197,17 @@ class resampled_lines {
     // rising order.
     void make(ptrdiff_t first, ptrdiff_t count, uint8_t *dst, ptrdiff_t stride) {
         for (const ptrdiff_t end = first + count; first < end;) {
-            const int made = r_.keeps() ? make_from_kept(first, end, dst, stride)
-                                        : make_from_rows(first, end, dst, stride);
+            const int made = make_some(first, end, dst, stride);
             first += made;
             dst += made * stride;
         }
+    }
+
+    // Makes line `first` and, where that goes well together and it lies before `end`, the next.
+    // Returns how many.
+    int make_some(ptrdiff_t first, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
+        return r_.keeps() ? make_from_kept(first, end, dst, stride)
+                          : make_from_rows(first, end, dst, stride);
     }
 
   private:
@@ -237,23 +261,6 @@ class resampled_lines {
     ptrdiff_t held_[2] = {-1, -1};
 };
 
-// Spreads `to` samples over `from`. The step is a number of 29 bits, with its sign, and so are
-// positions of 32: within 8192 units, and less than 1024 of them from a sample to the next.
-struct resize_spread {
-    bool fits = false;
-    int32_t step = 0, shift = 0;
-
-    resize_spread(int32_t from, int32_t to) {
-        if (from < 1 || to < 1) return;
-        while (shift < 4 && from / to > 2 << shift) shift++;
-        const int32_t units = (from - 1) >> shift;
-        if (units >= 1 << 13 || units / to >= 1 << 10) return;
-        step = units * (1 << 18) / to;
-        fits = true;
-    }
-    int32_t packed() const { return fits ? step * 8 | shift : 0; }
-};
-
 inline bool is_quarter_turn(int32_t rot) { return rot == SIMGP_ROT_90L || rot == SIMGP_ROT_90R; }
 
 // Whether plane k of src can be resized to that of dst, which a quarter turn then exchanges the sides
@@ -275,6 +282,21 @@ inline void resize_plane(simgp_rsz_fn *kernel, const simgp_img &src, const simgp
            step_x, step_y);
 }
 
+// Calls write(made, x, columns) for all strips of a plane of `width` columns: what is made are the
+// lines of the strip from column x on. No strip has more than `most` columns. The source is one of
+// whole rows.
+template <size_t Memory = resample_stack, class Source, class Write>
+void resample_plane(const resampling &r, const Source &src, ptrdiff_t width, Write write,
+                    ptrdiff_t most = PTRDIFF_MAX) {
+    resample_memory<Memory> memory;
+    const ptrdiff_t columns = r.strip_width(width, memory.size, most);
+    r.for_each_strip(width, columns, [&](ptrdiff_t x, ptrdiff_t n) {
+        const resize_strip strip = r.plan(x, n, r.whole_rows(width), memory.bytes);
+        resampled_lines made(r, strip, src, memory.bytes + r.plan_bytes(n));
+        write(made, x, n);
+    });
+}
+
 // The arguments of a kernel that resizes a plane.
 struct resize_args {
     const_lines src;
@@ -294,5 +316,19 @@ struct resize_args {
             simgp::lines_of(dst_plane, dst_stride), step_x,    step_y};                         \
         __VA_ARGS__;                                                                            \
     }
+
+// The weights in 64ths, four for each pair of phases; simgp/resize.h says which.
+// clang-format off
+#define SIMGP_RESIZE_WEIGHTS \
+    {SIMGP_RESIZE_WEIGHTS_OF(0), SIMGP_RESIZE_WEIGHTS_OF(1), SIMGP_RESIZE_WEIGHTS_OF(2), \
+     SIMGP_RESIZE_WEIGHTS_OF(3), SIMGP_RESIZE_WEIGHTS_OF(4), SIMGP_RESIZE_WEIGHTS_OF(5), \
+     SIMGP_RESIZE_WEIGHTS_OF(6), SIMGP_RESIZE_WEIGHTS_OF(7)}
+#define SIMGP_RESIZE_WEIGHTS_OF(fx) \
+    SIMGP_RESIZE_WEIGHT(fx, 0), SIMGP_RESIZE_WEIGHT(fx, 1), SIMGP_RESIZE_WEIGHT(fx, 2), \
+    SIMGP_RESIZE_WEIGHT(fx, 3), SIMGP_RESIZE_WEIGHT(fx, 4), SIMGP_RESIZE_WEIGHT(fx, 5), \
+    SIMGP_RESIZE_WEIGHT(fx, 6), SIMGP_RESIZE_WEIGHT(fx, 7)
+#define SIMGP_RESIZE_WEIGHT(fx, fy) \
+    (8 - (fx)) * (8 - (fy)), (fx) * (8 - (fy)), (8 - (fx)) * (fy), (fx) * (fy)
+// clang-format on
 
 #endif

@@ -137,10 +137,7 @@ void resize(const resize_args &a) {
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
-    resample_memory<10752> memory;
-    r.for_each_strip(a.width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
-        const resize_strip strip = r.plan(x, columns, r.whole_rows(a.width), memory.bytes);
-        resampled_lines made(r, strip, src, memory.bytes + r.plan_bytes(columns));
+    resample_plane(r, src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t) {
         made.make(0, a.height, dst.first + x * unit, dst.stride);
     });
 }
@@ -180,16 +177,7 @@ void copy_plane(const format &f, const simgp_img &src, const simgp_img &dst, int
 
 using namespace simgp;
 
-// clang-format off
-#define WEIGHTS(fx, fy) (8 - fx) * (8 - fy), fx * (8 - fy), (8 - fx) * fy, fx * fy
-#define ROW(fx) \
-    WEIGHTS(fx, 0), WEIGHTS(fx, 1), WEIGHTS(fx, 2), WEIGHTS(fx, 3), \
-    WEIGHTS(fx, 4), WEIGHTS(fx, 5), WEIGHTS(fx, 6), WEIGHTS(fx, 7)
-const uint8_t simgp_tbl_rsz_weight[256] = {ROW(0), ROW(1), ROW(2), ROW(3),
-                                           ROW(4), ROW(5), ROW(6), ROW(7)};
-#undef ROW
-#undef WEIGHTS
-// clang-format on
+const uint8_t simgp_tbl_rsz_weight[256] = SIMGP_RESIZE_WEIGHTS;
 
 SIMGP_RESIZE_KERNEL(simgp_rsz_8b, resize<resize_kind::bytes1>(args))
 SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b, resize<resize_kind::bytes2>(args))

@@ -15,9 +15,9 @@ SIMGP_BEGIN_DECLS
  * Luma and chroma are resized as simgp_rsz does (resize.h), from the size of their planes to W x H
  * samples of luma and ceil(W / 2) x ceil(H / 2) of chroma; pixel (x, y) takes chroma sample
  * (x / 2, y / 2), and the matrix of the other conversions (yuv2rgb.h). So this is what a resize of
- * the planes and a conversion give, without the picture between them. It differs where a conversion
- * gives the first row of an odd height a chroma line of its own, and where a picture keeps its
- * size, which is resampled here as well.
+ * the planes and a conversion give, without the picture between them. The exceptions are odd
+ * heights, where some of the conversions give the first row a chroma line of its own, and pictures
+ * that keep their size, which are resampled here as well.
  *
  * Of T64X32, chroma is resized from width[0] / 2 pairs in a row, at least one, and from
  * ceil(height[0] / 2) rows. If height[0] is odd, the last of these is not in the plane: it is the
