@@ -43,9 +43,9 @@ SIMGP_API extern const uint8_t simgp_tbl_rsz_weight[256];
  *                            over dst_height and its height over dst_width
  *   step_x, step_y           the two steps are stored here; along the source's rows and columns
  *
- * An extent that is below 1, or a source extent beyond what the arithmetic holds, gives a step of 0:
- * 8192 samples with shift 0, 16384 with 1, 32768 with 2, 65536 with 3, 131072 with 4, and in any case
- * 16384 for each sample of the destination. */
+ * An extent that is below 1, or a source extent beyond what the arithmetic holds, gives a step of
+ * 0: 8192 samples with shift 0, 16384 with 1, 32768 with 2, 65536 with 3, 131072 with 4, and in any
+ * case 16384 for each sample of the destination. */
 SIMGP_API void simgp_rsz_get_step(int32_t src_width, int32_t src_height, int32_t dst_width,
                                   int32_t dst_height, int32_t mode, int32_t *step_x,
                                   int32_t *step_y);

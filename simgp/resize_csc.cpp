@@ -235,14 +235,14 @@ class fused {
         return {first, part.first + part.columns - first};
     }
     auto rows_of(int plane, const resampling &r, const span &at, const grid &g,
-                 uint8_t *memory) const {
+                 uint8_t *room) const {
         if constexpr (tiled) {
             const source_span part = span_of(r, at, g);
             const ptrdiff_t first = part.first * r.pixel_bytes;
             return untiled_rows({planes_[plane], sizes_.luma.src_width,
                                  plane ? sizes_.luma.src_height / 2 : sizes_.luma.src_height, first,
                                  first + part.columns * r.pixel_bytes, r.y.extent(g.dst_height)},
-                                access_of(r), memory, row_stride(r, at.columns));
+                                access_of(r), room, row_stride(r, at.columns));
         } else {
             return const_lines{planes_[plane], strides_[plane]};
         }
