@@ -57,7 +57,7 @@ struct source_span {
 };
 
 // Stack memory for plans and kept rows, as much as a kernel has for them.
-inline constexpr ptrdiff_t resample_stack = 12288;
+inline constexpr ptrdiff_t resample_stack = 10752;
 template <size_t Size>
 struct resample_memory {
     static constexpr ptrdiff_t size = Size;

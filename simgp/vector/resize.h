@@ -10,8 +10,14 @@
 #include "simgp/vector/fetch.h"
 #include "simgp/vector/resize_plan.h"
 
+// Operations over plain lanes are loops: compilers take minutes over so many of them in one function.
+#ifdef SIMD_LANES_H
+#define SIMD_INLINE inline
+#define SIMD_INLINED
+#else
 #define SIMD_INLINE [[gnu::always_inline]] inline
 #define SIMD_INLINED __attribute__((always_inline))
+#endif
 
 namespace simgp::SIMD_TARGET {
 
