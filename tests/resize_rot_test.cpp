@@ -252,7 +252,8 @@ TEST(resize_rot, words_of_rgb_are_turned_at_their_own_size) {
 int32_t expected_refusal(int from, int to, int rot, bool kept, bool good_sizes) {
     if (from != to) return SIMGP_ERR_PARAM;
     if (rot < 0 || rot > 5) return SIMGP_ERR_UNSUPPORTED;
-    const bool known = !rig::kept_planes(from).empty();
+    const std::vector<int> planes = rig::kept_planes(from);
+    const bool known = !planes.empty();
     if (kept) return known ? SIMGP_OK : SIMGP_ERR_UNSUPPORTED;
     if (!known || from > 99 || rot > 3) return SIMGP_ERR_UNSUPPORTED;
     return good_sizes ? SIMGP_OK : SIMGP_ERR_PARAM;

@@ -7,7 +7,7 @@
 // Environment of the test programs:
 //   SIMGP_TEST_SEED=n           the seed of all random inputs (default 1); failures print it
 //   SIMGP_TEST_QUICK=1          fewer rounds and strided sweeps, for emulators
-//   SIMGP_TEST_EXPECT_TARGET=t  the rows that must be in use (see choice in simd_test.cpp)
+//   SIMGP_TEST_EXPECT_TARGET=t  the rows that must be in use (see choice in choose_test.cpp)
 #ifndef TESTS_RIG_H
 #define TESTS_RIG_H
 
