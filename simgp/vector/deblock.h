@@ -107,9 +107,8 @@ inline four transpose_lanes(const four &x) {
 
 // Two lines fill a vector with samples a b c d a b c d ... Turned to a a a a b b b b ... in each
 // block, four such vectors are transposed into the four samples across.
+static constexpr uint8_t transposed[16] = {0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15};
 inline eight_lines filter_lines(const eight_lines &in, u8v strength) {
-    static constexpr uint8_t transposed[16] = {0, 4, 8,  12, 1, 5, 9,  13,
-                                               2, 6, 10, 14, 3, 7, 11, 15};
     const u8v order = load_blocks(transposed, 0);
     const auto pair = [&](int i) { return blend_u32(in.line[2 * i], in.line[2 * i + 1]); };
     const four x = transpose_lanes(transpose_bytes({{pair(0), pair(1), pair(2), pair(3)}}, order));

@@ -21,6 +21,8 @@ started=$("$readelf" -SW "$static_library" | grep -oE '\.(init_array|ctors|prein
 # What is asked of the C library. Allocation belongs to scmn/mem.cpp and to the resizer's creation.
 allowed='memcpy|memmove|memset|memcmp|getauxval|sched_yield|abort|__stack_chk_(fail|guard)'
 allowed+='|__(memcpy|memmove|memset)_chk|__cxa_finalize|__gmon_start__|_ITM_.*|__tls_get_addr'
+# Where processors have no division, the compiler's own library raises the signal of a division by zero.
+allowed+='|raise'
 allocators='malloc|calloc|realloc|free|posix_memalign|aligned_alloc|memalign'
 imports=$("$nm" -D --undefined-only "$shared_library" | awk '{ sub(/@.*/, "", $2); print $2 }' |
     grep -vxE "$allowed|$allocators")
