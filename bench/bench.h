@@ -84,6 +84,8 @@ std::vector<comparison> tile_comparisons();
 std::vector<comparison> dither_comparisons();
 std::vector<comparison> deblock_comparisons();
 std::vector<comparison> rotate_comparisons();
+std::vector<comparison> resize_rot_comparisons();
+std::vector<comparison> resize_csc_comparisons();
 std::vector<comparison> scmn_comparisons();
 
 }  // namespace bench

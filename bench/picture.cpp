@@ -395,6 +395,9 @@ comparison compare(conversion c) {
             twin("1080p", c.from, {1920, 1080}, 0.9);
         else if (c.twin_from >= 0)
             twin(name_of(c.twin_from), c.twin_from, from, usual ? 0.9 : 0);
+        else if (c.twin.make)
+            m.twin = {c.twin.name, [f = c.twin.make(b.src, b.dst), b] { f(b.src, b.dst); }, m.units,
+                      c.twin.goal};
         return m;
     };
     return {c.name, c.sizes, make};

@@ -92,6 +92,12 @@ struct conversion {
     double tolerance = 4;          // for peers, see expect_alike; 0: they are not held against ours
     double part_read = 1;          // of the source's bytes
     int twin_from = -1;            // the conversion from this format is to be no faster than 0.9
+    // Other work of ours on the same pictures, whose speed is to be kept to this part.
+    struct {
+        std::string name;
+        operation_maker make;
+        double goal = 0;
+    } twin = {};
 
     // The destination's size: as this says; or if the operation resizes otherwise, any that the
     // name of a size has ("64x48 to 32x24"); or that of the source.

@@ -41,6 +41,7 @@ set(SIMGP_AREAS
   simgp/deblock
   simgp/dither
   simgp/layout
+  simgp/resize
   simgp/rgb2yuv
   simgp/rotate
   simgp/tile

@@ -8,16 +8,16 @@
 namespace simgp {
 
 // What is moved: bytes, words of two bytes, or bytes 0, 2, 4, ... of rows, which close up.
-enum class samples : uint8_t { bytes, words, even_bytes, count };
+enum class sample_kind : uint8_t { bytes, words, even_bytes, count };
 
 // The bytes of a sample, and from one to the next in the source.
-template <samples S>
-inline constexpr ptrdiff_t sample_size = S == samples::words ? 2 : 1;
-template <samples S>
-inline constexpr ptrdiff_t sample_gap = S == samples::bytes ? 1 : 2;
+template <sample_kind S>
+inline constexpr ptrdiff_t sample_size = S == sample_kind::words ? 2 : 1;
+template <sample_kind S>
+inline constexpr ptrdiff_t sample_gap = S == sample_kind::bytes ? 1 : 2;
 
 // The largest block has this many columns, and as many rows: a cache line of samples.
-template <samples S>
+template <sample_kind S>
 inline constexpr ptrdiff_t block_side = 64 / sample_size<S>;
 
 // Transposes a block: sample x of row y of src becomes sample y of row x of dst. There are 1 to
@@ -32,8 +32,8 @@ using transpose_block = void(const uint8_t *src, ptrdiff_t src_stride, uint8_t *
 using reverse_row = void(const uint8_t *src, uint8_t *dst, ptrdiff_t count);
 
 struct rotate_rows {
-    transpose_block *transpose[size_t(samples::count)];
-    reverse_row *reverse[size_t(samples::words) + 1];  // not of even bytes
+    transpose_block *transpose[size_t(sample_kind::count)];
+    reverse_row *reverse[size_t(sample_kind::words) + 1];  // not of even bytes
 };
 
 }  // namespace simgp

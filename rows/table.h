@@ -9,6 +9,7 @@
 #include "rows/keyframe.h"
 #include "rows/layout.h"
 #include "rows/mem.h"
+#include "rows/resize.h"
 #include "rows/rgb2yuv.h"
 #include "rows/rotate.h"
 #include "rows/tile.h"
@@ -24,6 +25,7 @@ struct row_table {
     keyframe_rows keyframe;
     layout_rows layout;
     mem_rows mem;
+    resize_rows resize;
     rgb2yuv_rows rgb2yuv;
     rotate_rows rotate;
     tile_rows tile;

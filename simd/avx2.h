@@ -40,6 +40,12 @@ inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
     };
     return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
 }
+inline u8v gather_blocks(const uint8_t *p, const int32_t *at) {
+    const auto block = [=](int j) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + at[j]));
+    };
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
+}
 inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
     _mm_storeu_si128(reinterpret_cast<__m128i *>(p), _mm256_castsi256_si128(v));
     _mm_storeu_si128(reinterpret_cast<__m128i *>(p + step), _mm256_extracti128_si256(v, 1));
@@ -87,6 +93,12 @@ inline s16v sar(s16v a) {
     static_assert(limits::shift<N>);
     return _mm256_srai_epi16(a, N);
 }
+template <int M, int N>
+inline u16v shr_pairs(u16v a) {
+    static_assert(limits::shift<M> && limits::shift<N>);
+    return _mm256_mulhi_epu16(a,
+                              _mm256_set1_epi32(static_cast<int>(1u << (32 - N) | 1u << (16 - M))));
+}
 
 inline s16v add(s16v a, s16v b) { return _mm256_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm256_adds_epi16(a, b); }
@@ -94,6 +106,7 @@ inline s16v sub(s16v a, s16v b) { return _mm256_sub_epi16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return _mm256_min_epi16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return _mm256_max_epi16(a, b); }
 inline u16v mul(u16v a, u16v b) { return _mm256_mullo_epi16(a, b); }
+inline s16v mul_round(s16v a, s16v b) { return _mm256_mulhrs_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm256_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm256_subs_epu8(a, b); }
@@ -129,6 +142,13 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
 }
 
 inline u16v dot_pairs(u8v samples, u8v weights) { return _mm256_maddubs_epi16(samples, weights); }
+
+template <int B>
+inline u16v sum_pairs(u16v low, u16v high) {
+    static_assert(limits::pair_factor<B>);
+    const __m256i factors = _mm256_set1_epi32(B << 16 | 1);
+    return _mm256_packus_epi32(_mm256_madd_epi16(low, factors), _mm256_madd_epi16(high, factors));
+}
 
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>

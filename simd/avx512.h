@@ -45,6 +45,14 @@ inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
     return _mm512_inserti32x4(v, block(3), 3);
 }
 // Extracted to memory from the lower or the upper half, a block needs no permutation either.
+inline u8v gather_blocks(const uint8_t *p, const int32_t *at) {
+    const auto block = [=](int j) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + at[j]));
+    };
+    const __m256i low = _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
+    const __m256i high = _mm256_inserti128_si256(_mm256_castsi128_si256(block(2)), block(3), 1);
+    return _mm512_inserti64x4(_mm512_castsi256_si512(low), high, 1);
+}
 inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
     const auto put = [=](int j, __m128i block) {
         _mm_storeu_si128(reinterpret_cast<__m128i *>(p + j * step), block);
@@ -99,6 +107,12 @@ inline s16v sar(s16v a) {
     static_assert(limits::shift<N>);
     return _mm512_srai_epi16(a, N);
 }
+template <int M, int N>
+inline u16v shr_pairs(u16v a) {
+    static_assert(limits::shift<M> && limits::shift<N>);
+    return _mm512_mulhi_epu16(a,
+                              _mm512_set1_epi32(static_cast<int>(1u << (32 - N) | 1u << (16 - M))));
+}
 
 inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }
@@ -106,6 +120,7 @@ inline s16v sub(s16v a, s16v b) { return _mm512_sub_epi16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return _mm512_min_epi16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return _mm512_max_epi16(a, b); }
 inline u16v mul(u16v a, u16v b) { return _mm512_mullo_epi16(a, b); }
+inline s16v mul_round(s16v a, s16v b) { return _mm512_mulhrs_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm512_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm512_subs_epu8(a, b); }
@@ -132,6 +147,13 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
 }
 
 inline u16v dot_pairs(u8v samples, u8v weights) { return _mm512_maddubs_epi16(samples, weights); }
+
+template <int B>
+inline u16v sum_pairs(u16v low, u16v high) {
+    static_assert(limits::pair_factor<B>);
+    const __m512i factors = _mm512_set1_epi32(B << 16 | 1);
+    return _mm512_packus_epi32(_mm512_madd_epi16(low, factors), _mm512_madd_epi16(high, factors));
+}
 
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>

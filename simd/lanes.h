@@ -103,6 +103,11 @@ inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
     for (int i = 0; i < bytes; i++) p[i / 16 * step + i % 16] = v.lane[i];
 }
 
+// Block j from the 16 bytes at p + at[j].
+inline u8v gather_blocks(const uint8_t *p, const int32_t *at) {
+    return make<u8v>([&](int i) { return p[at[i / 16] + i % 16]; });
+}
+
 // A store to an address that is a multiple of `bytes`, past the caches where the machine can do
 // that; stream_end() orders a run of them before whatever is written next.
 inline void store_stream(uint8_t *p, u8v v) { store(p, v); }
@@ -166,6 +171,12 @@ inline s16v sar(s16v a) {
     static_assert(limits::shift<N>);
     return make<s16v>([&](int i) { return a.lane[i] >> N; });
 }
+// Even lanes by M, odd ones by N.
+template <int M, int N>
+inline u16v shr_pairs(u16v a) {
+    static_assert(limits::shift<M> && limits::shift<N>);
+    return make<u16v>([&](int i) { return a.lane[i] >> (i & 1 ? N : M); });
+}
 
 // Signed 16-bit sums and differences, wrapping, and sums, saturating.
 inline s16v add(s16v a, s16v b) {
@@ -187,6 +198,10 @@ inline s16v max_s16(s16v a, s16v b) {
 // The low 16 bits of the products, which are the same for signed lanes.
 inline u16v mul(u16v a, u16v b) {
     return make<u16v>([&](int i) { return uint16_t(unsigned(a.lane[i]) * b.lane[i]); });
+}
+// Products of signed lanes as fractions of 2^15, rounded: (a b + 2^14) >> 15. Not both may be -32768.
+inline s16v mul_round(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return (a.lane[i] * b.lane[i] + (1 << 14)) >> 15; });
 }
 
 // Sums and differences of bytes, saturating.
@@ -250,6 +265,19 @@ inline u16v dot_pairs(u8v samples, u8v weights) {
     return make<u16v>([&](int i) {
         return samples.lane[2 * i] * weights.lane[2 * i] +
                samples.lane[2 * i + 1] * weights.lane[2 * i + 1];
+    });
+}
+
+// Within blocks: even lane + B odd lane of each pair of lanes: the lower four of a block from `low`,
+// the upper four from `high`. Lanes are at most 32767, and the sums at most 65535; B is a power of
+// two, at most 2^14.
+template <int B>
+inline u16v sum_pairs(u16v low, u16v high) {
+    static_assert(limits::pair_factor<B>);
+    return make<u16v>([&](int i) {
+        const u16v &from = i % 8 < 4 ? low : high;
+        const int at = i / 8 * 8 + i % 4 * 2;
+        return from.lane[at] + B * from.lane[at + 1];
     });
 }
 
@@ -341,9 +369,11 @@ inline u8v zip_high(u8v a, u8v b) {
 inline u8v blend_u32(u8v a, u8v b) {
     return make<u8v>([&](int i) { return (i / 4 & 1 ? b : a).lane[i]; });
 }
-// Within blocks: byte i is byte index[i] of the same block of v; indices are 0 ... 15.
+// Within blocks: byte i is byte index[i] of the same block of v, 0 ... 15, or 0 where the index is
+// 128 ... 255.
 inline u8v shuffle(u8v v, u8v index) {
-    return make<u8v>([&](int i) { return v.lane[i / 16 * 16 + index.lane[i]]; });
+    return make<u8v>(
+        [&](int i) { return index.lane[i] < 128 ? v.lane[i / 16 * 16 + index.lane[i] % 16] : 0; });
 }
 // Across the whole vector: its bytes, or its byte pairs, last to first.
 inline u8v reverse_u8(u8v v) {

@@ -14,6 +14,10 @@ concept shift = 1 <= N &&N <= 15;
 template <int N>
 concept narrowing_shift = 1 <= N &&N <= 8;
 
+// Factor of the second of two 16-bit lanes, which must fit signed lanes and is a shift elsewhere.
+template <int B>
+concept pair_factor = B >= 2 && B <= 1 << 14 && (B & (B - 1)) == 0;
+
 // Bytes of a granule that is interleaved.
 template <int N>
 concept granule = N == 1 || N == 2 || N == 4 || N == 8;

@@ -31,6 +31,7 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
+inline u8v gather_blocks(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
 inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
 
 inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
@@ -73,6 +74,11 @@ inline s16v sar(s16v a) {
     static_assert(limits::shift<N>);
     return vshrq_n_s16(a, N);
 }
+template <int M, int N>
+inline u16v shr_pairs(u16v a) {
+    static_assert(limits::shift<M> && limits::shift<N>);
+    return vshlq_u16(a, vreinterpretq_s16_u32(vdupq_n_u32(uint32_t(-N) << 16 | (-M & 0xFFFF))));
+}
 
 inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }
@@ -80,6 +86,7 @@ inline s16v sub(s16v a, s16v b) { return vsubq_s16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
 inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
+inline s16v mul_round(s16v a, s16v b) { return vqrdmulhq_s16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return vqsubq_u8(a, b); }
@@ -129,6 +136,13 @@ inline u16v dot_pairs(u8v samples, u8v weights) {
     return vcombine_u16(vpadd_u16(vget_low_u16(low), vget_high_u16(low)),
                         vpadd_u16(vget_low_u16(high), vget_high_u16(high)));
 #endif
+}
+
+template <int B>
+inline u16v sum_pairs(u16v low, u16v high) {
+    static_assert(limits::pair_factor<B>);
+    const uint16x8x2_t v = vuzpq_u16(low, high);
+    return vaddq_u16(v.val[0], vshlq_n_u16(v.val[1], __builtin_ctz(B)));
 }
 
 // The offsets of 128 go into the constant, and the products are accumulated on it.

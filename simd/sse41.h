@@ -31,6 +31,7 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
+inline u8v gather_blocks(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
 inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
 
 inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
@@ -73,6 +74,11 @@ inline s16v sar(s16v a) {
     static_assert(limits::shift<N>);
     return _mm_srai_epi16(a, N);
 }
+template <int M, int N>
+inline u16v shr_pairs(u16v a) {
+    static_assert(limits::shift<M> && limits::shift<N>);
+    return _mm_mulhi_epu16(a, _mm_set1_epi32(static_cast<int>(1u << (32 - N) | 1u << (16 - M))));
+}
 
 inline s16v add(s16v a, s16v b) { return _mm_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm_adds_epi16(a, b); }
@@ -80,6 +86,7 @@ inline s16v sub(s16v a, s16v b) { return _mm_sub_epi16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return _mm_min_epi16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return _mm_max_epi16(a, b); }
 inline u16v mul(u16v a, u16v b) { return _mm_mullo_epi16(a, b); }
+inline s16v mul_round(s16v a, s16v b) { return _mm_mulhrs_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm_adds_epu8(a, b); }
 inline u8v sub_sat_u8(u8v a, u8v b) { return _mm_subs_epu8(a, b); }
@@ -112,6 +119,13 @@ inline mask16 chain_before(mask16 a, mask16 b, chain_state &carry) {
 }
 
 inline u16v dot_pairs(u8v samples, u8v weights) { return _mm_maddubs_epi16(samples, weights); }
+
+template <int B>
+inline u16v sum_pairs(u16v low, u16v high) {
+    static_assert(limits::pair_factor<B>);
+    const __m128i factors = _mm_set1_epi32(B << 16 | 1);
+    return _mm_packus_epi32(_mm_madd_epi16(low, factors), _mm_madd_epi16(high, factors));
+}
 
 // The multiply-add of unsigned by signed bytes does both products: constants by samples less 128.
 template <int A, int B, int C>

@@ -12,11 +12,11 @@ using namespace simgp;
 static const_lines kept_lines(const plane_args &a) { return {a.src.first, 2 * a.src.stride}; }
 
 SIMGP_PLANE_KERNEL(simgp_csc_1x2_to_1x1_rot_90l,
-                   turn_left<samples::bytes>(kept_lines(args), args.width, args.height / 2,
-                                             args.dst))
+                   turn_left<sample_kind::bytes>(kept_lines(args), args.width, args.height / 2,
+                                                 args.dst))
 SIMGP_PLANE_KERNEL(simgp_csc_1x2_to_1x1_rot_90r,
-                   turn_right<samples::bytes>(kept_lines(args), args.width, args.height / 2,
-                                              args.dst))
+                   turn_right<sample_kind::bytes>(kept_lines(args), args.width, args.height / 2,
+                                                  args.dst))
 
 simgp_plane_fn *const simgp_tbl_fn_csc_1x2_to_1x1_rot[6] = {
     simgp_csc_1x2_to_1x1,

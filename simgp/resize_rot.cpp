@@ -1,13 +1,150 @@
 // Resize and a turn in one pass.
 #include "simgp/resize_rot.h"
 
+#include "simgp/resample.h"
+#include "simgp/rotate.h"
 #include "simgp/turn.h"
 
+namespace simgp {
+namespace {
+
+constexpr resize_kind kind_of(sample_kind s) {
+    return s == sample_kind::words ? resize_kind::bytes2 : resize_kind::bytes1;
+}
+
+resize_args whole_samples(const resize_args &a, int size) {
+    resize_args b = a;
+    b.src = whole_pixel_lines(a.src, size);
+    b.dst = whole_pixel_lines(a.dst, size);
+    return b;
+}
+
+// The resized lines of some columns lie in a block on the stack.
+struct line_block {
+    uint8_t *plan, *ring, *first;
+    ptrdiff_t stride;
+
+    line_block(memory_pieces from, const resampling &r, ptrdiff_t columns, ptrdiff_t lines)
+        : plan(from.take(r.plan_bytes(columns))),
+          ring(from.take(r.ring_bytes(columns))),
+          first(nullptr),
+          stride((columns * r.pixel_bytes + resize_alignment - 1) & -ptrdiff_t(resize_alignment)) {
+        first = from.take(lines * stride);
+        used = from.used;
+    }
+    ptrdiff_t used;
+};
+
+constexpr ptrdiff_t block_memory = 10752;
+
+// Calls f(x, columns, block, made) for the columns of a resized plane of `width` columns; made.make()
+// makes their lines, for which `block` has room.
+template <class F>
+void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdiff_t width,
+                             ptrdiff_t lines, F f) {
+    resample_memory<block_memory> memory;
+    const ptrdiff_t most = columns_of_strips(width, [&](ptrdiff_t n) {
+        return line_block({nullptr}, r, n, lines).used <= block_memory;
+    });
+    for (ptrdiff_t x = 0; x < width; x += most) {
+        const ptrdiff_t columns = width - x < most ? width - x : most;
+        const line_block block({memory.bytes}, r, columns, lines);
+        const resize_strip strip = r.plan(x, columns, r.whole_rows(width), block.plan);
+        f(x, columns, block, resampled_lines(r, strip, src, block.ring));
+    }
+}
+
+// Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
+template <sample_kind S, bool Right>
+void quarter_turn(const resize_args &args) {
+    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
+    const ptrdiff_t width = args.height, height = args.width;  // before the turn
+    if (width < 1 || height < 1) return;
+    const resize_args a = whole_samples(args, int(size));
+    const lines dst = Right ? a.dst : a.dst.upside_down(width);
+    transpose_block *const transpose = live_rows().rotate.transpose[size_t(S)];
+    const resampling r(kind_of(S), a.step_x, a.step_y);
+    for_each_block_of_lines(
+        r, a.src, width, band,
+        [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
+            for (ptrdiff_t y = 0; y < height; y += band) {
+                const ptrdiff_t rows = height - y < band ? height - y : band;
+                const lines in{block.first, block.stride};
+                const lines to = Right ? in.upside_down(rows) : in;
+                made.make(y, rows, to.first, to.stride);
+                const ptrdiff_t column = Right ? height - y - rows : y;
+                for (ptrdiff_t i = 0; i < columns; i += side)
+                    transpose(in.first + i * size, in.stride, dst.line(x + i) + column * size,
+                              dst.stride, columns - i < side ? columns - i : side, rows, 0);
+            }
+        });
+}
+
+template <sample_kind S>
+void half_turn(const resize_args &args) {
+    constexpr ptrdiff_t size = sample_size<S>, band = 2;
+    if (args.width < 1 || args.height < 1) return;
+    const resize_args a = whole_samples(args, int(size));
+    const lines dst = a.dst.upside_down(a.height);
+    reverse_row *const reverse = live_rows().rotate.reverse[size_t(S)];
+    const resampling r(kind_of(S), a.step_x, a.step_y);
+    for_each_block_of_lines(
+        r, a.src, a.width, band,
+        [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
+            const ptrdiff_t column = a.width - x - columns;
+            for (ptrdiff_t y = 0; y < a.height; y += band) {
+                const ptrdiff_t rows = a.height - y < band ? a.height - y : band;
+                made.make(y, rows, block.first, block.stride);
+                for (ptrdiff_t k = 0; k < rows; k++)
+                    reverse(block.first + k * block.stride, dst.line(y + k) + column * size,
+                            columns);
+            }
+        });
+}
+
+}  // namespace
+}  // namespace simgp
+
 using namespace simgp;
+
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn<sample_kind::bytes, false>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn<sample_kind::bytes, true>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn<sample_kind::bytes>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l, quarter_turn<sample_kind::words, false>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r, quarter_turn<sample_kind::words, true>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn<sample_kind::words>(args))
+
+simgp_rsz_fn *const simgp_tbl_fn_rsz_8b_rot[6] = {
+    simgp_rsz_8b, simgp_rsz_8b_rot_90l, simgp_rsz_8b_rot_90r, simgp_rsz_8b_rot_180, nullptr,
+    nullptr,
+};
+simgp_rsz_fn *const simgp_tbl_fn_rsz_8b8b_rot[6] = {
+    simgp_rsz_8b8b, simgp_rsz_8b8b_rot_90l, simgp_rsz_8b8b_rot_90r, simgp_rsz_8b8b_rot_180, nullptr,
+    nullptr,
+};
 
 // Of the source's even rows, the even bytes: as many columns as the destination has rows.
 void simgp_rsz_8b_rot_90r_quarter(const void *src_plane, int32_t src_stride, int32_t dst_width,
                                   int32_t dst_height, int32_t dst_stride, void *dst_plane) {
-    turn_right<samples::even_bytes>(lines_of(src_plane, 2 * ptrdiff_t(src_stride)), dst_height,
-                                    dst_width, lines_of(dst_plane, dst_stride));
+    turn_right<sample_kind::even_bytes>(lines_of(src_plane, 2 * ptrdiff_t(src_stride)), dst_height,
+                                        dst_width, lines_of(dst_plane, dst_stride));
+}
+
+int32_t simgp_rsz_rot(const simgp_img *src, int32_t rot, const simgp_img *dst) {
+    if (src->format != dst->format) return SIMGP_ERR_PARAM;
+    if (rot < SIMGP_ROT_NONE || rot > SIMGP_ROT_VERT) return SIMGP_ERR_UNSUPPORTED;
+    const bool quarter = is_quarter_turn(rot);
+    if (src->width[0] == (quarter ? dst->height : dst->width)[0] &&
+        src->height[0] == (quarter ? dst->width : dst->height)[0])
+        return simgp_rot(src, rot, dst);
+
+    const format *const planes = src->format > 99 ? nullptr : planes_kept(src->format);
+    simgp_rsz_fn *const of_bytes = simgp_tbl_fn_rsz_8b_rot[rot];
+    simgp_rsz_fn *const of_pairs = simgp_tbl_fn_rsz_8b8b_rot[rot];
+    if (!planes || !of_bytes || !of_pairs) return SIMGP_ERR_UNSUPPORTED;
+    for (int k = 0; k < planes->planes; k++)
+        if (!plane_fits(*src, *dst, k, rot)) return SIMGP_ERR_PARAM;
+    for (int k = 0; k < planes->planes; k++)
+        resize_plane(planes->bytes[k] == 2 ? of_pairs : of_bytes, *src, *dst, k, rot);
+    return SIMGP_OK;
 }

@@ -9,7 +9,7 @@ namespace simgp {
 namespace scalar {
 namespace {
 
-template <samples S>
+template <sample_kind S>
 void transpose(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst, ptrdiff_t dst_stride,
                ptrdiff_t columns, ptrdiff_t rows, ptrdiff_t) {
     for (ptrdiff_t x = 0; x < columns; x++)
@@ -18,7 +18,7 @@ void transpose(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst, ptrdiff_t
                    src + y * src_stride + x * sample_gap<S>, size_t(sample_size<S>));
 }
 
-template <samples S>
+template <sample_kind S>
 void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
     constexpr ptrdiff_t size = sample_size<S>;
     for (ptrdiff_t i = 0; i < count; i++)
@@ -28,34 +28,34 @@ void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
 }  // namespace
 
 void fill_rotate(rotate_rows &t) {
-    t.transpose[size_t(samples::bytes)] = transpose<samples::bytes>;
-    t.transpose[size_t(samples::words)] = transpose<samples::words>;
-    t.transpose[size_t(samples::even_bytes)] = transpose<samples::even_bytes>;
-    t.reverse[size_t(samples::bytes)] = reverse<samples::bytes>;
-    t.reverse[size_t(samples::words)] = reverse<samples::words>;
+    t.transpose[size_t(sample_kind::bytes)] = transpose<sample_kind::bytes>;
+    t.transpose[size_t(sample_kind::words)] = transpose<sample_kind::words>;
+    t.transpose[size_t(sample_kind::even_bytes)] = transpose<sample_kind::even_bytes>;
+    t.reverse[size_t(sample_kind::bytes)] = reverse<sample_kind::bytes>;
+    t.reverse[size_t(sample_kind::words)] = reverse<sample_kind::words>;
 }
 
 }  // namespace scalar
 
 namespace {
 
-template <samples S>
+template <sample_kind S>
 void turn_left(const plane_args &a) {
     turn_left<S>(a.src, a.width, a.height, a.dst);
 }
-template <samples S>
+template <sample_kind S>
 void turn_right(const plane_args &a) {
     turn_right<S>(a.src, a.width, a.height, a.dst);
 }
-template <samples S>
+template <sample_kind S>
 void half_turn(const plane_args &a) {
     mirror<S>(a.src, a.width, a.height, a.dst.upside_down(a.height));
 }
-template <samples S>
+template <sample_kind S>
 void mirror_across(const plane_args &a) {
     mirror<S>(a.src, a.width, a.height, a.dst);
 }
-template <samples S>
+template <sample_kind S>
 void mirror_down(const plane_args &a) {
     copy_lines(a.src, a.dst.upside_down(a.height), a.width * sample_size<S>, a.height);
 }
@@ -65,17 +65,17 @@ void mirror_down(const plane_args &a) {
 
 using namespace simgp;
 
-SIMGP_PLANE_KERNEL(simgp_rot_8b_90l, turn_left<samples::bytes>(args))
-SIMGP_PLANE_KERNEL(simgp_rot_8b_90r, turn_right<samples::bytes>(args))
-SIMGP_PLANE_KERNEL(simgp_rot_8b_180, half_turn<samples::bytes>(args))
-SIMGP_PLANE_KERNEL(simgp_rot_8b_hori, mirror_across<samples::bytes>(args))
-SIMGP_PLANE_KERNEL(simgp_rot_8b_vert, mirror_down<samples::bytes>(args))
+SIMGP_PLANE_KERNEL(simgp_rot_8b_90l, turn_left<sample_kind::bytes>(args))
+SIMGP_PLANE_KERNEL(simgp_rot_8b_90r, turn_right<sample_kind::bytes>(args))
+SIMGP_PLANE_KERNEL(simgp_rot_8b_180, half_turn<sample_kind::bytes>(args))
+SIMGP_PLANE_KERNEL(simgp_rot_8b_hori, mirror_across<sample_kind::bytes>(args))
+SIMGP_PLANE_KERNEL(simgp_rot_8b_vert, mirror_down<sample_kind::bytes>(args))
 
-SIMGP_PLANE_KERNEL(simgp_rot_16b_90l, turn_left<samples::words>(whole_words(args)))
-SIMGP_PLANE_KERNEL(simgp_rot_16b_90r, turn_right<samples::words>(whole_words(args)))
-SIMGP_PLANE_KERNEL(simgp_rot_16b_180, half_turn<samples::words>(whole_words(args)))
-SIMGP_PLANE_KERNEL(simgp_rot_16b_hori, mirror_across<samples::words>(whole_words(args)))
-SIMGP_PLANE_KERNEL(simgp_rot_16b_vert, mirror_down<samples::words>(whole_words(args)))
+SIMGP_PLANE_KERNEL(simgp_rot_16b_90l, turn_left<sample_kind::words>(whole_words(args)))
+SIMGP_PLANE_KERNEL(simgp_rot_16b_90r, turn_right<sample_kind::words>(whole_words(args)))
+SIMGP_PLANE_KERNEL(simgp_rot_16b_180, half_turn<sample_kind::words>(whole_words(args)))
+SIMGP_PLANE_KERNEL(simgp_rot_16b_hori, mirror_across<sample_kind::words>(whole_words(args)))
+SIMGP_PLANE_KERNEL(simgp_rot_16b_vert, mirror_down<sample_kind::words>(whole_words(args)))
 
 simgp_plane_fn *const simgp_tbl_fn_rot_8b[6] = {
     simgp_cpy_8b,     simgp_rot_8b_90l,  simgp_rot_8b_90r,

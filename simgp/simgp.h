@@ -27,13 +27,13 @@
  * - Nothing is allocated, unless the function is there to allocate. No threads, no state that a
  *   caller can see, no configuration, nothing to start up or shut down. All functions may run on
  *   any number of threads at once, on separate destinations.
- * - Functions that take descriptors check the formats and nothing else, before they write anything.
- *   The kernels below them, which may be called directly, check nothing. Sizes, strides and
- *   pointers are yours to get right: offsets are computed in ptrdiff_t, so pictures may be as large
- *   as memory.
+ * - Functions that take descriptors check the formats, and codes and strengths that they are given,
+ *   before they write anything; those that resize check the sizes as well. The kernels below them,
+ *   which may be called directly, check nothing. Strides, pointers and all other sizes are yours to
+ *   get right: offsets are computed in ptrdiff_t, so pictures may be as large as memory.
  *
  * Most kernels are declared by a type, which explains their parameters: simgp_csc_fn works on whole
- * pictures, simgp_plane_fn on one plane (both in img.h).
+ * pictures, simgp_plane_fn on one plane (both in img.h), simgp_rsz_fn resizes one plane (resize.h).
  *
  * Names give the operation and then the formats in the direction of the data:
  * simgp_csc_nv12_to_rgb565 reads NV12 and writes RGB565. csc is colour conversion, cpy copy, dbf8x8
@@ -51,6 +51,8 @@
 #include "simgp/img.h"
 #include "simgp/layout.h"
 #include "simgp/packed2rgb.h"
+#include "simgp/resize.h"
+#include "simgp/resize_csc.h"
 #include "simgp/resize_rot.h"
 #include "simgp/rgb2yuv.h"
 #include "simgp/rotate.h"

@@ -24,13 +24,13 @@ inline constexpr int64_t fetch_from = 1 << 19;
 // page stays together, and reading is the side that can be asked for ahead. Where the plane allows
 // it, a last block begins early, to have at least a quarter of a side, and of bytes a quarter, half
 // or all of it: moving some samples again is quicker than an odd size.
-template <samples S>
+template <sample_kind S>
 void transpose(const const_lines &src, ptrdiff_t columns, ptrdiff_t rows, const lines &dst) {
     constexpr ptrdiff_t size = sample_size<S>, gap = sample_gap<S>, side = block_side<S>;
     const auto fill_up = [](ptrdiff_t &start, ptrdiff_t &count, ptrdiff_t end) {
         if (end < side) return;
         ptrdiff_t full = side / 4;
-        if (S == samples::words && full < count) full = count;
+        if (S == sample_kind::words && full < count) full = count;
         while (full < count) full *= 2;
         start = end < start + full ? end - full : start;
         count = full;
@@ -46,13 +46,13 @@ void transpose(const const_lines &src, ptrdiff_t columns, ptrdiff_t rows, const 
     });
 }
 
-template <samples S>
+template <sample_kind S>
 void turn_left(const const_lines &src, ptrdiff_t width, ptrdiff_t height, const lines &dst) {
     if (width < 1 || height < 1) return;
     transpose<S>(src, width, height, dst.upside_down(width));
 }
 
-template <samples S>
+template <sample_kind S>
 void turn_right(const const_lines &src, ptrdiff_t width, ptrdiff_t height, const lines &dst) {
     if (width < 1 || height < 1) return;
     transpose<S>(src.upside_down(height), width, height, dst);
@@ -60,7 +60,7 @@ void turn_right(const const_lines &src, ptrdiff_t width, ptrdiff_t height, const
 
 // Left to right. Lines without gaps are one where they lie the other way round in the destination,
 // as in half turns.
-template <samples S>
+template <sample_kind S>
 void mirror(const const_lines &src, ptrdiff_t width, ptrdiff_t height, const lines &dst) {
     if (width < 1 || height < 1) return;
     reverse_row *const row = live_rows().rotate.reverse[size_t(S)];

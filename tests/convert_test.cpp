@@ -226,6 +226,201 @@ TEST_F(convert_test, several_frames_become_numbered_files_or_a_sheet) {
     EXPECT_LT(read("long.ppm").size(), 64 * (64 + 8) * (48 + 19) * 3u + 50000);
 }
 
+// Where pixel (x, y) of a picture of w x h goes (simgp/rotate.h).
+struct position {
+    int x, y;
+};
+position turned_to(const std::string &turn, int x, int y, int w, int h) {
+    if (turn == "90l") return {y, w - 1 - x};
+    if (turn == "90r") return {h - 1 - y, x};
+    if (turn == "180") return {w - 1 - x, h - 1 - y};
+    return turn == "hori" ? position{w - 1 - x, y} : position{x, h - 1 - y};
+}
+
+// At even sizes the turn is that of YUV, at odd ones chroma samples would be taken for other pixels.
+TEST_F(convert_test, turned_pixels_are_where_they_should_be) {
+    for (const char *size : {"96x52", "97x51"}) {
+        good(std::string("testcard:") + size + " -o plain.png");
+        const picture plain = png("plain.png");
+        const int w = plain.width(), h = plain.height();
+        for (const std::string turn : {"90l", "90r", "180", "hori", "vert"}) {
+            good(std::string("testcard:") + size + " -o turned.png --rotate " + turn);
+            const picture turned = png("turned.png");
+            const bool quarter = turn[0] == '9';
+            ASSERT_EQ(turned.width(), quarter ? h : w);
+            ASSERT_EQ(turned.height(), quarter ? w : h);
+            int wrong = 0;
+            for (int y = 0; y < h; ++y)
+                for (int x = 0; x < w; ++x) {
+                    const position to = turned_to(turn, x, y, w, h);
+                    wrong += memcmp(turned.sample(0, to.x, to.y), plain.sample(0, x, y), 3) != 0;
+                }
+            EXPECT_EQ(wrong, 0) << size << " " << turn;
+        }
+    }
+}
+
+// Nothing is lost on the way there and back, in any format. Packed 4:2:2 alone cannot hold what a
+// quarter turn makes of its chroma, and says so; half groups at odd widths have no V to turn.
+TEST_F(convert_test, turned_twice_is_the_picture_again) {
+    const std::array<std::array<std::string, 2>, 4> turns = {
+        {{"90l", "90r"}, {"180", "180"}, {"hori", "hori"}, {"vert", "vert"}}};
+    for (const pixel_format &format : tools::formats()) {
+        const std::string name(format.name), source = "source." + name;
+        const bool packed = name == "uyvy" || name == "yuyv";
+        for (const std::string size : {"98x52", "97x51"}) {
+            if (packed && size != "98x52") continue;
+            if (format.is_rgb() && size == "98x52") continue;  // the odd one shows as much
+            good("testcard:" + size + " -q -o " + source + " --format " + name);
+            for (const auto &turn : turns) {
+                const bool quarter = turn[0] == "90l";
+                const std::string swapped = size.substr(3) + "x" + size.substr(0, 2);
+                const bool planar422 = name == "yuv422n" || name == "yv16" || name == "yuv422w";
+                std::string between = name;
+                if (quarter && planar422) between = name == "yuv422w" ? "yuv422n" : "yuv422w";
+                const std::string there = source + " --size " + size + " -o there --rotate ";
+                if (packed && quarter) {
+                    good(there + turn[0]);
+                    EXPECT_NE(got.err.find("passes through 4:2:0 chroma"), std::string::npos)
+                        << got.err;
+                    continue;
+                }
+                good(there + turn[0] + " && $C there --format " + between + " --size " +
+                     (quarter ? swapped : size) + " -o back." + name + " --rotate " + turn[1]);
+                EXPECT_EQ(got.err, "");
+                EXPECT_EQ(read(source), read("back." + name)) << name << size << turn[0];
+            }
+        }
+    }
+    // V before U or after it: what becomes of the planes has U first.
+    for (const std::string edit : {"--rotate 90l", "--rotate 90r --resize 40x60", "--thumbnail"}) {
+        good("testcard:98x52 -o n " + edit + " --format yuv422n && $C testcard:98x52 -o v " + edit +
+             " --format yv16");
+        EXPECT_EQ(read("n"), read("v")) << edit;
+    }
+    // Alpha, which no conversion keeps, is turned as well.
+    write("one.rgba8888", "RGBArgba");
+    good("one.rgba8888 --size 2x1 -o two.rgba8888 --rotate hori");
+    EXPECT_EQ(read("two.rgba8888"), "rgbaRGBA");
+}
+
+TEST_F(convert_test, resized_pictures_keep_the_bars) {
+    for (const pixel_format *format : formats(false))
+        for (const std::string size : {"161x91", "301x203"}) {
+            const std::string name(format->name);
+            good("testcard:192x144 --format " + name + " -q -o out.png --resize " + size);
+            const picture p = png("out.png");
+            EXPECT_EQ(std::to_string(p.width()) + "x" + std::to_string(p.height()), size);
+            expect_bars(p, name == "yuv400" ? 20 : 9, name == "yuv400", name + " " + size);
+        }
+}
+
+// What the library does in one pass is what it does in several; the size that is there already is
+// left alone.
+TEST_F(convert_test, one_pass_gives_what_several_give) {
+    const auto same = [&](const std::string &one, const std::string &kernel,
+                          const std::string &several) {
+        good("testcard:192x144 " + one + " -o one.raw -v");
+        EXPECT_NE(got.err.find(kernel), std::string::npos) << one << got.err;
+        ASSERT_EQ(shell("$C testcard:192x144 " + several + " -o several.raw"), 0) << got.err;
+        EXPECT_EQ(read("one.raw"), read("several.raw")) << one;
+    };
+    const std::string then = " -o between.yuv420 && $C between.yuv420 -q --size ";
+    const std::string small = "-q --resize 100x76", turn = " --rotate 90r --resize 76x100";
+    same("-t rgb565 --resize 100x76", "yuv420 -> rgb565 100x76 (simgp_rsz_csc)\n",
+         small + then + "100x76 -t rgb565");
+    same("-f t64x32 -t rgb565 --resize 100x76", "t64x32 -> rgb565 100x76 (simgp_rsz_csc)\n",
+         small + then + "100x76 -t rgb565");
+    same(turn, "yuv420 -> yuv420 76x100 (simgp_rsz_rot 90r)\n",
+         small + then + "100x76 --rotate 90r");
+    same("-t rgb565" + turn, "(simgp_rsz_csc) -> rgb565 76x100 (simgp_rot 90r)\n",
+         small + then + "100x76 --rotate 90r -t rgb565");
+    same("-f yuv422n -t yuv420 --rotate 90l", "yuv422n -> yuv420 144x192 (simgp_csc_rot 90l)\n",
+         "-f yuv422n" + then + "192x144 --rotate 90l");
+    same("--resize 192x144", "yuv420\n", "");
+    same("--rotate 90r --resize 144x192", "yuv420 -> yuv420 144x192 (simgp_rot 90r)\n",
+         "--rotate 90r");
+}
+
+TEST_F(convert_test, deblocking_comes_first_and_is_the_librarys) {
+    // Stripes of 8 columns: 100 | 112 gives d = 36 >> 3 = 4 and is softened by 4 and 2 (the example
+    // of simgp/deblock.h), 112 | 100 gives d = -36 >> 3 = -5, and 3 and 1.
+    std::string luma, chroma(16 * 8 * 2, char(128));
+    for (int y = 0; y < 16; ++y)
+        for (int x = 0; x < 32; ++x) luma += char(x / 8 % 2 ? 112 : 100);
+    write("blocks.yuv420", luma + chroma);
+    good("blocks.yuv420 --size 32x16 -o smooth.yuv420 --deblock 4");
+    const std::string smooth = read("smooth.yuv420");
+    const uint8_t expected[] = {100, 100, 102, 104, 108, 110, 112, 112,
+                                112, 112, 111, 109, 103, 101, 100};
+    EXPECT_EQ(memcmp(smooth.data() + 4, expected, sizeof expected), 0);
+    EXPECT_EQ(smooth.substr(32 * 16), chroma);
+    good("blocks.yuv420 --size 32x16 -o same.yuv420 --deblock 0");
+    EXPECT_EQ(read("same.yuv420"), luma + chroma);
+    // Other layouts are taken to planes for it, without loss, and it comes before the rest.
+    for (const std::string format : {"nv12", "t64x32", "uyvy"}) {
+        good("blocks.yuv420 --size 32x16 -q -o blocks." + format);
+        good("blocks." + format + " --size 32x16 -o smooth." + format + " --deblock 4");
+        good("smooth." + format + " --size 32x16 -q -o luma --to yuv420");
+        EXPECT_EQ(read("luma").substr(0, 32 * 16), smooth.substr(0, 32 * 16)) << format;
+    }
+    good("blocks.yuv420 --size 32x16 -o one.rgb565 --deblock 4 --resize 20x10 --rotate 180");
+    good("smooth.yuv420 --size 32x16 -o two.rgb565 --resize 20x10 --rotate 180");
+    EXPECT_EQ(read("one.rgb565"), read("two.rgb565"));
+}
+
+TEST_F(convert_test, thumbnails_are_every_second_pixel_turned_right) {
+    // Raw bytes of 97 x 51 pixels become those of 26 x 49.
+    const size_t luma = 26 * 49;
+    const struct {
+        const char *format;
+        size_t bytes;
+    } sizes[] = {{"yuv400", luma},
+                 {"yuv420", luma + 2 * 13 * 25},
+                 {"nv21", luma + 2 * 13 * 25},
+                 {"yuv422n", luma + 2 * 26 * 25},  // yuv422w then
+                 {"yuv444", 3 * luma},
+                 {"rgb565", 2 * luma},
+                 {"argb8888", 4 * luma}};
+    for (const auto &s : sizes) {
+        good("testcard:97x51 -q --thumbnail -o thumbnail --format " + std::string(s.format));
+        EXPECT_EQ(read("thumbnail").size(), s.bytes) << s.format;
+    }
+    for (const char *format : {"rgb888", "yuv420", "nv12", "t64x32", "uyvy"}) {
+        good("testcard:194x102 -o small.png --thumbnail --format " + std::string(format));
+        good("testcard:194x102 -o plain.png --format " + std::string(format));
+        const picture small = png("small.png"), plain = png("plain.png");
+        ASSERT_EQ(small.width(), 51);
+        ASSERT_EQ(small.height(), 97);
+        int wrong = 0;
+        for (int y = 0; y < 97; ++y)
+            for (int x = 0; x < 51; ++x) {
+                // Luma takes every second pixel, and so does chroma of every second one.
+                if (format[0] != 'r' && (y % 2 != 0 || (50 - x) % 2 != 0)) continue;
+                wrong +=
+                    memcmp(small.sample(0, x, y), plain.sample(0, 2 * y, 2 * (50 - x)), 3) != 0;
+            }
+        EXPECT_EQ(wrong, 0) << format;
+    }
+}
+
+// What Y4M says of its pictures stays true; the format is one that loses nothing.
+TEST_F(convert_test, headers_of_edited_video_are_right) {
+    write("in.y4m", "YUV4MPEG2 W4 H2 F25:1 It A4:3 C422\nFRAME\n" + std::string(16, 'x'));
+    const auto header = [&](const std::string &arguments) {
+        EXPECT_EQ(run("in.y4m -o out.y4m " + arguments), 0) << got.err;
+        const std::string text = read("out.y4m");
+        return text.substr(0, text.find('\n'));
+    };
+    EXPECT_EQ(header("--deblock 3"), "YUV4MPEG2 W4 H2 F25:1 It A4:3 C422");
+    EXPECT_EQ(header("--rotate 180"), "YUV4MPEG2 W4 H2 F25:1 I? A4:3 C422");
+    EXPECT_EQ(header("--rotate 90l"), "YUV4MPEG2 W2 H4 F25:1 I? A3:4 C444");
+    EXPECT_EQ(header("--rotate 90l --to yuv420"), "YUV4MPEG2 W2 H4 F25:1 I? A3:4 C420jpeg");
+    EXPECT_EQ(header("--resize 8x2"), "YUV4MPEG2 W8 H2 F25:1 I? A2:3 C422");
+    EXPECT_EQ(header("--resize 8x4 --rotate 90r"), "YUV4MPEG2 W8 H4 F25:1 I? A3:16 C444");
+    EXPECT_EQ(header("--thumbnail"), "YUV4MPEG2 W1 H2 F25:1 I? A3:4 C444");
+}
+
 TEST_F(convert_test, dithering_is_the_librarys_own) {
     good("testcard:64x48 -o plain.rgb565");
     good("testcard:64x48 -o dithered.rgb565 --dither");
@@ -322,6 +517,14 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.y4m -o o-%d-%d.png", "o-%d-%d.png: one number such as", 1},
         {"good.y4m -o o.y4m --sheet", "o.y4m: a contact sheet is a still picture", 1},
         {"good.y4m -o nowhere/o.raw", "nowhere/o.raw: No such file", 1},
+        {"good.png -o o.png --deblock 3", "--deblock smooths planes of YUV", 1},
+        {"good.y4m -o o.y4m --resize 0x48", "--resize: impossible size 0x48", 1},
+        {"good.y4m -o o.y4m --resize 64", "--resize: '64' is not a size", 1},
+        {"testcard:9000x2 -o o.y4m --resize 8000x2", "--resize: 9000x2 cannot become 8000x2", 1},
+        {"testcard:2x9000 -o o.y4m --resize 4000x2 --rotate 90l", "9000 cannot become 2x4000", 1},
+        {"good.y4m -o o.y4m --deblock 16", "--deblock: Value 16 not in range", 2},
+        {"good.y4m -o o.y4m --rotate 45", "--rotate: 45 not in {90l,90r,180,hori,vert}", 2},
+        {"good.y4m -o o.y4m --rotate 90l --thumbnail", "--rotate excludes --thumbnail", 2},
         {"testcard:64x48@0 -o o.png", "testcard:64x48@0: '0' is not a number of frames", 1},
         {"good.y4m -o o.png --frames 0", "--frames", 2},
         {"good.y4m", "--output is required", 2},
@@ -371,9 +574,10 @@ TEST_F(convert_test, broken_pipes_full_disks_and_interruptions_end_cleanly) {
 
 TEST_F(convert_test, the_demonstration_leaves_its_pictures) {
     good("--demo pictures testcard:320x240@3");
-    EXPECT_EQ(files("pictures"),
-              (std::set<std::string>{"every-rgb-format.png", "every-yuv-to-rgb.png",
-                                     "tiles-and-dithering.png"}));
+    EXPECT_EQ(
+        files("pictures"),
+        (std::set<std::string>{"every-rgb-format.png", "every-turn.png", "every-yuv-to-rgb.png",
+                               "road-to-the-screen.png", "tiles-and-dithering.png"}));
     for (const std::string &name : files("pictures")) {
         EXPECT_NE(got.out.find(name), std::string::npos);
         EXPECT_GT(png("pictures/" + name).width(), 800);

@@ -7,30 +7,13 @@
 #include "simgp/simgp.h"
 #include "tests/kept_planes.h"
 #include "tests/rig.h"
+#include "tests/turns.h"
 
 namespace {
 
-// Where sample (x, y) of w x h goes.
-struct place {
-    int column, row;
-};
-place turned(int rot, int x, int y, int w, int h) {
-    switch (rot) {
-        case SIMGP_ROT_90L:
-            return {y, w - 1 - x};
-        case SIMGP_ROT_90R:
-            return {h - 1 - y, x};
-        case SIMGP_ROT_180:
-            return {w - 1 - x, h - 1 - y};
-        case SIMGP_ROT_HORI:
-            return {w - 1 - x, y};
-        case SIMGP_ROT_VERT:
-            return {x, h - 1 - y};
-        default:
-            return {x, y};
-    }
-}
-bool is_quarter(int rot) { return rot == SIMGP_ROT_90L || rot == SIMGP_ROT_90R; }
+using rig::is_quarter;
+using rig::place;
+using rig::turned;
 
 rig::plane_shape turned_shape(int rot, int w, int h, int bytes = 1) {
     if (is_quarter(rot)) std::swap(w, h);

@@ -1,4 +1,7 @@
 // simgp-convert: takes frames from files, pipes or a test card through the library's conversions.
+#include <algorithm>
+#include <iterator>
+
 #include "tools/job.h"
 #include "tools/main.h"
 #include "tools/output.h"
@@ -18,6 +21,9 @@ Examples:
   simgp-convert photo.png -o photo.t64x32
   simgp-convert photo.t64x32 --size 640x480 -o back.png --verbose
   simgp-convert testcard:320x240@50 -o card.y4m
+  simgp-convert clip.y4m -o small-%04d.png --deblock 4 --resize 320x240
+  simgp-convert decoded.t64x32 --size 1280x720 -o screen.rgb565 --resize 480x800 --rotate 90r
+  simgp-convert photo.png -o index.png --thumbnail
   ffmpeg -i film.mp4 -f yuv4mpegpipe -pix_fmt yuv420p - | simgp-convert - -o film.png --sheet
 )";
 
@@ -41,6 +47,21 @@ int main(int argc, char **argv) {
     app.add_option("-n,--frames", job.frames, "stop after so many frames")
         ->check(CLI::PositiveNumber);
     app.add_flag("-d,--dither", job.dither, "dither on the way to 16-bit RGB");
+    app.add_option("--deblock", job.edit.deblock,
+                   "smooth the edges between blocks of 8 x 8, 0 (not at all) to 15; YUV only")
+        ->check(CLI::Range(0, 15));
+    const auto resize = app.add_option("--resize", job.resize,
+                                       "size of what comes out, such as 320x240, after the turn");
+    std::string turn(tools::turn_names[SIMGP_ROT_NONE]);
+    const auto rotate =
+        app.add_option("--rotate", turn,
+                       "quarter turn to the left (90l) or right (90r), half turn "
+                       "(180), mirrored left to right (hori) or top to bottom (vert)")
+            ->check(CLI::IsMember({"90l", "90r", "180", "hori", "vert"}));
+    app.add_flag("--thumbnail", job.edit.thumbnail,
+                 "half the size and turned right, the quickest way: every second pixel")
+        ->excludes(resize)
+        ->excludes(rotate);
     app.add_flag("--sheet", job.sheet, "put the frames on one contact sheet");
     app.add_option("--columns", job.columns, "pictures in a row of the sheet")
         ->check(CLI::PositiveNumber);
@@ -56,6 +77,9 @@ int main(int argc, char **argv) {
         if (list || !demo.empty()) return;
         if (job.source.path.empty()) throw CLI::RequiredError("input");
         if (job.output.empty()) throw CLI::RequiredError("--output");
+        job.edit.turn =
+            int(std::find(std::begin(tools::turn_names), std::end(tools::turn_names), turn) -
+                std::begin(tools::turn_names));
     };
     return tools::run_program(app, argc, argv, check, [&] {
         if (list)

@@ -128,6 +128,56 @@ std::vector<tile> tiles_and_dithering(picture &frame) {
     return tiles;
 }
 
+// The size of a picture whose longer side has `side` pixels.
+edits shrunk_to(const picture &p, int side) {
+    const int longer = std::max(p.width(), p.height());
+    edits edit;
+    edit.width = std::max(p.width() * side / longer, 1);
+    edit.height = std::max(p.height() * side / longer, 1);
+    return edit;
+}
+
+// A tiled frame that is resized, converted and turned for a screen that stands upright; and the
+// thumbnail that the same turn gives.
+std::vector<tile> road_to_the_screen(picture &frame) {
+    std::vector<tile> tiles;
+    road tile_up(frame.shape(), format_coded(SIMGP_FMT_T64X32), false);
+    picture &tiled = tile_up.run(frame);
+    tiles.push_back(make_tile(read_as_lines(tiled), "tiles read as lines", 384, 384));
+    const pixel_format &screen = format_coded(SIMGP_FMT_RGB565);
+    road fit(tiled.shape(), screen, false, shrunk_to(tiled, 360));
+    picture &fitting = fit.run(tiled);
+    tiles.push_back(make_tile(fitting, "rgb565 (simgp_rsz_csc)", 384, 384));
+    edits turn;
+    turn.turn = SIMGP_ROT_90R;
+    road turn_right(fitting.shape(), screen, false, turn);
+    tiles.push_back(make_tile(turn_right.run(fitting), "turned (simgp_rot 90r)", 384, 384));
+    edits thumbnail;
+    thumbnail.thumbnail = true;
+    road shrink(frame.shape(), format_coded(SIMGP_FMT_RGB888), false, thumbnail);
+    tiles.push_back(make_tile(shrink.run(frame), "thumbnail", 384, 384));
+    return tiles;
+}
+
+// Every rotation code in formats that are turned in different ways: a row for each format.
+std::vector<tile> every_turn(picture &frame) {
+    std::vector<tile> tiles;
+    for (int32_t code : {SIMGP_FMT_YUV420, SIMGP_FMT_YUV422N, SIMGP_FMT_NV12, SIMGP_FMT_RGB565}) {
+        road to_format(frame.shape(), format_coded(code), false);
+        picture &source = to_format.run(frame);
+        for (int turn = SIMGP_ROT_NONE; turn <= SIMGP_ROT_VERT; ++turn) {
+            edits edit = shrunk_to(source, 192);
+            if (is_quarter(turn)) std::swap(edit.width, edit.height);
+            edit.turn = turn;
+            road r(source.shape(), format_coded(SIMGP_FMT_RGB565), false, edit);
+            const std::string label(source.format().name);
+            tiles.push_back(
+                make_tile(r.run(source), label + " " + std::string(turn_names[turn]), 192, 192));
+        }
+    }
+    return tiles;
+}
+
 }  // namespace
 
 void demo(const std::string &directory, const source_options &options) {
@@ -152,6 +202,11 @@ void demo(const std::string &directory, const source_options &options) {
         "%stiles-and-dithering.png: from a tiled frame to the screen; dithered beside plain "
         "gradients\n",
         folder.c_str());
+    save(folder + "road-to-the-screen.png", road_to_the_screen(frames.front()), 4);
+    printf("%sroad-to-the-screen.png: a tiled frame, resized to 16-bit RGB, turned; a thumbnail\n",
+           folder.c_str());
+    save(folder + "every-turn.png", every_turn(frames.front()), 6);
+    printf("%severy-turn.png: every turn and mirror, resized on the way\n", folder.c_str());
 }
 
 }  // namespace tools

@@ -1,10 +1,12 @@
 #include "tools/job.h"
 
+#include <inttypes.h>
 #include <stdio.h>
 
 #include <algorithm>
 #include <limits>
 #include <memory>
+#include <numeric>
 #include <vector>
 
 #include "tools/progress.h"
@@ -22,23 +24,26 @@ std::string output_kind(const job &j) {
     return "raw";
 }
 
-// The cheapest of the formats that the kind of output can hold; `dither` narrows them to those
-// that can be dithered.
-const pixel_format &suitable(const picture_shape &from, const std::string &kind, bool dither) {
+// The cheapest of the formats that the kind of output can hold; dithering narrows them to those
+// that can be dithered. A YUV format that gets less chroma than the frames have is the last choice.
+const pixel_format &suitable(const job &j, const picture_shape &from, const std::string &kind) {
     const pixel_format *best = nullptr;
     int best_cost = std::numeric_limits<int>::max();
     for (const pixel_format &format : formats()) {
         const bool fits = kind == "y4m" ? !y4m_tag(format).empty() : format.is_rgb();
         if (!fits) continue;
         try {
-            const int cost = road(from, format, dither).cost();
+            const road r(from, format, j.dither, j.edit);
+            const bool poorer = !from.format->is_rgb() && !format.is_rgb() &&
+                                (format.chroma() < from.format->chroma() || !r.loss().empty());
+            const int cost = r.cost() + (poorer ? 20 : 0);
             if (cost < best_cost) best = &format, best_cost = cost;
         } catch (const fault &) {
         }
     }
     if (!best)
         throw fault("no conversion leads from ", from.format->name, " to a format that ", kind,
-                    " files hold", dither ? ", with dithering" : "");
+                    " files hold", j.dither ? ", with dithering" : "");
     return *best;
 }
 
@@ -46,9 +51,11 @@ const pixel_format &target(const job &j, const picture_shape &from, const std::s
     const pixel_format *named = j.to.empty() ? nullptr : &format_named(j.to);
     if (kind == "raw") {
         if (!named) named = find_format(ending_of(j.output));
-        return named ? *named : *from.format;
+        // The format of the source, or what a turn makes of it.
+        return named ? *named
+                     : turned(*from.format, j.edit.thumbnail ? SIMGP_ROT_90R : j.edit.turn);
     }
-    if (!named) return suitable(from, kind, j.dither);
+    if (!named) return suitable(j, from, kind);
     if (kind == "y4m" && y4m_tag(*named).empty())
         throw fault("Y4M files hold yuv400, yuv420, yuv422n and yuv444, not ", named->name);
     if (kind != "y4m" && !named->is_rgb())
@@ -67,20 +74,47 @@ std::unique_ptr<sink> open_sink(const job &j, const std::string &kind, const vid
     return j.sheet ? open_sheet_sink(j.output, write, j.columns) : open_still_sink(j.output, write);
 }
 
+// What is true of a stream when its pictures have another size, or are turned.
+video_traits edited_traits(video_traits traits, const picture_shape &from, const picture_shape &to,
+                           const edits &edit) {
+    const bool quarter = edit.thumbnail || is_quarter(edit.turn);
+    if (!edit.thumbnail && edit.turn == SIMGP_ROT_NONE && from.width == to.width &&
+        from.height == to.height)
+        return traits;
+    // Lines no longer belong to one field or the other.
+    if (traits.interlacing != "p") traits.interlacing.assign(1, '?');
+    // Pixels as wide as `across` and as high as `down`, unless that is unknown.
+    int64_t across = 0, down = 0;
+    if (sscanf(traits.aspect.c_str(), "%" SCNd64 ":%" SCNd64, &across, &down) != 2) return traits;
+    constexpr int64_t most = 1 << 20;
+    if (across < 1 || down < 1 || across > most || down > most) return traits;
+    if (quarter) std::swap(across, down);
+    if (!edit.thumbnail) {
+        across *= int64_t{quarter ? from.height : from.width} * to.height;
+        down *= int64_t{quarter ? from.width : from.height} * to.width;
+    }
+    const int64_t common = std::gcd(across, down);
+    traits.aspect = std::to_string(across / common) + ":" + std::to_string(down / common);
+    return traits;
+}
+
 }  // namespace
 
-void run(const job &j) {
+void run(const job &wish) {
+    job j = wish;
+    if (!j.resize.empty()) parse_size(j.resize, "--resize", j.edit.width, j.edit.height);
     const std::unique_ptr<source> in = open_source(j.source);
     const std::string kind = output_kind(j);
+    check_edits(in->shape(), j.edit);
 
     // What happens to a frame, in order; every stage takes up the shape that the one before leaves.
     std::vector<std::unique_ptr<stage>> stages;
     auto shape = [&] { return stages.empty() ? in->shape() : stages.back()->out(); };
     {
-        auto r = std::make_unique<road>(shape(), target(j, shape(), kind), j.dither);
+        auto r = std::make_unique<road>(shape(), target(j, shape(), kind), j.dither, j.edit);
         if (!j.quiet && !j.verbose && !r->loss().empty())
-            fprintf(stderr, "simgp-convert: note: no direct conversion; %s passes through %s\n",
-                    r->text().c_str(), r->loss().c_str());
+            fprintf(stderr, "simgp-convert: note: %s passes through %s\n", r->text().c_str(),
+                    r->loss().c_str());
         stages.push_back(std::move(r));
     }
 
@@ -91,7 +125,8 @@ void run(const job &j) {
         for (const auto &s : stages) fprintf(stderr, "%s\n", s->text().c_str());
     }
 
-    const std::unique_ptr<sink> out = open_sink(j, kind, in->traits());
+    const std::unique_ptr<sink> out =
+        open_sink(j, kind, edited_traits(in->traits(), in->shape(), shape(), j.edit));
     progress bar(!j.quiet);
     int64_t frames = 0;
     try {

@@ -6,6 +6,7 @@
 
 #include <string>
 
+#include "tools/road.h"
 #include "tools/source.h"
 
 namespace tools {
@@ -17,6 +18,8 @@ struct job {
     std::string as;      // png, ppm, y4m, raw; empty: by the ending of `output`
     int64_t frames = 0;  // stop after so many; 0: all
     bool dither = false;
+    edits edit;
+    std::string resize;  // "320x240", the size in `edit`; empty: none
     bool sheet = false;
     int columns = 0;
     bool verbose = false;

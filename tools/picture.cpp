@@ -52,6 +52,7 @@ constexpr auto table = [] {
 }();
 
 int even(int n) { return n + (n & 1); }
+int whole_fours(int n) { return (n + 3) & ~3; }
 int shifted_up(int n, int shift) { return (n + (1 << shift) - 1) >> shift; }
 
 // As simgp/tile.h says: whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one,
@@ -65,10 +66,8 @@ size_t tiled_plane_bytes(size_t line_bytes, size_t lines) {
 }  // namespace
 
 int pixel_format::chroma() const {
-    if (is_rgb()) return 4;
-    if (is_tiled()) return 1;
-    if (channels[1].step == 0) return 0;
-    return 4 >> (channels[1].x_shift + channels[1].y_shift);
+    const bool grey = kind == family::planar && plane_count == 1;
+    return grey ? 0 : 4 >> (chroma_x_shift() + chroma_y_shift());
 }
 
 std::span<const pixel_format> formats() { return table; }
@@ -138,8 +137,8 @@ picture::picture(const picture_shape &shape) : shape_(shape) {
         }
         lines_[k] = shifted_up(height(), p.y_shift);
         line_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
-        stride_[k] = ptrdiff_t(shifted_up(even(width()), p.x_shift)) * p.bytes;
-        total += size_t(stride_[k]) * shifted_up(even(height()), p.y_shift);
+        stride_[k] = ptrdiff_t(shifted_up(whole_fours(width()), p.x_shift)) * p.bytes;
+        total += size_t(stride_[k]) * shifted_up(whole_fours(height()), p.y_shift);
     }
     memory_.resize(total);
 }

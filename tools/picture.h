@@ -44,6 +44,10 @@ struct pixel_format {
     bool is_packed() const { return kind == family::packed; }
     // Every sample is a byte with a place that `channels` gives.
     bool has_samples() const { return !is_tiled() && !is_rgb16(); }
+    // A chroma sample stands for 2^chroma_x_shift() x 2^chroma_y_shift() pixels; shifts of 0 where
+    // there is no chroma.
+    int chroma_x_shift() const { return is_packed() ? 1 : planes[plane_count - 1].x_shift; }
+    int chroma_y_shift() const { return planes[plane_count - 1].y_shift; }
     // Chroma samples per four pixels (0, 1, 2, 4): what a road through this format keeps of it.
     int chroma() const;
 };
@@ -72,8 +76,8 @@ void check_size(int64_t width, int64_t height, const std::string &where);
 // Reads "640x480", anything else ends in a fault; `what` names the text in it.
 void parse_size(std::string_view text, const std::string &what, int &width, int &height);
 
-// A picture in memory. Lines and columns are allocated up to the next even number, so that the
-// chroma of the last odd column and line always has the pixels that it belongs to.
+// A picture in memory. Lines and columns are allocated up to the next multiple of four, so that a
+// last odd column and line, of luma and of chroma, can always be taken for the first of a pair.
 class picture {
   public:
     picture() = default;

@@ -10,11 +10,11 @@ namespace tools {
 
 namespace {
 
-size_t index(const pixel_format &format) { return size_t(&format - formats().data()); }
+struct size {
+    int width, height;
+};
 
-int32_t call(method how, const simgp_img &src, const simgp_img &dst) {
-    return how == method::dither ? simgp_csc_dither(&src, &dst) : simgp_csc(&src, &dst);
-}
+size exchanged(const size &s, bool quarter) { return quarter ? size{s.height, s.width} : s; }
 
 // Every step costs, and more so what it loses: bits of colour, chroma samples, and the rounding of
 // a passage between YUV and RGB.
@@ -22,61 +22,149 @@ int step_cost(const pixel_format &from, const pixel_format &to, method how) {
     int cost = how == method::samples ? 12 : 2;
     if (to.is_rgb16() && !from.is_rgb16()) cost += 10;
     if (from.is_rgb() != to.is_rgb()) cost += 2;
-    if (to.chroma() < from.chroma() && !from.is_rgb()) cost += 3;
+    const bool coarser =
+        to.chroma_x_shift() > from.chroma_x_shift() || to.chroma_y_shift() > from.chroma_y_shift();
+    if (!from.is_rgb() && (coarser || to.chroma() < from.chroma())) cost += 3;
     return cost;
 }
 
-// True if a tiled picture has room for the chroma of an odd last line: unless the chroma line would
-// begin a tile row of its own, it lies in the last one.
-bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
+// The filter works best on 8 bits. A picture that grows is best resized as it came, before chroma
+// is repeated into steps; one that shrinks, where chroma has as many samples as it ever has, since
+// the smaller picture needs each of them.
+int resize_cost(const pixel_format &f, const size &from, const size &to, const pixel_format &source,
+                const pixel_format &target) {
+    const bool grows = int64_t{from.width} * from.height < int64_t{to.width} * to.height;
+    const int best = grows ? source.chroma() : std::max(source.chroma(), target.chroma());
+    return 2 + (f.is_rgb16() ? 10 : 0) + (f.chroma() != best ? 1 : 0);
+}
 
-// Converts one picture. The library may leave out the chroma of a last odd column or line; given
-// the next even size it does not, and as chroma is never averaged, nothing of what is added shows.
-// Conversions from YUV to RGB have their own rules for odd sizes, which are kept.
-void convert(method how, picture &src, picture &dst) {
-    const pixel_format &from = src.format(), &to = dst.format();
-    if (how == method::samples) return move_samples(src, dst);
-    const bool even_width = !to.is_rgb(), tiled = from.is_tiled();
-    const bool even_height =
-        even_width && ((!tiled && !to.is_tiled()) || tiles_hold_last_chroma(src.height()));
-    const simgp_img in = src.descriptor(even_width, even_height), out = dst.descriptor();
-    const int32_t result = call(how, in, out);
-    if (result != SIMGP_OK)
-        throw fault("the library refuses ", from.name, " -> ", to.name, ": result ", result);
-    if (tiled && even_width && !even_height) {
-        // The chroma of the last line is nowhere: that of the line above has to do.
-        for (int k = 1; k < dst.planes(); ++k) {
-            const int last = dst.lines(k) - 1;
-            if (last > 0)
-                std::copy_n(dst.line(k, last - 1), dst.line_bytes(k), dst.line(k, last));
-            else
-                std::fill_n(dst.line(k, last), dst.line_bytes(k), uint8_t{128});
+// Of an odd number of columns (lines), the last one has a chroma sample of its own. If it comes
+// first, that sample is taken for two columns, and every other one is a column off.
+int turn_cost(const pixel_format &f, const size &from, int turn) {
+    const bool columns_turn =
+        turn == SIMGP_ROT_90L || turn == SIMGP_ROT_180 || turn == SIMGP_ROT_HORI;
+    const bool lines_turn =
+        turn == SIMGP_ROT_90R || turn == SIMGP_ROT_180 || turn == SIMGP_ROT_VERT;
+    const bool off = (columns_turn && f.chroma_x_shift() && from.width % 2) ||
+                     (lines_turn && f.chroma_y_shift() && from.height % 2);
+    return off ? 8 : 2;
+}
+
+// What the library's resize can hold, plane by plane (simgp_rsz_get_step).
+bool is_resizable(const pixel_format &f, const size &from, const size &to) {
+    for (int k = 0; k < f.plane_count; ++k) {
+        const auto extent = [](int n, int shift) { return (n + (1 << shift) - 1) >> shift; };
+        const plane_shape &p = f.planes[k];
+        const int w = extent(from.width, p.x_shift), h = extent(from.height, p.y_shift);
+        int32_t step_x, step_y;
+        simgp_rsz_get_step(w, h, extent(to.width, p.x_shift), extent(to.height, p.y_shift),
+                           SIMGP_ROT_NONE, &step_x, &step_y);
+        // The step of a single sample is 0, and right.
+        if ((w > 1 && step_x == 0) || (h > 1 && step_y == 0)) return false;
+    }
+    return true;
+}
+
+// What is to be done, in order, and the sizes before and between.
+struct plan {
+    const pixel_format &source, &target;
+    int turn;
+    std::vector<method> parts;
+    std::vector<size> sizes;
+
+    plan(const picture_shape &from, const pixel_format &to, const edits &wish)
+        : source(*from.format),
+          target(to),
+          turn(wish.thumbnail ? SIMGP_ROT_90R : wish.turn),
+          sizes{{from.width, from.height}} {
+        const auto add = [this](method how, const size &after) {
+            parts.push_back(how);
+            sizes.push_back(after);
+        };
+        const bool quarter = is_quarter(turn);
+        const size before = sizes.back(), goal = exchanged({wish.width, wish.height}, quarter);
+        if (wish.deblock > 0) add(method::deblock, before);
+        if (wish.thumbnail)
+            add(method::thumbnail, {(before.height + 1) / 2, (before.width + 1) / 2});
+        if (wish.width > 0 && (goal.width != before.width || goal.height != before.height))
+            add(method::resize, goal);
+        if (wish.turn != SIMGP_ROT_NONE) add(method::turn, exchanged(sizes.back(), quarter));
+    }
+
+    // Ends in a fault if no road can do it.
+    void check() const {
+        for (size_t k = 0; k < parts.size(); ++k) {
+            if (parts[k] == method::deblock && source.is_rgb())
+                throw fault(
+                    "--deblock smooths planes of YUV as a decoder leaves them, but the frames are ",
+                    source.name, "; deblock before they become RGB");
+            const size &s = sizes[k], &goal = sizes[k + 1];
+            if (parts[k] == method::resize &&
+                !is_resizable(format_coded(SIMGP_FMT_YUV400), s, goal))
+                throw fault("--resize: ", s.width, "x", s.height, " cannot become ", goal.width,
+                            "x", goal.height,
+                            " at once: more than 8192 columns or lines have to shrink to a third "
+                            "or less, more than 16384 to a fifth, 32768 to a ninth; resize twice");
         }
     }
-}
+
+    // Calls go(parts done after it, format after it, method, cost) for every step that begins with
+    // pictures of `f` when `done` parts are done.
+    template <class Go>
+    void for_each_step(const pixel_format &f, size_t done, Go go) const {
+        for (const pixel_format &to : formats()) {
+            // Rounding into RGB and back again.
+            const int there_and_back = !source.is_rgb() && f.is_rgb() && !to.is_rgb() ? 12 : 0;
+            for (method how : {method::csc, method::samples})
+                if (offered(f, to, how)) go(done, to, how, step_cost(f, to, how) + there_and_back);
+        }
+        if (done == parts.size()) return;
+        const size &from = sizes[done], &to = sizes[done + 1];
+        const pixel_format &after = turned(f, turn);
+        switch (parts[done]) {
+            case method::resize: {
+                if (!is_resizable(f, from, to)) break;
+                const int cost = resize_cost(f, from, to, source, target);
+                if (offered(f, f, method::resize)) go(done + 1, f, method::resize, cost);
+                for (const pixel_format &g : formats())
+                    if (offered(f, g, method::resize_csc))
+                        go(done + 1, g, method::resize_csc, step_cost(f, g, method::csc));
+                if (done + 1 < parts.size() && offered(f, after, method::resize_turn, turn))
+                    go(done + 2, after, method::resize_turn, cost + turn_cost(f, to, turn));
+                break;
+            }
+            case method::turn:
+                if (offered(f, after, method::turn, turn))
+                    go(done + 1, after, method::turn, turn_cost(f, from, turn));
+                if (offered(f, f, method::turn_bytes)) go(done + 1, f, method::turn_bytes, 6);
+                // Of an odd number of lines the last one gets no chroma.
+                if (from.height % 2 == 0)
+                    for (const pixel_format &g : formats())
+                        if (offered(f, g, method::csc_turn, turn))
+                            go(done + 1, g, method::csc_turn,
+                               step_cost(f, g, method::csc) + turn_cost(f, from, turn) - 2);
+                break;
+            case method::thumbnail:
+                if (offered(f, after, method::thumbnail)) {
+                    const bool bytes = f.planes[f.plane_count - 1].bytes > 1;
+                    go(done + 1, after, method::thumbnail,
+                       bytes ? 6 : turn_cost(f, exchanged(to, true), turn));
+                }
+                break;
+            default:
+                if (offered(f, f, parts[done])) go(done + 1, f, parts[done], 2);
+        }
+    }
+};
 
 }  // namespace
 
-bool offered(const pixel_format &from, const pixel_format &to, method how) {
-    const std::span<const pixel_format> all = formats();
-    if (how == method::samples) {
-        // Layouts that the library reads but never writes. That pictures can be brought into them
-        // all the same, the tool moves samples into them itself.
-        const auto writes = [&](const pixel_format &f) { return offered(f, to, method::csc); };
-        return !from.is_rgb() && !from.is_tiled() && !to.is_rgb() && &from != &to &&
-               std::none_of(all.begin(), all.end(), writes);
-    }
-    static std::vector<signed char> known(2 * all.size() * all.size());  // 0: not asked
-    signed char &answer =
-        known[2 * (index(from) * all.size() + index(to)) + (how == method::dither)];
-    if (answer == 0) {
-        picture src({&from, 8, 8}), dst({&to, 8, 8});
-        answer = call(how, src.descriptor(), dst.descriptor()) == SIMGP_OK ? 1 : -1;
-    }
-    return answer > 0;
+void check_edits(const picture_shape &from, const edits &wish) {
+    plan(from, *from.format, wish).check();
 }
 
-road::road(const picture_shape &from, const pixel_format &to, bool dither) : from_(from) {
+road::road(const picture_shape &from, const pixel_format &to, bool dither, const edits &wish)
+    : from_(from) {
     constexpr int far = std::numeric_limits<int>::max() / 2;
     struct place {
         int cost = far;
@@ -84,81 +172,100 @@ road::road(const picture_shape &from, const pixel_format &to, bool dither) : fro
         method how = method::csc;
         bool settled = false;
     };
-    // Dijkstra's way over the formats. Dithering comes last of all: it is decided after the rest.
+    // Dijkstra's way over the formats, once for each number of parts that are done. Dithering comes
+    // last of all: it is decided after the rest.
+    const plan p(from, to, wish);
+    p.check();
     const std::span<const pixel_format> all = formats();
-    const size_t count = all.size();
-    std::vector<place> places(count);
+    const size_t count = all.size(), last = p.parts.size() * count;
+    const auto index = [&](const pixel_format &f) { return size_t(&f - all.data()); };
+    std::vector<place> places(last + count);
     const size_t start = index(*from_.format);
     places[start].cost = 0;
     for (;;) {
-        size_t at = count;
-        for (size_t k = 0; k < count; ++k)
+        size_t at = places.size();
+        for (size_t k = 0; k < places.size(); ++k)
             if (!places[k].settled && places[k].cost < far &&
-                (at == count || places[k].cost < places[at].cost))
+                (at == places.size() || places[k].cost < places[at].cost))
                 at = k;
-        if (at == count) break;
+        if (at == places.size()) break;
         places[at].settled = true;
-        for (size_t k = 0; k < count; ++k)
-            for (method how : {method::csc, method::samples}) {
-                if (places[k].settled || !offered(all[at], all[k], how)) continue;
-                const int cost = places[at].cost + step_cost(all[at], all[k], how);
-                if (cost < places[k].cost) places[k] = {cost, at, how, false};
-            }
+        p.for_each_step(all[at % count], at / count,
+                        [&](size_t done, const pixel_format &f, method how, int cost) {
+                            place &there = places[done * count + index(f)];
+                            cost += places[at].cost;
+                            if (!there.settled && cost < there.cost) there = {cost, at, how, false};
+                        });
     }
-    size_t end = index(to);
+    size_t end = last + index(to);
     cost_ = places[end].cost;
     if (dither) {
-        size_t best = count;
         cost_ = far;
         for (size_t k = 0; k < count; ++k) {
-            if (places[k].cost >= far || !offered(all[k], to, method::dither)) continue;
-            const int cost = places[k].cost + step_cost(all[k], to, method::dither);
-            if (cost < cost_) cost_ = cost, best = k;
+            if (places[last + k].cost >= far || !offered(all[k], to, method::dither)) continue;
+            const int cost = places[last + k].cost + step_cost(all[k], to, method::dither);
+            if (cost < cost_) cost_ = cost, end = last + k;
         }
-        if (best != count) end = best;
     }
     if (cost_ >= far)
         throw fault("no conversion leads from ", from_.format->name, " to ", to.name,
                     dither ? " with dithering" : "", "; see --list");
-    auto add = [&](method how, const pixel_format &out) {
-        steps_.push_back({how, picture({&out, from_.width, from_.height})});
+    const auto add = [&](method how, size_t at) {
+        const size &s = p.sizes[at / count];
+        steps_.emplace_back(how, picture_shape{&all[at % count], s.width, s.height},
+                            how == method::deblock ? wish.deblock : p.turn);
     };
-    for (size_t k = end; k != start; k = places[k].before) add(places[k].how, all[k]);
+    for (size_t k = end; k != start; k = places[k].before) add(places[k].how, k);
     std::reverse(steps_.begin(), steps_.end());
-    if (dither) add(method::dither, to);
+    if (dither) add(method::dither, last + index(to));
 }
 
-picture_shape road::out() const { return steps_.empty() ? from_ : steps_.back().out.shape(); }
+picture_shape road::out() const { return steps_.empty() ? from_ : steps_.back().out(); }
 
 picture &road::run(picture &from) {
     picture *at = &from;
-    for (step &s : steps_) {
-        convert(s.how, *at, s.out);
-        at = &s.out;
-    }
+    for (step &s : steps_) at = &s.run(*at);
     return *at;
 }
 
 std::string road::text() const {
     std::string text(from_.format->name);
+    const picture_shape *before = &from_;
     for (const step &s : steps_) {
-        text.append(" -> ").append(s.out.format().name);
-        if (s.how == method::dither) text.append(" (dithered)");
-        if (s.how == method::samples) text.append(" (samples moved by the tool)");
+        const picture_shape &out = s.out();
+        text.append(" -> ").append(out.format->name);
+        if (out.width != before->width || out.height != before->height)
+            text.append(" ")
+                .append(std::to_string(out.width))
+                .append("x")
+                .append(std::to_string(out.height));
+        if (!s.note().empty()) text.append(" (").append(s.note()).append(")");
+        before = &out;
     }
     return text;
 }
 
 std::string road::loss() const {
     if (steps_.size() < 2) return {};
-    const pixel_format &to = steps_.back().out.format();
-    for (size_t k = 0; k + 1 < steps_.size(); ++k) {
-        const pixel_format &between = steps_[k].out.format();
-        if (between.is_rgb16() && !from_.format->is_rgb16()) return "16-bit colour";
-        if (between.chroma() < std::min(from_.format->chroma(), to.chroma()))
-            return between.chroma() == 1 ? "4:2:0 chroma" : "4:2:2 chroma";
+    const pixel_format &to = *steps_.back().out().format;
+    // The coarsest chroma on the way; quarter turns exchange its directions.
+    int x_shift = 0, y_shift = 0;
+    bool grey = false;
+    const auto pass = [&](const pixel_format &f) {
+        grey |= f.chroma() == 0;
+        x_shift = std::max(x_shift, f.chroma_x_shift());
+        y_shift = std::max(y_shift, f.chroma_y_shift());
+    };
+    pass(*from_.format);
+    for (const step &s : steps_) {
+        const pixel_format &f = *s.out().format;
+        if (f.is_rgb16() && !from_.format->is_rgb16() && !to.is_rgb16()) return "16-bit colour";
+        if (s.turns() && is_quarter(s.code())) std::swap(x_shift, y_shift);
+        pass(f);
     }
-    return {};
+    const int kept = grey ? 0 : 4 >> (x_shift + y_shift);
+    if (kept >= std::min(from_.format->chroma(), to.chroma())) return {};
+    return kept == 0 ? "luma alone" : kept == 1 ? "4:2:0 chroma" : "4:2:2 chroma";
 }
 
 }  // namespace tools

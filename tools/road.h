@@ -1,4 +1,4 @@
-// The conversions that lead from one format to another.
+// The steps that lead from one format to another, and what is done to the pictures on the way.
 #ifndef TOOLS_ROAD_H
 #define TOOLS_ROAD_H
 
@@ -6,24 +6,30 @@
 #include <vector>
 
 #include "tools/stage.h"
+#include "tools/step.h"
 
 namespace tools {
 
-// Who does a step.
-enum class method { csc, dither, samples };
+// What is done to pictures beside converting them, in this order.
+struct edits {
+    int deblock = 0;            // strength; 0: none
+    int width = 0, height = 0;  // of what comes out, after the turn; 0: not resized
+    int turn = SIMGP_ROT_NONE;
+    bool thumbnail = false;  // half the size, turned right; not together with the two above
+};
 
-// True if the library has this conversion; found out by asking it for a tiny picture.
-bool offered(const pixel_format &from, const pixel_format &to, method how);
+// Ends in a fault if these edits cannot be done to such pictures, whatever they become.
+void check_edits(const picture_shape &from, const edits &wish);
 
-// The best chain of conversions, with the pictures between them.
+// The best chain of steps, with the pictures between them.
 class road : public stage {
   public:
     // From pictures of `from` to the format `to`. With `dither` the last step is a dithered one.
     // Ends in a fault where no chain leads there.
-    road(const picture_shape &from, const pixel_format &to, bool dither);
+    road(const picture_shape &from, const pixel_format &to, bool dither, const edits &wish = {});
 
-    // Lines and columns beyond the size of `from` are overwritten. Where there is nothing to do,
-    // the result is `from`.
+    // Lines and columns beyond the size of `from` are overwritten, and with deblocking it may be
+    // changed itself. Where there is nothing to do, the result is `from`.
     picture &run(picture &from) override;
     // "nv12 -> yuv420 -> rgb565 (dithered)"
     std::string text() const override;
@@ -34,10 +40,6 @@ class road : public stage {
     int cost() const { return cost_; }
 
   private:
-    struct step {
-        method how;
-        picture out;
-    };
     picture_shape from_;
     std::vector<step> steps_;
     int cost_ = 0;

@@ -38,13 +38,13 @@ struct lines_ahead {
 // words. Otherwise all squares of a block meet on the stack: neither half then needs more than eight
 // registers, and each goes through the cache lines of its side one after the other, a whole line at
 // a time.
-template <samples S>
+template <sample_kind S>
 struct transposition {
     static constexpr int size = int(sample_size<S>), gap = int(sample_gap<S> / sample_size<S>);
     static constexpr ptrdiff_t side = block_side<S>;
     static constexpr ptrdiff_t columns_of_square = 16 / size, rows_of_square = bytes / size;
     static constexpr int quads = int(columns_of_square / 4);  // of rows in a block of a vector
-    static constexpr bool meets_in_registers = S == samples::words || registers == 32;
+    static constexpr bool meets_in_registers = S == sample_kind::words || registers == 32;
 
     // [columns 4 k / size ...][rows 4 q ... 4 q + 3]
     using square = u8v[4][quads];
@@ -53,7 +53,7 @@ struct transposition {
     template <class Row>
     static void collect(square &to, int q, Row row) {
         u8v lo01, hi01, lo23, hi23;
-        if constexpr (S == samples::even_bytes) {
+        if constexpr (S == sample_kind::even_bytes) {
             // Bytes 0, 2, ... 14 and 16, 18, ... 30, these from the upper halves of words that begin
             // a byte early: nothing behind the last sample is read.
             const auto low = [](u8v a, u8v b) { return as_u8(bit_or(even(a), shl<8>(as_u16(b)))); };
@@ -184,7 +184,7 @@ struct transposition {
                     else
                         for (ptrdiff_t i = 0; i < width; i++) in[16 * r + i] = from[gap * i];
                 }
-                using packed = transposition<size == 1 ? samples::bytes : samples::words>;
+                using packed = transposition<size == 1 ? sample_kind::bytes : sample_kind::words>;
                 packed::template squares<1, 1>(in, 16, out, bytes, wide, high, 0);
                 for (ptrdiff_t k = 0; k < width; k++)
                     memcpy(dst + (x + k) * dst_stride + y * size, out + bytes * k,
@@ -214,14 +214,14 @@ struct transposition {
     }
 };
 
-template <samples S>
+template <sample_kind S>
 static u8v load_reversed(const uint8_t *p) {
-    return S == samples::words ? reverse_u16(load(p)) : reverse_u8(load(p));
+    return S == sample_kind::words ? reverse_u16(load(p)) : reverse_u8(load(p));
 }
 
 // Loads go up, as the processor foresees them, and stores go down. The last vector may move some
 // samples again.
-template <samples S>
+template <sample_kind S>
 static void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
     constexpr ptrdiff_t size = sample_size<S>;
     const ptrdiff_t length = count * size;
@@ -246,11 +246,12 @@ static void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
 }
 
 void fill_rotate(rotate_rows &t) {
-    t.transpose[size_t(samples::bytes)] = transposition<samples::bytes>::any_block;
-    t.transpose[size_t(samples::words)] = transposition<samples::words>::any_block;
-    t.transpose[size_t(samples::even_bytes)] = transposition<samples::even_bytes>::any_block;
-    t.reverse[size_t(samples::bytes)] = reverse<samples::bytes>;
-    t.reverse[size_t(samples::words)] = reverse<samples::words>;
+    t.transpose[size_t(sample_kind::bytes)] = transposition<sample_kind::bytes>::any_block;
+    t.transpose[size_t(sample_kind::words)] = transposition<sample_kind::words>::any_block;
+    t.transpose[size_t(sample_kind::even_bytes)] =
+        transposition<sample_kind::even_bytes>::any_block;
+    t.reverse[size_t(sample_kind::bytes)] = reverse<sample_kind::bytes>;
+    t.reverse[size_t(sample_kind::words)] = reverse<sample_kind::words>;
 }
 
 }  // namespace simgp::SIMD_TARGET

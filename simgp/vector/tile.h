@@ -3,6 +3,7 @@
 #define SIMGP_VECTOR_TILE_H
 
 #include "rows/tile.h"
+#include "simgp/vector/fetch.h"
 #include "simgp/vector/matrix.h"
 #include "simgp/vector/packer.h"
 
@@ -12,11 +13,7 @@ static_assert(tile_width % bytes == 0);
 
 // The linear rows beside a tile are too many streams for the processor to foresee. Copies are held
 // up by that once they leave the caches, so they ask for the bytes beside the second tile to come.
-// A hint may lead behind a plane, but no pointer may: hence the integer.
-inline void fetch_ahead(const uint8_t *p) {
-    __builtin_prefetch(
-        reinterpret_cast<const void *>(reinterpret_cast<uintptr_t>(p) + 2 * tile_width));
-}
+inline void fetch_ahead(const uint8_t *p) { fetch(p, 2 * tile_width); }
 
 static void detile(const uint8_t *tile, uint8_t *dst, ptrdiff_t stride, ptrdiff_t height) {
     for (ptrdiff_t r = 0; r < height; r++) {

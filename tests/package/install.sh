@@ -43,9 +43,9 @@ configure_user user && "$cmake" --build "$scratch/user" >>"$scratch/log" 2>&1 ||
     cat "$scratch/log"
     exit 1
 }
-for program in user_shared user_static; do
+for program in user_shared user_static road; do
     # shellcheck disable=SC2086
-    $emulator "$scratch/user/$program" || fault "$program, built with find_package, failed."
+    $emulator "$scratch/user/$program" >/dev/null || fault "$program, built with find_package, failed."
 done
 configure_user refused -DCOMPONENTS=nonsense && fault "The package has a component 'nonsense'."
 

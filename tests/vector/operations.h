@@ -45,6 +45,9 @@ static const operation operations[] = {
     MEMORY("load_split_by4", 2 * bytes, const pair_u8 v = load_split_by4(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("load_blocks", bytes, put(out, load_blocks(in - 16 - (blocks - 1) * 23, 23))),
     MEMORY("load_blocks, upwards", bytes, put(out, load_blocks(in - 16, -bytes - 1))),
+    MEMORY("gather_blocks", bytes, int32_t at[blocks];
+           for (int j = 0; j < blocks; j++) at[j] = -17 - in[-j - 1] % (7 * 16);
+           put(out, gather_blocks(in, at))),
     MEMORY("store_blocks", 24 * blocks - 8,
            for (int i = 0; i < 24 * blocks - 8; i++) out[i] = 0;
            store_blocks(out, 24, u8(in, 0))),
@@ -79,6 +82,8 @@ static const operation operations[] = {
     VECTOR("shr 13", u16, shr<13>(a)),
     VECTOR("sar 1", s16, sar<1>(a)),
     VECTOR("sar 15", s16, sar<15>(a)),
+    VECTOR("shr_pairs", u16, shr_pairs<6, 9>(a)),
+    VECTOR("shr_pairs, widest", u16, shr_pairs<15, 1>(a)),
 
     VECTOR("add", s16, add(a, b)),
     VECTOR("add_sat", s16, add_sat(a, b)),
@@ -86,6 +91,7 @@ static const operation operations[] = {
     VECTOR("min_s16", s16, min_s16(a, b)),
     VECTOR("max_s16", s16, max_s16(a, b)),
     VECTOR("mul", u16, mul(a, b)),
+    VECTOR("mul_round", s16, mul_round(a, as_s16(bit_or(as_u16(b), set_u16(1))))),
     VECTOR("add_sat_u8", u8, add_sat_u8(a, b)),
     VECTOR("sub_sat_u8", u8, sub_sat_u8(a, b)),
     VECTOR("add_u8", u8, add_u8(a, b)),
@@ -102,6 +108,8 @@ static const operation operations[] = {
     VECTOR("dot_pairs, mixed", u8, dot_pairs(a, bit_and(b, set_u8(63)))),
     VECTOR("dot_pairs, widest", u8, dot_pairs(a, bit_and(b, set_u8(64)))),
     VECTOR("dot_pairs, apart", u8, dot_pairs(a, bit_and(b, set_pair(127, 1)))),
+    VECTOR("sum_pairs", u16, sum_pairs<256>(shr_pairs<9, 8>(a), shr_pairs<9, 8>(b))),
+    VECTOR("sum_pairs, twice", u16, sum_pairs<2>(shr_pairs<2, 2>(a), shr_pairs<1, 2>(b))),
     VECTOR("pair_dot luma even", u8, pair_dot<149, 0, 13440>(a)),
     VECTOR("pair_dot luma odd", u8, pair_dot<0, 150, 13552>(a)),
     VECTOR("pair_dot negative", u8, pair_dot<-50, -104, 3312>(a)),
@@ -135,6 +143,8 @@ static const operation operations[] = {
     VECTOR("zip_high 8", u8, zip_high<8>(a, b)),
     VECTOR("blend_u32", u8, blend_u32(a, b)),
     VECTOR("shuffle", u8, shuffle(a, bit_and(b, set_u8(15)))),
+    VECTOR("shuffle, zeros", u8, shuffle(a, bit_and(b, set_u8(0x8F)))),
+    VECTOR("shuffle, zeros of any index", u8, shuffle(a, bit_or(b, set_u8(0x80)))),
     VECTOR("reverse_u8", u8, reverse_u8(a)),
     VECTOR("reverse_u16", u8, reverse_u16(a)),
 

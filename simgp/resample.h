@@ -1,0 +1,298 @@
+// The resampler: lines of a resized plane, made when they are wanted, from wherever the rows of the
+// source come. The kernels that resize share it:
+//
+//     const resampling r(resize_kind::bytes1, step_x, step_y);
+//     resample_memory<10752> memory;
+//     r.for_each_strip(width, memory.size, [&](ptrdiff_t x, ptrdiff_t columns) {
+//         const resize_strip strip = r.plan(x, columns, r.whole_rows(width), memory.bytes);
+//         resampled_lines lines(r, strip, src, memory.bytes + r.plan_bytes(columns));
+//         lines.make(0, height, dst.line(0) + x * r.pixel_bytes, dst.stride);
+//     });
+#ifndef SIMGP_RESAMPLE_H
+#define SIMGP_RESAMPLE_H
+
+#include "rows/choose.h"
+#include "simgp/kernel.h"
+#include "simgp/resize.h"
+
+namespace simgp {
+
+// One axis of a resize: where the samples of the destination lie in the source.
+struct resize_axis {
+    uint32_t step;
+    int32_t shift;
+
+    // From a packed step.
+    explicit resize_axis(int32_t packed) : step(uint32_t(packed >> 3)), shift(packed & 7) {}
+
+    // Positions are 32-bit numbers.
+    uint32_t at(ptrdiff_t i) const { return uint32_t(i) * step; }
+    ptrdiff_t cell(ptrdiff_t i) const { return ptrdiff_t(int32_t(at(i)) >> 18) * (1 << shift); }
+    int32_t phase(ptrdiff_t i) const { return int32_t(at(i) >> 15 & 7); }
+    ptrdiff_t tap() const { return ptrdiff_t(1) << shift; }
+    // The second neighbour; the first again where it has no weight.
+    ptrdiff_t next(ptrdiff_t i) const { return cell(i) + (phase(i) ? tap() : 0); }
+    // How much of the source the first n >= 1 samples need.
+    ptrdiff_t extent(ptrdiff_t n) const { return next(n - 1) + 1; }
+};
+
+// Which part of the source's rows is handed over: from a column on, so many columns.
+struct source_span {
+    ptrdiff_t first, columns;
+};
+
+// Stack memory for plans and kept rows.
+template <size_t Size>
+struct resample_memory {
+    static constexpr ptrdiff_t size = Size;
+    alignas(resize_alignment) uint8_t bytes[Size];
+};
+
+// Memory that is handed out piece by piece. Without memory it only adds up what is asked for.
+struct memory_pieces {
+    uint8_t *memory;
+    ptrdiff_t used = 0;
+
+    uint8_t *take(ptrdiff_t size) {
+        uint8_t *const piece = memory ? memory + used : nullptr;
+        used += (size + resize_alignment - 1) & -ptrdiff_t(resize_alignment);
+        return piece;
+    }
+};
+
+// How wide strips are that `fits` says yes to: as many columns as suit all instruction sets, or an even
+// number, or 1, which always fits.
+template <class Fits>
+ptrdiff_t columns_of_strips(ptrdiff_t width, Fits fits) {
+    constexpr ptrdiff_t suits = 128;
+    for (ptrdiff_t strips = 1;; strips++) {
+        const ptrdiff_t least = (width + strips - 1) / strips;
+        const ptrdiff_t unit = least > suits ? suits : 2;
+        const ptrdiff_t columns = (least + unit - 1) & -unit;
+        if (fits(columns < width ? columns : width)) return columns;
+        if (least == 1) return 1;
+    }
+}
+
+// What all strips of a resize share.
+class resampling {
+  public:
+    // Where the step from a line to the next is short, most rows are wanted for several lines:
+    // they are blended across once, and the two latest kept. The other way, two rows are blended at
+    // once for each line, and a source must be able to hand over four rows at a time; `keep` rules
+    // that out.
+    resampling(resize_kind kind, int32_t step_x, int32_t step_y, bool keep = false)
+        : pixel_bytes(resized_pixel_bytes[size_t(kind)]),
+          loops(live_rows().resize.of[size_t(kind)]),
+          x(step_x),
+          y(step_y),
+          strip_() {
+        strip_.step = x.step;
+        strip_.shift = x.shift;
+        strip_.keeps = keep || (y.shift == 0 && y.step < short_step);
+        loops.measure(strip_);
+    }
+
+    const ptrdiff_t pixel_bytes;
+    const resize_loops &loops;
+    const resize_axis x, y;
+
+    bool keeps() const { return strip_.keeps; }
+
+    // The memory of a strip's plan, and of the two rows that are kept for its lines: multiples of
+    // the alignment.
+    ptrdiff_t plan_bytes(ptrdiff_t columns) const { return whole(columns, strip_.plan_bytes); }
+    ptrdiff_t ring_bytes(ptrdiff_t columns) const {
+        return keeps() ? 2 * whole(columns, strip_.kept_bytes) : 0;
+    }
+    // How many columns a strip may have whose plan and whose lines' rows, of so many sources that
+    // share the plan, fit the memory.
+    ptrdiff_t columns_in(ptrdiff_t memory, int sources = 1) const {
+        const ptrdiff_t step =
+            strip_.plan_bytes + (keeps() ? 2 * sources * ptrdiff_t(strip_.kept_bytes) : 0);
+        const ptrdiff_t loss = (1 + 2 * sources) * (resize_alignment - 1);
+        return step == 0 ? PTRDIFF_MAX : (memory - loss) / step * strip_.step_bytes / pixel_bytes;
+    }
+    // Calls f(x, columns) for strips of about the same width that fit the memory.
+    template <class F>
+    void for_each_strip(ptrdiff_t width, ptrdiff_t memory, F f) const {
+        const ptrdiff_t most = columns_in(memory);
+        ptrdiff_t columns = width;
+        if (width > most) {
+            const ptrdiff_t strips = (width + most - 1) / most;
+            columns = round_up((width + strips - 1) / strips, strip_.step_bytes);
+            if (columns > most) columns = most;
+        }
+        for (ptrdiff_t at = 0; at < width; at += columns)
+            f(at, width - at < columns ? width - at : columns);
+    }
+
+    // Makes the plan of a strip, which lies in the memory given.
+    resize_strip plan(ptrdiff_t at, ptrdiff_t columns, const source_span &span,
+                      uint8_t *memory) const {
+        resize_strip s = strip_;
+        s.x = int32_t(at);
+        s.columns = int32_t(columns);
+        s.first = int32_t(span.first);
+        s.row_bytes = int32_t(span.columns * pixel_bytes);
+        s.plan = memory;
+        loops.plan(s);
+        return s;
+    }
+
+    // Whole rows, of a plane from which `width` columns are made.
+    source_span whole_rows(ptrdiff_t width) const { return {0, x.extent(width)}; }
+    // What columns at ... at + columns - 1 need of them.
+    source_span part_of_rows(ptrdiff_t at, ptrdiff_t columns) const {
+        const ptrdiff_t first = x.cell(at);
+        return {first, x.next(at + columns - 1) + 1 - first};
+    }
+    // No part of so many columns is larger.
+    ptrdiff_t most_of_rows(ptrdiff_t columns) const {
+        return x.cell(columns - 1) + (columns > 1 ? 2 : 1) * x.tap() + 1;
+    }
+
+  private:
+    static constexpr uint32_t short_step = (5 << 18) / 4;
+
+    static ptrdiff_t round_up(ptrdiff_t n, ptrdiff_t unit) { return (n + unit - 1) / unit * unit; }
+    ptrdiff_t whole(ptrdiff_t columns, ptrdiff_t bytes) const {
+        const ptrdiff_t steps = (columns * pixel_bytes + strip_.step_bytes - 1) / strip_.step_bytes;
+        return round_up(steps * bytes, resize_alignment);
+    }
+
+    resize_strip strip_;
+};
+
+// The lines of a strip, from a source of lines (walk.h) whose rows begin where the plan says.
+template <class Source>
+class resampled_lines {
+  public:
+    // `ring` has ring_bytes(); it may be null where that is 0.
+    resampled_lines(const resampling &r, const resize_strip &strip, Source source, uint8_t *ring)
+        : r_(r),
+          strip_(strip),
+          source_(source),
+          ring_{ring, ring ? ring + r.ring_bytes(strip.columns) / 2 : nullptr} {}
+
+    // Makes lines first ... first + count - 1 of the destination, the first at dst. Calls come in
+    // rising order.
+    void make(ptrdiff_t first, ptrdiff_t count, uint8_t *dst, ptrdiff_t stride) {
+        for (const ptrdiff_t end = first + count; first < end;) {
+            const int made = r_.keeps() ? make_from_kept(first, end, dst, stride)
+                                        : make_from_rows(first, end, dst, stride);
+            first += made;
+            dst += made * stride;
+        }
+    }
+
+  private:
+    // A next line of the same two rows comes along.
+    int make_from_kept(ptrdiff_t line, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
+        const resize_axis &y = r_.y;
+        const ptrdiff_t row = y.cell(line);
+        const bool pair = line + 1 < end && y.cell(line + 1) == row && y.phase(line + 1);
+        const ptrdiff_t below = pair ? y.next(line + 1) : y.next(line);
+        const int b = held(below), a = keep(row, b), c = keep(below, a);
+        const resize_line two[2] = {{ring_[a], ring_[c], y.phase(line)},
+                                    {ring_[a], ring_[c], y.phase(line + 1)}};
+        r_.loops.down(strip_, two, pair ? 2 : 1, dst, stride);
+        return pair ? 2 : 1;
+    }
+    int held(ptrdiff_t row) const { return held_[0] == row ? 0 : held_[1] == row ? 1 : -1; }
+    // Where the row is kept, from now on if it was not; the one at `wanted` stays.
+    int keep(ptrdiff_t row, int wanted) {
+        int at = held(row);
+        if (at >= 0) return at;
+        at = wanted >= 0 ? 1 - wanted : held_[0] <= held_[1] ? 0 : 1;
+        r_.loops.across(strip_, source_.fetch(row), ring_[at], ahead(rows_ahead));
+        held_[at] = row;
+        return at;
+    }
+
+    int make_from_rows(ptrdiff_t line, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
+        const resize_axis &y = r_.y;
+        const int count = line + 1 < end ? 2 : 1;
+        resize_line two[2];
+        for (int k = 0; k < count; k++)
+            two[k] = {source_.fetch(y.cell(line + k)), source_.fetch(y.next(line + k)),
+                      y.phase(line + k)};
+        r_.loops.both(strip_, two, count, dst, stride, ahead(y.cell(2)));
+        return count;
+    }
+
+    // Rows of a plane lie where they can be asked for before they are needed.
+    static constexpr ptrdiff_t rows_ahead = 3;
+    ptrdiff_t ahead(ptrdiff_t rows) const {
+        if constexpr (requires { source_.stride; })
+            return ptrdiff_t(size_t(rows) * size_t(source_.stride));
+        else
+            return 0;
+    }
+
+    const resampling &r_;
+    const resize_strip &strip_;
+    Source source_;
+    uint8_t *ring_[2];
+    ptrdiff_t held_[2] = {-1, -1};
+};
+
+// Spreads `to` samples over `from`. The step is a number of 29 bits, with its sign, and so are
+// positions of 32: within 8192 units, and less than 1024 of them from a sample to the next.
+struct resize_spread {
+    bool fits = false;
+    int32_t step = 0, shift = 0;
+
+    resize_spread(int32_t from, int32_t to) {
+        if (from < 1 || to < 1) return;
+        while (shift < 4 && from / to > 2 << shift) shift++;
+        const int32_t units = (from - 1) >> shift;
+        if (units >= 1 << 13 || units / to >= 1 << 10) return;
+        step = units * (1 << 18) / to;
+        fits = true;
+    }
+    int32_t packed() const { return fits ? step * 8 | shift : 0; }
+};
+
+inline bool is_quarter_turn(int32_t rot) { return rot == SIMGP_ROT_90L || rot == SIMGP_ROT_90R; }
+
+// Whether plane k of src can be resized to that of dst, which a quarter turn then exchanges the sides
+// of.
+inline bool plane_fits(const simgp_img &src, const simgp_img &dst, int k,
+                       int32_t rot = SIMGP_ROT_NONE) {
+    const bool quarter = is_quarter_turn(rot);
+    return resize_spread(src.width[k], quarter ? dst.height[k] : dst.width[k]).fits &&
+           resize_spread(src.height[k], quarter ? dst.width[k] : dst.height[k]).fits;
+}
+
+// Resizes it, by the kernel that turns it as `rot` says.
+inline void resize_plane(simgp_rsz_fn *kernel, const simgp_img &src, const simgp_img &dst, int k,
+                         int32_t rot = SIMGP_ROT_NONE) {
+    int32_t step_x, step_y;
+    simgp_rsz_get_step(src.width[k], src.height[k], dst.width[k], dst.height[k], rot, &step_x,
+                       &step_y);
+    kernel(src.plane[k], src.stride[k], dst.width[k], dst.height[k], dst.stride[k], dst.plane[k],
+           step_x, step_y);
+}
+
+// The arguments of a kernel that resizes a plane.
+struct resize_args {
+    const_lines src;
+    ptrdiff_t width, height;  // of the destination
+    lines dst;
+    int32_t step_x, step_y;
+};
+
+}  // namespace simgp
+
+// Heads the definition of such a kernel, whose body finds the arguments in `args`.
+#define SIMGP_RESIZE_KERNEL(name, ...)                                                          \
+    void name(const void *src_plane, int32_t src_stride, int32_t dst_width, int32_t dst_height, \
+              int32_t dst_stride, void *dst_plane, int32_t step_x, int32_t step_y) {            \
+        const simgp::resize_args args{                                                          \
+            simgp::lines_of(src_plane, src_stride), dst_width, dst_height,                      \
+            simgp::lines_of(dst_plane, dst_stride), step_x,    step_y};                         \
+        __VA_ARGS__;                                                                            \
+    }
+
+#endif

@@ -1,0 +1,17 @@
+# The C code that the README shows is that of the examples, which are compiled and run.
+. "$(dirname "$0")/gate.sh" "$1"
+
+cd "$source_dir" || exit 1
+blocks=$(awk -v to="$scratch/block" '/^```c$/ { n++; inside = 1; next }
+    /^```$/ { inside = 0 }
+    inside { print >(to "." n) }
+    END { print n + 0 }' README.md)
+[ "$blocks" -ge 2 ] || fault "The README shows $blocks pieces of C, which are too few to be found properly."
+for block in "$scratch"/block.*; do
+    code=$(<"$block") found=no
+    for example in examples/*.c; do
+        [[ "$(<"$example")" == *"$code"* ]] && found=yes
+    done
+    [ $found = yes ] || fault "In no example as the README shows it:" "$code"
+done
+finish
