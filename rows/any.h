@@ -75,10 +75,16 @@ constexpr rgb_in rgb_in_of(rgb_packing packing) {
 using chroma_row = void(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
                         uint8_t *v, ptrdiff_t count);
 
-// Takes `count` >= 1 pixels apart into planes of their channels or bytes, three or four, and puts
-// them together. Channels of words are widened by shifting alone, and lose their low bits.
-using split_pixels_row = void(const uint8_t *src, uint8_t *const planes[4], ptrdiff_t count);
-using join_pixels_row = void(const uint8_t *const planes[4], uint8_t *dst, ptrdiff_t count);
+// Takes `count` >= 1 pixels apart into planes of their channels. Those of words are widened by
+// shifting alone.
+using split_pixels_row = void(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count);
+
+// Writes `count` >= 1 pixels in another way: the first channel and the last one may change places.
+// Words lose the low bits of their channels; alpha is carried, or is 255.
+struct repacking {
+    bool exchange, from_alpha_first, to_alpha_first;
+};
+using repack_row = void(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count);
 
 // Takes `pairs` >= 1 pairs of pixels apart, bytes Y U Y V or U Y V Y, and puts them together.
 using split_groups_row = void(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
@@ -87,7 +93,7 @@ using join_groups_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *
                              ptrdiff_t pairs, bool luma_first);
 
 // `count` >= 1 samples from lines a and b: the mean of two, a[x] and b[x]; of two, a[2x] and
-// a[2x + 1]; of four, of both lines. Rounded, halves up. The latter two may work in place.
+// a[2x + 1]; of four, of both lines. Rounded, halves up.
 using mean_row = void(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count);
 
 // `count` >= 1 samples: every second of a, and every sample of a twice (the last may be once).
@@ -98,8 +104,8 @@ struct any_rows {
     any_to_rgb_row_pair *to_rgb_pair[size_t(chroma_in::count)][size_t(pixel_kind::count)];
     any_to_yuv_row *to_yuv[size_t(rgb_in::count)][size_t(chroma_out::count)];
     chroma_row *chroma;
-    split_pixels_row *split_pixels[size_t(pixel_kind::count)];
-    join_pixels_row *join_pixels[size_t(pixel_kind::count)];
+    split_pixels_row *split_pixels[size_t(rgb_in::count)];
+    repack_row *repack[size_t(pixel_kind::count)][size_t(pixel_kind::count)];
     split_groups_row *split_groups;
     join_groups_row *join_groups;
     mean_row *mean_of_lines, *mean_of_pairs, *mean_of_blocks;

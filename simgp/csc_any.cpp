@@ -115,23 +115,29 @@ void chroma(const rgb_weights &w, const uint8_t *const of[3], uint8_t *u, uint8_
     }
 }
 
-template <int Size>
-void split_pixels(const uint8_t *src, uint8_t *const planes[4], ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++)
-        if constexpr (Size == 2) {
-            const channels p = read_channels<rgb_in::words>(src, x);
-            for (int k = 0; k < 3; k++) planes[k][x] = uint8_t(p.c[k]);
-        } else {
-            for (int k = 0; k < Size; k++) planes[k][x] = src[Size * x + k];
-        }
+template <rgb_in In>
+void split_pixels(const uint8_t *src, uint8_t *const of[3], ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) {
+        const channels p = read_channels<In>(src, x);
+        for (int k = 0; k < 3; k++) of[k][x] = uint8_t(p.c[k]);
+    }
 }
-template <int Size>
-void join_pixels(const uint8_t *const planes[4], uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++)
-        if constexpr (Size == 2)
-            write_rgb<rgb_packing::rgb565>(dst, x, {planes[0][x], planes[1][x], planes[2][x]});
-        else
-            for (int k = 0; k < Size; k++) dst[Size * x + k] = planes[k][x];
+
+// Channels stand in the order of memory here: r for the first, b for the last.
+template <pixel_kind From, pixel_kind To>
+void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
+    const yuv_to_rgb how{{}, false, false, order.exchange, order.to_alpha_first};
+    for (ptrdiff_t x = 0; x < count; x++) {
+        const uint8_t *const p = src + size_of(From) * x;
+        const bool skip = From == pixel_kind::four && order.from_alpha_first;
+        const channels c = From == pixel_kind::words
+                               ? read_channels<rgb_in::words>(p, 0)
+                               : channels{{p[skip], p[skip + 1], p[skip + 2]}};
+        uint8_t *const q = dst + size_of(To) * x;
+        write_pixel(To, how, q, {c.c[0], c.c[1], c.c[2]});
+        if (From == pixel_kind::four && To == pixel_kind::four)
+            q[order.to_alpha_first ? 0 : 3] = p[order.from_alpha_first ? 0 : 3];
+    }
 }
 
 void split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
@@ -190,6 +196,14 @@ void fill_from_rgb(any_rows &t) {
     to[size_t(chroma_out::none)] = any_to_yuv<In, chroma_out::none>;
     to[size_t(chroma_out::half)] = any_to_yuv<In, chroma_out::half>;
     to[size_t(chroma_out::pairs)] = any_to_yuv<In, chroma_out::pairs>;
+    t.split_pixels[size_t(In)] = split_pixels<In>;
+}
+template <pixel_kind From>
+void fill_repack(any_rows &t) {
+    repack_row **const to = t.repack[size_t(From)];
+    to[size_t(pixel_kind::words)] = repack<From, pixel_kind::words>;
+    to[size_t(pixel_kind::three)] = repack<From, pixel_kind::three>;
+    to[size_t(pixel_kind::four)] = repack<From, pixel_kind::four>;
 }
 
 }  // namespace
@@ -204,12 +218,9 @@ void fill_any(any_rows &t) {
     fill_from_rgb<rgb_in::four>(t);
     fill_from_rgb<rgb_in::four_alpha_first>(t);
     t.chroma = chroma;
-    t.split_pixels[size_t(pixel_kind::words)] = split_pixels<2>;
-    t.split_pixels[size_t(pixel_kind::three)] = split_pixels<3>;
-    t.split_pixels[size_t(pixel_kind::four)] = split_pixels<4>;
-    t.join_pixels[size_t(pixel_kind::words)] = join_pixels<2>;
-    t.join_pixels[size_t(pixel_kind::three)] = join_pixels<3>;
-    t.join_pixels[size_t(pixel_kind::four)] = join_pixels<4>;
+    fill_repack<pixel_kind::words>(t);
+    fill_repack<pixel_kind::three>(t);
+    fill_repack<pixel_kind::four>(t);
     t.split_groups = split_groups;
     t.join_groups = join_groups;
     t.mean_of_lines = mean_of_lines;
@@ -249,8 +260,17 @@ struct job {
     const any_rows &rows;
     const layout_rows &layout;
 
-    const_lines in(int plane) const { return {src.plane[plane], src.stride[plane]}; }
-    lines out(int plane) const { return {dst.plane[plane], dst.stride[plane]}; }
+    // Lines of pixels advance by whole pixels, but from linear YUV, as in the kernels.
+    const_lines in(int plane) const {
+        return whole_pixel_lines(const_lines{src.plane[plane], src.stride[plane]},
+                                 from.kind == format_kind::rgb ? from.bytes[0] : 1);
+    }
+    lines out(int plane) const {
+        const bool whole = to.kind == format_kind::rgb &&
+                           (from.kind == format_kind::rgb || from.kind == format_kind::tiled);
+        return whole_pixel_lines(lines{dst.plane[plane], dst.stride[plane]},
+                                 whole ? to.bytes[0] : 1);
+    }
 };
 
 // Two rows of a picture (or its last one, or one alone), and of these as many columns as a strip on
@@ -539,22 +559,13 @@ void yuv_to_rgb_pictures(const job &j) {
 // RGB
 // ------------------------------------------------------------------------------------------------
 
-// Planes of the channels of a strip, in the order of memory, and alpha.
+// Planes of the channels of a strip, in the order of memory.
 struct rgb_strip {
-    uint8_t c[4][strip_width];
+    uint8_t c[3][strip_width];
 };
-// The planes in the order of a pixel's bytes.
-template <class Byte>
-struct byte_planes {
-    Byte *of[4];
-};
-byte_planes<uint8_t> planes_of(rgb_strip &s, bool alpha_first) {
-    return alpha_first ? byte_planes<uint8_t>{{s.c[3], s.c[0], s.c[1], s.c[2]}}
-                       : byte_planes<uint8_t>{{s.c[0], s.c[1], s.c[2], s.c[3]}};
-}
 void split_pixels(const job &j, const uint8_t *src, rgb_strip &s, ptrdiff_t width) {
-    j.rows.split_pixels[size_t(kind_of(j.from.packing))](
-        src, planes_of(s, is_alpha_first(j.from.packing)).of, width);
+    uint8_t *const channels[] = {s.c[0], s.c[1], s.c[2]};
+    j.rows.split_pixels[size_t(rgb_in_of(j.from.packing))](src, channels, width);
 }
 
 template <class T>
@@ -575,13 +586,13 @@ rgb_weights in_memory_order(rgb_weights w, rgb_packing packing) {
 // several pixels, of their mean; for every pixel else.
 void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, const uint8_t *b,
                       bool across, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    rgb_strip of_a, of_b;
+    rgb_strip of_a, of_b, means;
     const uint8_t *channels[3];
     split_pixels(j, a, of_a, width);
     if (b) split_pixels(j, b, of_b, width);
     for (int k = 0; k < 3; k++)
         channels[k] =
-            chroma_line(j, false, across, of_a.c[k], b ? of_b.c[k] : nullptr, of_a.c[k], width);
+            chroma_line(j, false, across, of_a.c[k], b ? of_b.c[k] : nullptr, means.c[k], width);
     j.rows.chroma(w, channels, u, v, (width + across) >> across);
 }
 
@@ -619,20 +630,11 @@ void rgb_to_yuv_pictures(const job &j) {
 }
 
 void rgb_to_rgb(const job &j) {
-    const bool exchange = is_blue_first(j.from.packing) != is_blue_first(j.to.packing);
-    const bool has_alpha = kind_of(j.from.packing) == pixel_kind::four;
-    for_each_band(j, strip_width, 1, [&](const band &b) {
-        rgb_strip s;
-        split_pixels(j, j.in(0).line(b.y) + b.x * j.from.bytes[0], s, b.width);
-        if (!has_alpha) memset(s.c[3], 255, size_t(b.width));
-        const uint8_t *const first = s.c[exchange ? 2 : 0], *const last = s.c[exchange ? 0 : 2];
-        const byte_planes<const uint8_t> planes =
-            is_alpha_first(j.to.packing)
-                ? byte_planes<const uint8_t>{{s.c[3], first, s.c[1], last}}
-                : byte_planes<const uint8_t>{{first, s.c[1], last, s.c[3]}};
-        j.rows.join_pixels[size_t(kind_of(j.to.packing))](
-            planes.of, j.out(0).line(b.y) + b.x * j.to.bytes[0], b.width);
-    });
+    const repacking order{is_blue_first(j.from.packing) != is_blue_first(j.to.packing),
+                          is_alpha_first(j.from.packing), is_alpha_first(j.to.packing)};
+    repack_row *const row =
+        j.rows.repack[size_t(kind_of(j.from.packing))][size_t(kind_of(j.to.packing))];
+    for (ptrdiff_t y = 0; y < j.height; y++) row(order, j.in(0).line(y), j.out(0).line(y), j.width);
 }
 
 // Equal formats.

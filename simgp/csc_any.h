@@ -96,9 +96,10 @@ enum {
  * simgp_csc_yuv420_to_t64x32 writes it: (W + 1) / 2 pairs in H / 2 rows, rounded down, also by a
  * copy.
  *
- * Strides may be negative, and odd ones are taken as they are, also of 16-bit and 32-bit pixels. No
- * pointer needs to be aligned. Only the visible samples are read and written. Source
- * and destination must not share memory. Any number of calls may run at once on separate
+ * Strides may be negative. Those of 16-bit and 32-bit RGB are rounded down to whole pixels, toward
+ * minus infinity, but in destinations whose source is linear YUV, where they are taken as they are,
+ * odd ones too. No pointer needs to be aligned. Only the visible samples are read and written.
+ * Source and destination must not share memory. Any number of calls may run at once on separate
  * destinations. */
 SIMGP_API int32_t simgp_csc_any(const simgp_img *src, const simgp_img *dst, int32_t colour);
 
