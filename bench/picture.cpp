@@ -15,6 +15,7 @@ extern "C" {
 }
 
 #include "simgp/csc.h"
+#include "simgp/csc_any.h"
 #include "simgp/formats.h"
 
 namespace bench {

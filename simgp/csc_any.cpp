@@ -496,7 +496,43 @@ void finish_band(const job &j, const band &b, const planar_band &p, const target
     }
 }
 
+// From packed 4:2:2 to the chroma of every second row, straight to its place: to planes, or to pairs
+// U V. Bytes of chroma that are not wanted end in a strip that stays in the cache.
+bool has_way_from_groups(const job &j) {
+    return j.from.kind == format_kind::packed && j.to.kind == format_kind::planar &&
+           (j.to.layout == yuv_layout::uv || j.to.layout == yuv_layout::half) &&
+           sharing_of(j.to).down && !averages(j);
+}
+void groups_to_every_second_row(const job &j) {
+    constexpr ptrdiff_t width = 4 * strip_width;
+    const bool luma_first = j.from.layout == yuv_layout::yuyv, pairs = has_pairs(j.to);
+    for_each_band(j, width, 2, [&](const band &b) {
+        uint8_t unwanted[width];
+        const ptrdiff_t whole = b.width & ~ptrdiff_t(1), line = b.y >> 1;
+        for (ptrdiff_t r = 0; r < b.rows; r++) {
+            const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x, *const last =
+                                                                            src + 2 * whole;
+            uint8_t *const y = j.out(0).line(b.y + r) + b.x;
+            uint8_t *const u = j.out(j.to.u).line(line) + (pairs ? b.x : b.x / 2);
+            uint8_t *const v = pairs ? u + 1 : j.out(j.to.v).line(line) + b.x / 2;
+            if (whole && !r && !pairs) {
+                j.rows.split_groups(src, y, u, v, whole / 2, luma_first);
+            } else if (whole) {
+                uint8_t *const chroma = r ? unwanted : u;
+                j.layout.unpack(src, luma_first ? y : chroma, luma_first ? chroma : y, whole);
+            }
+            if (whole == b.width) continue;
+            y[whole] = last[!luma_first];
+            if (r) continue;
+            const ptrdiff_t at = pairs ? whole : whole / 2;
+            u[at] = last[luma_first];
+            v[at] = b.x + whole ? last[luma_first - 2] : 128;
+        }
+    });
+}
+
 void yuv_to_yuv(const job &j) {
+    if (has_way_from_groups(j)) return groups_to_every_second_row(j);
     const sharing from = sharing_of(j.from), to = sharing_of(j.to);
     for_each_band(j, strip_width, 2, [&](const band &b) {
         yuv_strip read, resampled;
