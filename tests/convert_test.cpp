@@ -50,7 +50,7 @@ class convert_test : public testing::Test {
 
     // The picture of a PNG in the folder.
     picture png(const std::string &name) const {
-        auto source = tools::open_source({at(name), "", ""});
+        auto source = tools::open_source({.path = at(name)});
         picture p;
         source->next(p);
         return p;
@@ -474,7 +474,7 @@ TEST_F(convert_test, dithering_is_the_librarys_own) {
     good("testcard:64x48 -o plain.rgb565");
     good("testcard:64x48 -o dithered.rgb565 --dither");
     EXPECT_NE(read("plain.rgb565"), read("dithered.rgb565"));
-    auto card = tools::open_source({"testcard:64x48", "", ""});
+    auto card = tools::open_source({.path = "testcard:64x48"});
     picture frame, screen({&tools::format_named("rgb565"), 64, 48});
     card->next(frame);
     const simgp_img src = frame.descriptor(), dst = screen.descriptor();

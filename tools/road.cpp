@@ -22,6 +22,7 @@ int step_cost(const pixel_format &from, const pixel_format &to) {
     int cost = 2;
     if (to.is_rgb16() && !from.is_rgb16()) cost += 10;
     if (from.is_rgb() != to.is_rgb()) cost += 2;
+    if (to.chroma() == 0) cost += 20;
     const bool coarser =
         to.chroma_x_shift() > from.chroma_x_shift() || to.chroma_y_shift() > from.chroma_y_shift();
     if (!from.is_rgb() && (coarser || to.chroma() < from.chroma())) cost += 3;
@@ -207,7 +208,9 @@ road::road(const picture_shape &from, const pixel_format &to, bool dither, const
         cost_ = far;
         for (size_t k = 0; k < count; ++k) {
             if (places[last + k].cost >= far || !offered(all[k], to, method::dither)) continue;
-            const int cost = places[last + k].cost + step_cost(all[k], to);
+            // RGB becomes YUV for this alone, so it may as well keep its chroma.
+            const int poorer = from_.format->is_rgb() ? 4 - all[k].chroma() : 0;
+            const int cost = places[last + k].cost + step_cost(all[k], to) + poorer;
             if (cost < cost_) cost_ = cost, end = last + k;
         }
     }

@@ -37,10 +37,10 @@ class source {
 
 // How the user described the input.
 struct source_options {
-    std::string path;    // a file, "-", or "testcard:[WxH][@FRAMES]"
-    std::string format;  // of raw frames and test cards; empty: as the file says
-    std::string size;    // of raw frames
-    std::string colour;  // empty: as the file says, or the usual one
+    std::string path = {};    // a file, "-", or "testcard:[WxH][@FRAMES]"
+    std::string format = {};  // of raw frames and test cards; empty: as the file says
+    std::string size = {};    // of raw frames
+    std::string colour = {};  // empty: as the file says, or the usual one
 };
 
 // Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M or PNG. A colour
