@@ -218,15 +218,15 @@ rig::job make_job(int from, int to, int32_t colour, int w, int h) {
                [=](const rig::picture &src, const rig::picture &dst) {
                    reference(src, dst, from, to, colour);
                }};
-    j.holes = t.tiled;
-    if (!as_ever(from, to, colour)) return j;
-    // The kernels of old leave out chroma at odd sizes, or write a line too many, and some of them
-    // round strides down to whole pixels. Everything else takes odd strides as they are.
+    // Lines of words advance by whole pixels, but for what linear YUV becomes.
     const auto words = [](const rig::format &rgb) {
         return rgb.pixel_bytes == 2 || rgb.pixel_bytes == 4;
     };
     if (words(f)) j.src[0].stride_unit = f.pixel_bytes;
     if (words(t) && (f.is_rgb() || f.tiled)) j.dst[0].stride_unit = t.pixel_bytes;
+    j.holes = t.tiled;
+    if (!as_ever(from, to, colour)) return j;
+    // The kernels of old leave out chroma at odd sizes, or write a line too many.
     j.holes = true;
     if (from == SIMGP_FMT_YUV420 && to == SIMGP_FMT_YUV422N)
         for (size_t k : {1, 2}) j.dst[k] = rig::samples((w + 1) / 2, (h + 1) / 2 * 2);
@@ -308,6 +308,44 @@ TEST(csc_any, tiled_pictures) {
                .max_height = 131,
                .rounds = 2,
                .large = {{1, 65}, {64, 1}, {65, 65}, {130, 65}, {257, 129}, {320, 193}}});
+    });
+}
+
+TEST(csc_any, strides_of_words_are_rounded_down_to_whole_pixels) {
+    constexpr int width = 10, height = 3, middle = 200;
+    const struct {
+        int from, to, sloppy_src, src, sloppy_dst, dst;
+    } cases[] = {
+        {SIMGP_FMT_RGB565, SIMGP_FMT_NV12, 21, 20, 13, 13},
+        {SIMGP_FMT_BGR565, SIMGP_FMT_YUYV, -21, -22, -23, -23},
+        {SIMGP_FMT_BGRA8888, SIMGP_FMT_YUV444, 43, 40, 13, 13},
+        {SIMGP_FMT_ARGB8888, SIMGP_FMT_RGB888, -41, -44, 31, 31},
+        {SIMGP_FMT_RGB888, SIMGP_FMT_RGBA8888, 31, 31, -41, -44},
+        {SIMGP_FMT_BGR565, SIMGP_FMT_BGR565, 23, 22, -23, -24},
+        {SIMGP_FMT_T64X32, SIMGP_FMT_BGRA8888, 1, 2, 42, 40},
+    };
+    rig::rng random(rig::seed());
+    bytes in(8192);
+    rig::fill_bytes(in.data(), in.size(), rig::content::random, random);
+    rig::for_each_target([&](const rig::target_rows &) {
+        for (const auto &c : cases) {
+            const auto run = [&](int src_stride, int dst_stride) {
+                bytes out(6 * middle);
+                simgp_img src = {}, dst = {};
+                src.format = c.from, dst.format = c.to;
+                for (int k = 0; k < 3; k++) {
+                    src.plane[k] = in.data() + (src_stride < 0 ? middle : 0);
+                    dst.plane[k] = out.data() + 2 * middle * k + middle;
+                    src.width[k] = width, src.height[k] = height;
+                    src.stride[k] = src_stride;
+                    dst.stride[k] = k ? width : dst_stride;
+                }
+                EXPECT_EQ(simgp_csc_any(&src, &dst, SIMGP_COLOUR_BT2020), SIMGP_OK);
+                return out;
+            };
+            EXPECT_EQ(run(c.sloppy_src, c.sloppy_dst), run(c.src, c.dst))
+                << name_of(c.from, c.to) << ", " << c.sloppy_src;
+        }
     });
 }
 
