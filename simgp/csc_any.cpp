@@ -670,7 +670,11 @@ void rgb_to_rgb(const job &j) {
                           is_alpha_first(j.from.packing), is_alpha_first(j.to.packing)};
     repack_row *const row =
         j.rows.repack[size_t(kind_of(j.from.packing))][size_t(kind_of(j.to.packing))];
-    for (ptrdiff_t y = 0; y < j.height; y++) row(order, j.in(0).line(y), j.out(0).line(y), j.width);
+    const const_lines in = j.in(0);
+    const lines out = j.out(0);
+    if (in.stride == j.width * j.from.bytes[0] && out.stride == j.width * j.to.bytes[0])
+        return row(order, in.first, out.first, j.width * j.height);
+    for (ptrdiff_t y = 0; y < j.height; y++) row(order, in.line(y), out.line(y), j.width);
 }
 
 // Equal formats.

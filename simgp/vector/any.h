@@ -437,6 +437,15 @@ static void repack_four(const repacking &order, const uint8_t *src, uint8_t *dst
                             : repack_pixels<rgb_in::four, To>)(order, src, dst, count);
 }
 
+// The first byte of each byte's pixel, from the start of the block.
+struct first_byte {
+    alignas(64) uint8_t lane[bytes];
+    constexpr first_byte() : lane() {
+        for (int i = 0; i < bytes; i++) lane[i] = static_cast<uint8_t>(i % 16 / 4 * 4);
+    }
+};
+static constexpr first_byte first_byte_of_pixel;
+
 // Four bytes to four: each stays in its pixel.
 static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *dst,
                          ptrdiff_t count) {
@@ -446,9 +455,9 @@ static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *ds
     from[at ? 0 : 3] = skip ? 0 : 3;
     for (int k = 0; k < 3; k++)
         from[at + k] = static_cast<uint8_t>(skip + (order.exchange ? 2 - k : k));
-    uint8_t places[bytes];
-    for (int i = 0; i < bytes; i++) places[i] = static_cast<uint8_t>(i / 4 % 4 * 4 + from[i % 4]);
-    const u8v index = load(places);
+    const u8v index = add_u8(set_u32(uint32_t(from[0]) | uint32_t(from[1]) << 8 |
+                                     uint32_t(from[2]) << 16 | uint32_t(from[3]) << 24),
+                             load(first_byte_of_pixel.lane));
     if (count < bytes / 4) {
         for (ptrdiff_t x = 0; x < count; x++)
             for (int k = 0; k < 4; k++) dst[4 * x + k] = src[4 * x + from[k]];
