@@ -329,9 +329,9 @@ int run(int argc, char **argv) {
     std::vector<comparison> all;
     for (const auto area :
          {yuv2rgb_comparisons, packed2rgb_comparisons, rgb2yuv_comparisons, layout_comparisons,
-          copy_comparisons, tile_comparisons, dither_comparisons, deblock_comparisons,
-          rotate_comparisons, resize_comparisons, resize_rot_comparisons, resize_csc_comparisons,
-          irsz_comparisons, scmn_comparisons})
+          copy_comparisons, csc_any_comparisons, tile_comparisons, dither_comparisons,
+          deblock_comparisons, rotate_comparisons, resize_comparisons, resize_rot_comparisons,
+          resize_csc_comparisons, irsz_comparisons, scmn_comparisons})
         for (comparison &c : area()) all.push_back(std::move(c));
     for (const comparison &c : all) {
         for (const std::string &size : sizes.empty() ? c.sizes : sizes_like(c.sizes, sizes)) {

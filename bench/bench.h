@@ -80,6 +80,7 @@ std::vector<comparison> packed2rgb_comparisons();
 std::vector<comparison> rgb2yuv_comparisons();
 std::vector<comparison> layout_comparisons();
 std::vector<comparison> copy_comparisons();
+std::vector<comparison> csc_any_comparisons();
 std::vector<comparison> resize_comparisons();
 std::vector<comparison> tile_comparisons();
 std::vector<comparison> dither_comparisons();

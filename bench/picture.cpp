@@ -15,6 +15,7 @@ extern "C" {
 }
 
 #include "simgp/csc.h"
+#include "simgp/csc_any.h"
 #include "simgp/formats.h"
 
 namespace bench {
@@ -267,7 +268,7 @@ peer libyuv_peer(operation first, int between, operation second) {
             }};
 }
 
-std::vector<peer> swscale_peer(int from, int to, int extra_flags, resizing how) {
+std::vector<peer> swscale_peer(int from, int to, int extra_flags, resizing how, int32_t colour) {
     av_log_set_level(AV_LOG_ERROR);
     const AVPixelFormat a = swscale_format(from), b = swscale_format(to);
     if (a == b && how == resizing::none) return {};
@@ -284,6 +285,10 @@ std::vector<peer> swscale_peer(int from, int to, int extra_flags, resizing how) 
                                flags | extra_flags, nullptr, nullptr, nullptr),
                 sws_freeContext);
             if (!context) continue;
+            if (colour == SIMGP_COLOUR_BT709) {
+                const int *const table = sws_getCoefficients(SWS_CS_ITU709);
+                sws_setColorspaceDetails(context.get(), table, 0, table, 0, 0, 1 << 16, 1 << 16);
+            }
             const operation convert = [=](const simgp_img &s, const simgp_img &d) {
                 const uint8_t *from_planes[4] = {s.plane[0], s.plane[1 + swap_src],
                                                  s.plane[2 - swap_src], nullptr};
@@ -337,13 +342,13 @@ arena make_arena(const conversion &c, int from_format, const size &from, const s
 }  // namespace
 
 comparison compare(conversion c) {
-    if (c.name.empty()) c.name = name_of(c.from) + "_to_" + name_of(c.to);
+    if (c.name.empty()) c.name = c.name_prefix + name_of(c.from) + "_to_" + name_of(c.to);
     if (!c.ours)
         c.ours = [name = c.name](const simgp_img &s, const simgp_img &d) {
             if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
         };
     if (c.against_swscale)
-        for (peer &p : swscale_peer(c.from, c.to, 0, c.how)) c.peers.push_back(std::move(p));
+        for (peer &p : swscale_peer(c.from, c.to, 0, c.how, c.colour)) c.peers.push_back(std::move(p));
     if (c.sizes.empty()) c.sizes = {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"};
 
     const auto make = [c](const std::string &name) {

@@ -75,8 +75,8 @@ enum class resizing { none, drops_or_repeats, interpolates };
 
 // swscale, with whichever of its fast modes takes least time (that do no less than ours). Nothing
 // where it does not know the formats, or has nothing to do.
-std::vector<peer> swscale_peer(int from, int to, int extra_flags = 0,
-                               resizing how = resizing::none);
+std::vector<peer> swscale_peer(int from, int to, int extra_flags = 0, resizing how = resizing::none,
+                               int32_t colour = 0);
 
 struct size {
     int width, height;
@@ -89,6 +89,8 @@ struct conversion {
     std::vector<peer> peers = {};  // besides swscale, if that is asked for
     std::string name = {};         // of itself "nv12_to_rgb565"
     operation ours = {};           // of itself simgp_csc
+    std::string name_prefix = {};  // before the name that it has of itself
+    int32_t colour = 0;            // SIMGP_COLOUR_*, for swscale
     double tolerance = 4;          // for peers, see expect_alike; 0: they are not held against ours
     double part_read = 1;          // of the source's bytes
     int twin_from = -1;            // the conversion from this format is to be no faster than 0.9

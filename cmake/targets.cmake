@@ -37,6 +37,7 @@ message(STATUS "simgp: vector rows for: ${SIMGP_TARGETS}")
 set(SIMGP_AREAS
   scmn/keyframe
   scmn/mem
+  simgp/any
   simgp/deblock
   simgp/dither
   simgp/layout

@@ -3,6 +3,7 @@
 #ifndef ROWS_TABLE_H
 #define ROWS_TABLE_H
 
+#include "rows/any.h"
 #include "rows/deblock.h"
 #include "rows/dither.h"
 #include "rows/keyframe.h"
@@ -18,6 +19,7 @@ namespace simgp {
 
 // A member for each area of the build's list (cmake/targets.cmake), under the area's name.
 struct row_table {
+    any_rows any;
     deblock_rows deblock;
     dither_rows dither;
     keyframe_rows keyframe;

@@ -117,9 +117,17 @@ inline u16v shr_pairs(u16v a) {
 inline s16v add(s16v a, s16v b) { return _mm512_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm512_adds_epi16(a, b); }
 inline s16v sub(s16v a, s16v b) { return _mm512_sub_epi16(a, b); }
+inline s16v sub_sat(s16v a, s16v b) { return _mm512_subs_epi16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return _mm512_min_epi16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return _mm512_max_epi16(a, b); }
 inline u16v mul(u16v a, u16v b) { return _mm512_mullo_epi16(a, b); }
+inline u16v avg_u16(u16v a, u16v b) { return _mm512_avg_epu16(a, b); }
+// k v / 2 = (256 v)(128 k) >> 16.
+using half_factor = __m512i;
+inline half_factor set_half_factor(int k) { return set_u16(static_cast<uint16_t>(128 * k)); }
+inline u16v half_product(u16v v, half_factor k) {
+    return _mm512_mulhi_epu16(_mm512_slli_epi16(v, 8), k);
+}
 inline s16v mul_round(s16v a, s16v b) { return _mm512_mulhrs_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm512_adds_epu8(a, b); }
@@ -396,37 +404,46 @@ inline rgb_v load_565(const uint8_t *p) {
 
 // Where the bytes of 16 pixels go, the first of which is at place First of a vector: a block each
 // for words ac of the even and of the odd pixels and for words b.
-template <int First>
+template <int First, int Size = 3>
 struct channel_order {
     alignas(64) uint8_t lane[64];
     constexpr channel_order() : lane() {
         for (int i = 0; i < 16; i++) {
-            const int pixel = First + 3 * i, word = 16 * (i & 1) + (i & ~1);
+            const int pixel = First + Size * i, word = 16 * (i & 1) + (i & ~1);
             lane[word] = static_cast<uint8_t>(pixel);
             lane[word + 1] = static_cast<uint8_t>(pixel + 2);
             lane[word + 32] = static_cast<uint8_t>(pixel + 1);
         }
     }
 };
-template <int First>
-inline constexpr channel_order<First> channels;
+template <int First, int Size = 3>
+inline constexpr channel_order<First, Size> channels;
 
-// Four times 16 pixels, transposed in blocks. Every load takes 64 bytes; the last begins early, to
-// end with the pixels.
-inline rgb_v load_888(const uint8_t *p) {
+// Sixteen pixels of a vector.
+inline __m512i order_channels(const uint8_t *order, const uint8_t *p) {
     constexpr __mmask64 channels_only = 0x55555555FFFFFFFF;  // zeros the high bytes of words b
-    const auto sixteen = [&](ptrdiff_t at, const uint8_t *order) {
-        return _mm512_maskz_permutexvar_epi8(channels_only, load(order), load(p + at));
-    };
-    const uint8_t *order = channels<0>.lane, *last_order = channels<16>.lane;
-    const __m512i v0 = sixteen(0, order), v1 = sixteen(48, order), v2 = sixteen(96, order);
-    const __m512i v3 = sixteen(128, last_order);
+    return _mm512_maskz_permutexvar_epi8(channels_only, load(order), load(p));
+}
+// Four times 16 pixels, transposed in blocks.
+inline rgb_v transpose_channels(__m512i v0, __m512i v1, __m512i v2, __m512i v3) {
     const __m512i ac01 = _mm512_shuffle_i32x4(v0, v1, 0x44),
                   ac23 = _mm512_shuffle_i32x4(v2, v3, 0x44);
     const __m512i b01 = _mm512_shuffle_i32x4(v0, v1, 0xEE),
                   b23 = _mm512_shuffle_i32x4(v2, v3, 0xEE);
     return {_mm512_shuffle_i32x4(ac01, ac23, 0x88), _mm512_shuffle_i32x4(b01, b23, 0x88),
             _mm512_shuffle_i32x4(ac01, ac23, 0xDD), _mm512_shuffle_i32x4(b01, b23, 0xDD)};
+}
+// Every load takes 64 bytes; the last begins early, to end with the pixels.
+inline rgb_v load_888(const uint8_t *p) {
+    const uint8_t *order = channels<0>.lane, *last_order = channels<16>.lane;
+    return transpose_channels(order_channels(order, p), order_channels(order, p + 48),
+                              order_channels(order, p + 96), order_channels(last_order, p + 128));
+}
+template <int First>
+inline rgb_v load_8888(const uint8_t *p) {
+    const uint8_t *order = channels<First, 4>.lane;
+    return transpose_channels(order_channels(order, p), order_channels(order, p + 64),
+                              order_channels(order, p + 128), order_channels(order, p + 192));
 }
 
 // The pair of products fits 16 bits; the sum with the third wraps.
@@ -446,6 +463,30 @@ template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
     static_assert(limits::channel_factors<A, B, C>);
     return _mm512_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
+}
+
+// The same with factors that are known at run time.
+struct channel_factors {
+    __m512i ac, b;
+};
+inline channel_factors set_channel_factors(int a, int b, int c) {
+    return {set_pair(static_cast<uint8_t>(a), static_cast<uint8_t>(c)),
+            set_u16(static_cast<uint16_t>(b))};
+}
+inline __m512i dot(__m512i ac, __m512i b, const channel_factors &f) {
+    return _mm512_add_epi16(_mm512_maddubs_epi16(ac, f.ac), _mm512_mullo_epi16(b, f.b));
+}
+inline u8v dot_high(rgb_v v, const channel_factors &f) {
+    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
+}
+inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
+
+struct channels_v {
+    u8v c[3];
+};
+inline channels_v channels_of(rgb_v v) {
+    return {join(even(v.ac_even), v.ac_odd), join(v.b_even, v.b_odd),
+            join_high(v.ac_even, v.ac_odd)};
 }
 
 // Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels

@@ -178,7 +178,7 @@ inline u16v shr_pairs(u16v a) {
     return make<u16v>([&](int i) { return a.lane[i] >> (i & 1 ? N : M); });
 }
 
-// Signed 16-bit sums and differences, wrapping, and sums, saturating.
+// Signed 16-bit sums and differences, wrapping, and saturating.
 inline s16v add(s16v a, s16v b) {
     return make<s16v>([&](int i) { return int16_t(a.lane[i] + b.lane[i]); });
 }
@@ -187,6 +187,9 @@ inline s16v sub(s16v a, s16v b) {
 }
 inline s16v add_sat(s16v a, s16v b) {
     return make<s16v>([&](int i) { return clamp_to(-32768, 32767, a.lane[i] + b.lane[i]); });
+}
+inline s16v sub_sat(s16v a, s16v b) {
+    return make<s16v>([&](int i) { return clamp_to(-32768, 32767, a.lane[i] - b.lane[i]); });
 }
 // The smaller and the larger of signed lanes.
 inline s16v min_s16(s16v a, s16v b) {
@@ -202,6 +205,19 @@ inline u16v mul(u16v a, u16v b) {
 // Products of signed lanes as fractions of 2^15, rounded: (a b + 2^14) >> 15. Not both may be -32768.
 inline s16v mul_round(s16v a, s16v b) {
     return make<s16v>([&](int i) { return (a.lane[i] * b.lane[i] + (1 << 14)) >> 15; });
+}
+
+// The mean of unsigned lanes, rounded up.
+inline u16v avg_u16(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return (a.lane[i] + b.lane[i] + 1) >> 1; });
+}
+// floor(k v / 2), with a factor that is known at run time; k is 0 ... 511, lanes are 0 ... 255.
+struct half_factor {
+    int k;
+};
+inline half_factor set_half_factor(int k) { return {k}; }
+inline u16v half_product(u16v v, half_factor k) {
+    return make<u16v>([&](int i) { return k.k * v.lane[i] >> 1; });
 }
 
 // Sums and differences of bytes, saturating.
@@ -495,6 +511,20 @@ inline rgb_v load_888(const uint8_t *p) {
     return {channel(0), channel(1), channel(2)};
 }
 
+// The same of pixels of four bytes, of which byte First, 0 or 1, is the first channel.
+template <int First>
+inline rgb_v load_8888(const uint8_t *p) {
+    const auto channel = [&](int k) {
+        return make<u8v>([&](int i) { return p[4 * i + First + k]; });
+    };
+    return {channel(0), channel(1), channel(2)};
+}
+// The channels in natural order.
+struct channels_v {
+    u8v c[3];
+};
+inline channels_v channels_of(rgb_v v) { return {{v.c[0], v.c[1], v.c[2]}}; }
+
 // ((A c0 + B c1 + C c2) >> 8) + D of each pixel, kept to 8 bits. A, B, C >= 0, their sum is at
 // most 256, A + C <= 127, and B <= 255.
 template <int A, int B, int C, int D>
@@ -511,6 +541,23 @@ inline u16v even_dot(rgb_v v) {
     static_assert(limits::channel_factors<A, B, C>);
     return make<u16v>([&](int i) {
         return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
+    });
+}
+// Factors that are known at run time, in the limits of the other two, of which these are the same
+// without D: (a c0 + b c1 + c c2) >> 8 of each pixel, for factors of 0 or more, and the sum of the
+// even pixels.
+struct channel_factors {
+    int a, b, c;
+};
+inline channel_factors set_channel_factors(int a, int b, int c) { return {a, b, c}; }
+inline u8v dot_high(rgb_v v, const channel_factors &f) {
+    return make<u8v>([&](int i) {
+        return (f.a * v.c[0].lane[i] + f.b * v.c[1].lane[i] + f.c * v.c[2].lane[i]) >> 8;
+    });
+}
+inline s16v even_dot(rgb_v v, const channel_factors &f) {
+    return make<s16v>([&](int i) {
+        return f.a * v.c[0].lane[2 * i] + f.b * v.c[1].lane[2 * i] + f.c * v.c[2].lane[2 * i];
     });
 }
 // `bytes` pixels of 3 or 4 bytes at q become words of 5, 6 and 5 bits at p, the first channel in

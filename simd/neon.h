@@ -83,9 +83,20 @@ inline u16v shr_pairs(u16v a) {
 inline s16v add(s16v a, s16v b) { return vaddq_s16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return vqaddq_s16(a, b); }
 inline s16v sub(s16v a, s16v b) { return vsubq_s16(a, b); }
+inline s16v sub_sat(s16v a, s16v b) { return vqsubq_s16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
 inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
+inline u16v avg_u16(u16v a, u16v b) { return vrhaddq_u16(a, b); }
+struct half_factor {
+    u16v half, odd;  // of an odd factor the bits of v
+};
+inline half_factor set_half_factor(int k) {
+    return {vdupq_n_u16(static_cast<uint16_t>(k >> 1)), vdupq_n_u16(k & 1 ? 255 : 0)};
+}
+inline u16v half_product(u16v v, half_factor k) {
+    return vsraq_n_u16(vmulq_u16(v, k.half), vandq_u16(v, k.odd), 1);
+}
 inline s16v mul_round(s16v a, s16v b) { return vqrdmulhq_s16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
@@ -299,6 +310,11 @@ inline rgb_v load_565(const uint8_t *p) {
         {vandq_u8(high, vdupq_n_u8(0xF8)), vandq_u8(mid, vdupq_n_u8(0xFC)), vshlq_n_u8(low, 3)}};
 }
 inline rgb_v load_888(const uint8_t *p) { return vld3q_u8(p); }
+template <int First>
+inline rgb_v load_8888(const uint8_t *p) {
+    const uint8x16x4_t v = vld4q_u8(p);
+    return {{v.val[First], v.val[First + 1], v.val[First + 2]}};
+}
 
 template <int K>
 inline u16v add_product(u16v sum, uint8x8_t x) {
@@ -327,6 +343,35 @@ inline u16v even_dot(rgb_v v) {
     sum = add_product<B>(sum, evens(v.val[1]));
     return add_product<C>(sum, evens(v.val[2]));
 }
+// The same with factors that are known at run time.
+struct channel_factors {
+    int16_t a, b, c;
+};
+inline channel_factors set_channel_factors(int a, int b, int c) {
+    return {static_cast<int16_t>(a), static_cast<int16_t>(b), static_cast<int16_t>(c)};
+}
+inline u8v dot_high(rgb_v v, const channel_factors &f) {
+    const uint8x8_t a = vdup_n_u8(static_cast<uint8_t>(f.a)),
+                    b = vdup_n_u8(static_cast<uint8_t>(f.b)),
+                    c = vdup_n_u8(static_cast<uint8_t>(f.c));
+    const auto half = [&](uint8x8_t c0, uint8x8_t c1, uint8x8_t c2) {
+        return vshrn_n_u16(vmlal_u8(vmlal_u8(vmull_u8(c0, a), c1, b), c2, c), 8);
+    };
+    return vcombine_u8(
+        half(vget_low_u8(v.val[0]), vget_low_u8(v.val[1]), vget_low_u8(v.val[2])),
+        half(vget_high_u8(v.val[0]), vget_high_u8(v.val[1]), vget_high_u8(v.val[2])));
+}
+inline s16v even_dot(rgb_v v, const channel_factors &f) {
+    s16v sum = vmulq_n_s16(as_s16(even(v.val[0])), f.a);
+    sum = vmlaq_n_s16(sum, as_s16(even(v.val[1])), f.b);
+    return vmlaq_n_s16(sum, as_s16(even(v.val[2])), f.c);
+}
+
+struct channels_v {
+    u8v c[3];
+};
+inline channels_v channels_of(rgb_v v) { return {{v.val[0], v.val[1], v.val[2]}}; }
+
 inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
     const u8v low = vsriq_n_u8(vshlq_n_u8(b, 3), c, 3);
     const uint8x16x2_t v = {{low, vsriq_n_u8(a, b, 5)}};

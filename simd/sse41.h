@@ -83,9 +83,15 @@ inline u16v shr_pairs(u16v a) {
 inline s16v add(s16v a, s16v b) { return _mm_add_epi16(a, b); }
 inline s16v add_sat(s16v a, s16v b) { return _mm_adds_epi16(a, b); }
 inline s16v sub(s16v a, s16v b) { return _mm_sub_epi16(a, b); }
+inline s16v sub_sat(s16v a, s16v b) { return _mm_subs_epi16(a, b); }
 inline s16v min_s16(s16v a, s16v b) { return _mm_min_epi16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return _mm_max_epi16(a, b); }
 inline u16v mul(u16v a, u16v b) { return _mm_mullo_epi16(a, b); }
+inline u16v avg_u16(u16v a, u16v b) { return _mm_avg_epu16(a, b); }
+// k v / 2 = (256 v)(128 k) >> 16.
+using half_factor = __m128i;
+inline half_factor set_half_factor(int k) { return set_u16(static_cast<uint16_t>(128 * k)); }
+inline u16v half_product(u16v v, half_factor k) { return _mm_mulhi_epu16(_mm_slli_epi16(v, 8), k); }
 inline s16v mul_round(s16v a, s16v b) { return _mm_mulhrs_epi16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return _mm_adds_epu8(a, b); }
@@ -327,26 +333,35 @@ inline rgb_v load_565(const uint8_t *p) {
 
 // Puts the bytes of four pixels, the first of which is at place `first` of a block, in order: words
 // ac of pixels 0 and 2, of 1 and 3, words b likewise.
-inline __m128i channel_order(int first) {
+inline __m128i channel_order(int first, int size = 3) {
     const auto at = [=](int pixel, int channel) {
-        return static_cast<char>(first + 3 * pixel + channel);
+        return static_cast<char>(first + size * pixel + channel);
     };
     return _mm_setr_epi8(at(0, 0), at(0, 2), at(2, 0), at(2, 2), at(1, 0), at(1, 2), at(3, 0),
                          at(3, 2), at(0, 1), -1, at(2, 1), -1, at(1, 1), -1, at(3, 1), -1);
 }
-// Four times four pixels, transposed in units of two words. Every load takes 16 bytes; the last
-// begins early, to end with the pixels.
+// Four times four pixels, transposed in units of two words.
+inline rgb_v transpose_channels(__m128i v0, __m128i v1, __m128i v2, __m128i v3) {
+    const __m128i ac01 = _mm_unpacklo_epi32(v0, v1), ac23 = _mm_unpacklo_epi32(v2, v3);
+    const __m128i b01 = _mm_unpackhi_epi32(v0, v1), b23 = _mm_unpackhi_epi32(v2, v3);
+    return {_mm_unpacklo_epi64(ac01, ac23), _mm_unpacklo_epi64(b01, b23),
+            _mm_unpackhi_epi64(ac01, ac23), _mm_unpackhi_epi64(b01, b23)};
+}
+// Every load takes 16 bytes; the last begins early, to end with the pixels.
 inline rgb_v load_888(const uint8_t *p) {
     const auto four = [&](ptrdiff_t at, __m128i order) {
         return _mm_shuffle_epi8(load(p + at), order);
     };
     const __m128i order = channel_order(0);
-    const __m128i v0 = four(0, order), v1 = four(12, order), v2 = four(24, order);
-    const __m128i v3 = four(32, channel_order(4));
-    const __m128i ac01 = _mm_unpacklo_epi32(v0, v1), ac23 = _mm_unpacklo_epi32(v2, v3);
-    const __m128i b01 = _mm_unpackhi_epi32(v0, v1), b23 = _mm_unpackhi_epi32(v2, v3);
-    return {_mm_unpacklo_epi64(ac01, ac23), _mm_unpacklo_epi64(b01, b23),
-            _mm_unpackhi_epi64(ac01, ac23), _mm_unpackhi_epi64(b01, b23)};
+    return transpose_channels(four(0, order), four(12, order), four(24, order),
+                              four(32, channel_order(4)));
+}
+template <int First>
+inline rgb_v load_8888(const uint8_t *p) {
+    const auto four = [&](ptrdiff_t at) {
+        return _mm_shuffle_epi8(load(p + at), channel_order(First, 4));
+    };
+    return transpose_channels(four(0), four(16), four(32), four(48));
 }
 
 // The pair of products fits 16 bits; the sum with the third wraps.
@@ -366,6 +381,30 @@ template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
     static_assert(limits::channel_factors<A, B, C>);
     return _mm_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
+}
+
+// The same with factors that are known at run time.
+struct channel_factors {
+    __m128i ac, b;
+};
+inline channel_factors set_channel_factors(int a, int b, int c) {
+    return {set_pair(static_cast<uint8_t>(a), static_cast<uint8_t>(c)),
+            set_u16(static_cast<uint16_t>(b))};
+}
+inline __m128i dot(__m128i ac, __m128i b, const channel_factors &f) {
+    return _mm_add_epi16(_mm_maddubs_epi16(ac, f.ac), _mm_mullo_epi16(b, f.b));
+}
+inline u8v dot_high(rgb_v v, const channel_factors &f) {
+    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
+}
+inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
+
+struct channels_v {
+    u8v c[3];
+};
+inline channels_v channels_of(rgb_v v) {
+    return {join(even(v.ac_even), v.ac_odd), join(v.b_even, v.b_odd),
+            join_high(v.ac_even, v.ac_odd)};
 }
 
 // Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels

@@ -44,6 +44,7 @@
 
 #include "simgp/copy.h"
 #include "simgp/csc.h"
+#include "simgp/csc_any.h"
 #include "simgp/csc_rot.h"
 #include "simgp/deblock.h"
 #include "simgp/dither.h"

@@ -10,6 +10,7 @@
 #include <string>
 
 #include "tests/program.h"
+#include "tools/colour.h"
 #include "tools/picture.h"
 #include "tools/source.h"
 
@@ -49,7 +50,7 @@ class convert_test : public testing::Test {
 
     // The picture of a PNG in the folder.
     picture png(const std::string &name) const {
-        auto source = tools::open_source({at(name), "", ""});
+        auto source = tools::open_source({.path = at(name)});
         picture p;
         source->next(p);
         return p;
@@ -108,14 +109,13 @@ void expect_bars(const picture &p, int tolerance, bool grey, const std::string &
 
 // Every format goes out to a raw file and comes back from it with the right colours, at sizes that
 // are odd and not multiples of a tile: a wrong plane order, offset, stride or channel shows.
-// Grey shows its luma as it is, so that black is 16 there and white 235.
 TEST_F(convert_test, raw_files_of_every_yuv_format_keep_the_bars) {
     for (const pixel_format *format : formats(false))
         for (const char *size : {"128x64", "97x51"}) {
             const std::string name(format->name), file = name + size + "." + name;
             good(std::string("testcard:") + size + "@3 --format " + name + " -o " + file);
             good(file + " --size " + size + " -q -n 1 -o " + file + ".png");
-            expect_bars(png(file + ".png"), name == "yuv400" ? 20 : 9, name == "yuv400", file);
+            expect_bars(png(file + ".png"), 9, name == "yuv400", file);
             // Nothing to convert: the same bytes again, all three frames of them.
             good(file + " --size " + size + " -o again." + name);
             EXPECT_EQ(read(file), read("again." + name)) << file;
@@ -171,18 +171,17 @@ TEST_F(convert_test, pictures_go_into_every_yuv_format_and_come_back) {
         write("soft.rgb888", bytes);
         good("soft.rgb888 --size " + size + " -o soft.png");
         ASSERT_EQ(difference(png("soft.png"), soft), 0);
-        for (const pixel_format *format : formats(false)) {
-            const std::string name(format->name);
-            good("soft.png -o soft." + name);
-            good("soft." + name + " --size " + size + " -q -o back.png");
-            if (name == "yuv400") continue;
-            // Rounding of both matrices, and the slope of the picture within a chroma block; formats
-            // that reach the screen in 16 bits only lose up to 8 more.
-            const bool in_16_bits = name == "yuv444" || name == "yuv422w";
-            std::string where;
-            const int apart = difference(png("back.png"), soft, &where);
-            EXPECT_LE(apart, in_16_bits ? 14 : 7) << name << " at " << where;
-        }
+        for (const pixel_format *format : formats(false))
+            for (const std::string how : {"", " --chroma mean", " --colour bt709-full"}) {
+                const std::string name(format->name);
+                good("soft.png -o soft." + name + how);
+                good("soft." + name + " --size " + size + " -q -o back.png" + how);
+                if (name == "yuv400") continue;
+                // Rounding of both matrices, and the slope of the picture within a chroma block.
+                std::string where;
+                const int apart = difference(png("back.png"), soft, &where);
+                EXPECT_LE(apart, 7) << name << how << " at " << where;
+            }
     }
 }
 
@@ -311,7 +310,7 @@ TEST_F(convert_test, resized_pictures_keep_the_bars) {
             good("testcard:192x144 --format " + name + " -q -o out.png --resize " + size);
             const picture p = png("out.png");
             EXPECT_EQ(std::to_string(p.width()) + "x" + std::to_string(p.height()), size);
-            expect_bars(p, name == "yuv400" ? 20 : 9, name == "yuv400", name + " " + size);
+            expect_bars(p, 9, name == "yuv400", name + " " + size);
         }
 }
 
@@ -421,11 +420,61 @@ TEST_F(convert_test, headers_of_edited_video_are_right) {
     EXPECT_EQ(header("--thumbnail"), "YUV4MPEG2 W1 H2 F25:1 I? A3:4 C444");
 }
 
+// In every colour the card is drawn, written, read and shown as what it is, and as nothing else.
+TEST_F(convert_test, colours_are_named_noted_and_guessed) {
+    for (const tools::colour &c : tools::colours()) {
+        const std::string name(c.name), as_it_is = " --colour " + name;
+        good("testcard:96x64 -f nv12 -o card.nv12" + as_it_is);
+        good("card.nv12 --size 96x64 -o card.png" + as_it_is);
+        expect_bars(png("card.png"), 3, false, name);
+        good("testcard:96x64 -o card.y4m" + as_it_is);
+        std::string matrix(c.matrix);
+        for (char &letter : matrix) letter = char(toupper(letter));
+        const std::string tags = std::string(" XCOLORRANGE=") + (c.full ? "FULL" : "LIMITED") +
+                                 " XCOLORMATRIX=" + matrix + "\n";
+        EXPECT_NE(read("card.y4m").find(tags), std::string::npos) << tags;
+        good("card.y4m -o noted.png -v");
+        EXPECT_NE(got.err.find("96x64, " + name + "\n"), std::string::npos) << got.err;
+        EXPECT_EQ(difference(png("noted.png"), png("card.png")), 0) << name;
+        good("card.y4m -o wrong.png --colour " + std::string(name == "bt709" ? "bt601" : "bt709"));
+        EXPECT_GT(difference(png("wrong.png"), png("card.png")), 10) << name;
+        good("card.y4m -o dithered.png --to rgb565 --dither");
+        expect_bars(png("dithered.png"), 16, false, name + ", dithered");
+    }
+    // The range alone, as ffmpeg writes it; HD says nothing and is BT.709, which smaller pictures
+    // then have to say.
+    write("range.y4m", "YUV4MPEG2 W2 H1 C444 XCOLORRANGE=FULL\nFRAME\n" +
+                           std::string("\x4c\x4c\x55\x55\xff\xff", 6));
+    good("range.y4m -o range.rgb888");
+    EXPECT_EQ(read("range.rgb888"), std::string("\xfe\0\0\xfe\0\0", 6));
+    good("testcard:1280x64 -f nv12 -o hd.nv12");
+    good("hd.nv12 --size 1280x64 -o hd.png");
+    expect_bars(png("hd.png"), 3, false, "HD");
+    good("hd.nv12 --size 1280x64 -o hd.y4m");
+    EXPECT_EQ(read("hd.y4m").find("XCOLOR"), std::string::npos);
+    good("hd.y4m -o small.y4m --resize 320x16");
+    EXPECT_NE(read("small.y4m").find(" XCOLORMATRIX=BT709\n"), std::string::npos);
+}
+
+TEST_F(convert_test, chroma_is_that_of_the_first_pixel_or_the_mean) {
+    // R, G, B of four pixels: the means are 64, 1, 255.
+    write("four.rgb888", std::string("\xff\0\xff"
+                                     "\0\0\xff"
+                                     "\0\1\xff"
+                                     "\0\1\xff",
+                                     12));
+    const std::string four = "four.rgb888 --size 2x2 -o out.yuv420 --colour bt601-full --chroma ";
+    good(four + "mean");
+    EXPECT_EQ(read("out.yuv420"), "\x69\x1c\x1d\x1d\xf4\x8b");
+    good(four + "first");
+    EXPECT_EQ(read("out.yuv420").substr(0, 5), "\x69\x1c\x1d\x1d\xd5");  // 255, 0, 255 alone
+}
+
 TEST_F(convert_test, dithering_is_the_librarys_own) {
     good("testcard:64x48 -o plain.rgb565");
     good("testcard:64x48 -o dithered.rgb565 --dither");
     EXPECT_NE(read("plain.rgb565"), read("dithered.rgb565"));
-    auto card = tools::open_source({"testcard:64x48", "", ""});
+    auto card = tools::open_source({.path = "testcard:64x48"});
     picture frame, screen({&tools::format_named("rgb565"), 64, 48});
     card->next(frame);
     const simgp_img src = frame.descriptor(), dst = screen.descriptor();
@@ -464,6 +513,7 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
     header("deep.y4m", "W4 H4 C420p10");
     header("tag.y4m", "W4 H4 Z7");
     header("colour.y4m", "W4 H4 C411");
+    header("matrix.y4m", "W4 H4 XCOLORMATRIX=XYZ");
     header("wide.y4m", "W99999999999999999999 H4");
     header("big.y4m", "W65535 H65535");
     header("zero.y4m", "W0 H4");
@@ -511,8 +561,9 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.png -t nv12 -o o.y4m", "Y4M files hold", 1},
         {"good.png -o o.bgra8888 --dither",
          "no conversion leads from rgb888 to bgra8888 with dithering", 1},
-        {"good.nv21 -f bgra8888 -s 64x36 -o o.nv12", "no conversion leads from bgra8888 to nv12",
-         1},
+        {"matrix.y4m -o o.png", "matrix.y4m: byte 16: unknown colour in tag XCOLORMATRIX=XYZ", 1},
+        {"good.y4m -o o.png --colour bt470", "--colour: bt470 not in", 2},
+        {"good.y4m -o o.png --chroma last", "--chroma: last not in", 2},
         {"good.y4m -o o.png", "o.png: holds one picture, but more frames follow", 1},
         {"good.y4m -o o-%d-%d.png", "o-%d-%d.png: one number such as", 1},
         {"good.y4m -o o.y4m --sheet", "o.y4m: a contact sheet is a still picture", 1},
@@ -574,23 +625,24 @@ TEST_F(convert_test, broken_pipes_full_disks_and_interruptions_end_cleanly) {
 
 TEST_F(convert_test, the_demonstration_leaves_its_pictures) {
     good("--demo pictures testcard:320x240@3");
-    EXPECT_EQ(
-        files("pictures"),
-        (std::set<std::string>{"every-rgb-format.png", "every-turn.png", "every-yuv-to-rgb.png",
-                               "road-to-the-screen.png", "tiles-and-dithering.png"}));
+    EXPECT_EQ(files("pictures"),
+              (std::set<std::string>{"every-rgb-format.png", "every-turn.png",
+                                     "every-yuv-to-rgb.png", "right-and-wrong-colour.png",
+                                     "road-to-the-screen.png", "tiles-and-dithering.png"}));
     for (const std::string &name : files("pictures")) {
         EXPECT_NE(got.out.find(name), std::string::npos);
         EXPECT_GT(png("pictures/" + name).width(), 800);
     }
 }
 
-TEST_F(convert_test, the_list_names_the_librarys_conversions) {
+TEST_F(convert_test, the_list_names_formats_colours_and_dithered_conversions) {
     good("--list");
-    for (const char *line :
-         {"  yuv400    -> rgb565*\n", "  t64x32    -> yuv420 nv12 rgb565 bgra8888\n",
-          "  rgba8888  -> rgb565\n"})
-        EXPECT_NE(got.out.find(line), std::string::npos) << line << got.out;
-    EXPECT_EQ(got.out.find("\n  bgr565 "), std::string::npos) << "bgr565 converts to nothing";
+    for (const char *text : {" yuv422w t64x32 uyvy yuyv rgb565 bgr565 ", "  yuv400    -> rgb565\n",
+                             " bt601 bt601-full bt709 bt709-full bt2020 bt2020-full\n"})
+        EXPECT_NE(got.out.find(text), std::string::npos) << text << got.out;
+    // What it says of all others.
+    good("testcard:64x48 -f bgr565 -o one.uyvy -v");
+    EXPECT_NE(got.err.find("bgr565 -> uyvy\n"), std::string::npos) << got.err;
 }
 
 }  // namespace

@@ -104,6 +104,10 @@ inline rgb get_rgb(const format &f, const uint8_t *p) {
     };
     return {value(f.red), value(f.green), value(f.blue)};
 }
+// Opaque where the format has none.
+inline int get_alpha(const format &f, const uint8_t *p) {
+    return f.alpha.count ? p[f.alpha.first / 8] : 255;
+}
 
 // Planes and pictures
 // ------------------------------------------------------------------------------

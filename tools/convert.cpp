@@ -13,6 +13,12 @@ Inputs: Y4M video (mono, 4:2:0, 4:2:2, 4:4:4 of 8 bits), PNG, raw frames with --
 a moving test card testcard:[WIDTHxHEIGHT][@FRAMES], and "-" for the standard input.
 Outputs by their ending: .png, .ppm, .y4m, anything else raw frames; "-" is the standard output.
 
+Between YUV and RGB, colours are what --colour says; without it, what the Y4M header says in its tags
+XCOLORRANGE=FULL or LIMITED and XCOLORMATRIX=BT601, BT709 or BT2020. What is not said follows from
+the size of the frames: HD (1280 or more pixels along the longer side, or more than 576 along the
+other) is bt709, less is bt601; the range is limited. Y4M that is written says so where a reader
+could not know.
+
 Examples:
   simgp-convert clip.y4m -o frame-%04d.png
   simgp-convert clip.y4m -o overview.png --sheet
@@ -24,6 +30,8 @@ Examples:
   simgp-convert clip.y4m -o small-%04d.png --deblock 4 --resize 320x240
   simgp-convert decoded.t64x32 --size 1280x720 -o screen.rgb565 --resize 480x800 --rotate 90r
   simgp-convert photo.png -o index.png --thumbnail
+  simgp-convert camera.nv12 --size 1280x720 --colour bt601-full -o camera.png
+  simgp-convert screen.bgra8888 --size 1920x1080 --chroma mean -o screen.y4m --to yuv420
   ffmpeg -i film.mp4 -f yuv4mpegpipe -pix_fmt yuv420p - | simgp-convert - -o film.png --sheet
 )";
 
@@ -46,6 +54,13 @@ int main(int argc, char **argv) {
     app.add_option("-s,--size", job.source.size, "size of raw frames, such as 640x480");
     app.add_option("-n,--frames", job.frames, "stop after so many frames")
         ->check(CLI::PositiveNumber);
+    app.add_option("--colour", job.source.colour,
+                   "what Y, U and V mean, instead of what the input says of it (see below)")
+        ->check(CLI::IsMember(tools::colour_names()));
+    std::string chroma = "first";
+    app.add_option("--chroma", chroma,
+                   "chroma that several pixels share: that of the first (the default), or the mean")
+        ->check(CLI::IsMember({"first", "mean"}));
     app.add_flag("-d,--dither", job.dither, "dither on the way to 16-bit RGB");
     app.add_option("--deblock", job.edit.deblock,
                    "smooth the edges between blocks of 8 x 8, 0 (not at all) to 15; YUV only")
@@ -77,6 +92,7 @@ int main(int argc, char **argv) {
         if (list || !demo.empty()) return;
         if (job.source.path.empty()) throw CLI::RequiredError("input");
         if (job.output.empty()) throw CLI::RequiredError("--output");
+        job.chroma_mean = chroma == "mean";
         job.edit.turn =
             int(std::find(std::begin(tools::turn_names), std::end(tools::turn_names), turn) -
                 std::begin(tools::turn_names));

@@ -27,13 +27,17 @@ std::string upper_label(const road &r) {
     return text;
 }
 
-// Frames 0, 20 and 40, or as many as there are, as 4:2:0.
-std::vector<picture> sample_frames(source &in) {
+// Frames 0, 20 and 40, or as many as there are, as 4:2:0 in BT.601.
+std::vector<picture> sample_frames(source &in, const colour &c) {
     std::vector<picture> frames;
     picture frame(in.shape());
-    road r(in.shape(), format_coded(SIMGP_FMT_YUV420), false);
+    const bool other = c.code != SIMGP_COLOUR_BT601 && !in.shape().format->is_rgb();
+    const pixel_format &goal = format_coded(SIMGP_FMT_YUV420);
+    road to_rgb(in.shape(), other ? format_coded(SIMGP_FMT_RGB888) : *in.shape().format, false, {},
+                c.code);
+    road r(to_rgb.out(), goal, false);
     for (int k = 0; k <= 40 && in.next(frame); ++k)
-        if (k % 20 == 0) frames.push_back(r.run(frame));
+        if (k % 20 == 0) frames.push_back(r.run(to_rgb.run(frame)));
     if (frames.empty()) throw fault(in.name(), ": holds no frame");
     return frames;
 }
@@ -61,6 +65,24 @@ std::vector<tile> every_pair() {
             card->next(frame);
             road r(frame.shape(), to, false);
             tiles.push_back(make_tile(r.run(frame), upper_label(r), 192, 144));
+        }
+    return tiles;
+}
+
+// A clip in BT.709 and one in full range, as what they are and as the BT.601 that they are not.
+std::vector<tile> right_and_wrong() {
+    std::vector<tile> tiles;
+    for (const std::string name : {"bt709", "bt601-full"})
+        for (const std::string &taken_for : {name, std::string("bt601")}) {
+            const colour &drawn_in = colour_named(name);
+            auto card = open_testcard("testcard:480x288", format_coded(SIMGP_FMT_NV12), &drawn_in);
+            picture frame;
+            card->next(frame);
+            road r(frame.shape(), format_coded(SIMGP_FMT_RGB888), false, {},
+                   colour_named(taken_for).code);
+            const std::string label =
+                name + (taken_for == name ? ": right" : " taken for bt601: wrong");
+            tiles.push_back(make_tile(r.run(frame), label, 480, 288));
         }
     return tiles;
 }
@@ -188,14 +210,20 @@ void demo(const std::string &directory, const source_options &options) {
     std::filesystem::create_directories(directory, error);
     if (error) throw fault(directory, ": ", error.message());
 
-    std::vector<picture> frames = sample_frames(*in);
+    const colour &c = wanted.colour.empty()
+                          ? resolved(in->traits().colour, in->shape().width, in->shape().height)
+                          : colour_named(wanted.colour);
+    std::vector<picture> frames = sample_frames(*in, c);
     const std::string folder = directory + "/";
     const std::vector<tile> rgb = every_rgb(frames);
     save(folder + "every-rgb-format.png", rgb, int(rgb.size() / frames.size()));
     printf("%severy-rgb-format.png: %s in every RGB format\n", folder.c_str(),
            wanted.path == "-" ? "the video" : in->name().c_str());
-    save(folder + "every-yuv-to-rgb.png", every_pair(), 6);
+    save(folder + "every-yuv-to-rgb.png", every_pair(), 7);
     printf("%severy-yuv-to-rgb.png: the test card through every YUV to RGB conversion\n",
+           folder.c_str());
+    save(folder + "right-and-wrong-colour.png", right_and_wrong(), 2);
+    printf("%sright-and-wrong-colour.png: BT.709 and full range, taken for what they are or not\n",
            folder.c_str());
     save(folder + "tiles-and-dithering.png", tiles_and_dithering(frames.front()), 3);
     printf(

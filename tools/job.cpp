@@ -26,14 +26,15 @@ std::string output_kind(const job &j) {
 
 // The cheapest of the formats that the kind of output can hold; dithering narrows them to those
 // that can be dithered. A YUV format that gets less chroma than the frames have is the last choice.
-const pixel_format &suitable(const job &j, const picture_shape &from, const std::string &kind) {
+const pixel_format &suitable(const job &j, const picture_shape &from, const std::string &kind,
+                             int32_t code) {
     const pixel_format *best = nullptr;
     int best_cost = std::numeric_limits<int>::max();
     for (const pixel_format &format : formats()) {
         const bool fits = kind == "y4m" ? !y4m_tag(format).empty() : format.is_rgb();
         if (!fits) continue;
         try {
-            const road r(from, format, j.dither, j.edit);
+            const road r(from, format, j.dither, j.edit, code);
             const bool poorer = !from.format->is_rgb() && !format.is_rgb() &&
                                 (format.chroma() < from.format->chroma() || !r.loss().empty());
             const int cost = r.cost() + (poorer ? 20 : 0);
@@ -47,7 +48,8 @@ const pixel_format &suitable(const job &j, const picture_shape &from, const std:
     return *best;
 }
 
-const pixel_format &target(const job &j, const picture_shape &from, const std::string &kind) {
+const pixel_format &target(const job &j, const picture_shape &from, const std::string &kind,
+                           int32_t code) {
     const pixel_format *named = j.to.empty() ? nullptr : &format_named(j.to);
     if (kind == "raw") {
         if (!named) named = find_format(ending_of(j.output));
@@ -55,7 +57,7 @@ const pixel_format &target(const job &j, const picture_shape &from, const std::s
         return named ? *named
                      : turned(*from.format, j.edit.thumbnail ? SIMGP_ROT_90R : j.edit.turn);
     }
-    if (!named) return suitable(j, from, kind);
+    if (!named) return suitable(j, from, kind, code);
     if (kind == "y4m" && y4m_tag(*named).empty())
         throw fault("Y4M files hold yuv400, yuv420, yuv422n and yuv444, not ", named->name);
     if (kind != "y4m" && !named->is_rgb())
@@ -72,6 +74,23 @@ std::unique_ptr<sink> open_sink(const job &j, const std::string &kind, const vid
         return kind == "raw" ? open_raw_sink(j.output) : open_y4m_sink(j.output, traits);
     }
     return j.sheet ? open_sheet_sink(j.output, write, j.columns) : open_still_sink(j.output, write);
+}
+
+// The colour of the frames.
+const colour &colour_of_frames(const job &j, const source &in) {
+    if (!j.source.colour.empty()) return colour_named(j.source.colour);
+    return resolved(in.traits().colour, in.shape().width, in.shape().height);
+}
+
+// What a stream in colour `c` has to say of it: what its source did, what the user did, and what its
+// size would not make one think.
+colour_note note_of(const job &j, const colour &c, colour_note said, const picture_shape &to) {
+    if (!said.range.empty() || !j.source.colour.empty() || c.full)
+        said.range = c.full ? "full" : "limited";
+    if (!said.matrix.empty() || !j.source.colour.empty() ||
+        c.matrix != usual_matrix(to.width, to.height))
+        said.matrix = c.matrix;
+    return said;
 }
 
 // What is true of a stream when its pictures have another size, or are turned.
@@ -110,23 +129,35 @@ void run(const job &wish) {
     // What happens to a frame, in order; every stage takes up the shape that the one before leaves.
     std::vector<std::unique_ptr<stage>> stages;
     auto shape = [&] { return stages.empty() ? in->shape() : stages.back()->out(); };
-    {
-        auto r = std::make_unique<road>(shape(), target(j, shape(), kind), j.dither, j.edit);
+    const colour &c = colour_of_frames(j, *in);
+    const int32_t code = c.code | (j.chroma_mean ? int32_t{SIMGP_CHROMA_MEAN} : 0);
+    const auto add = [&](const pixel_format &to, bool dither, const edits &edit, int32_t of) {
+        auto r = std::make_unique<road>(shape(), to, dither, edit, of);
         if (!j.quiet && !j.verbose && !r->loss().empty())
             fprintf(stderr, "simgp-convert: note: %s passes through %s\n", r->text().c_str(),
                     r->loss().c_str());
         stages.push_back(std::move(r));
+    };
+    const pixel_format &to = target(j, shape(), kind, code);
+    // Dithered conversions to RGB are in BT.601: other colours become RGB first, and then that.
+    if (j.dither && to.is_rgb() && c.code != SIMGP_COLOUR_BT601) {
+        const bool is_rgb = in->shape().format->is_rgb();
+        if (!is_rgb) add(format_coded(SIMGP_FMT_RGB888), false, j.edit, code);
+        add(to, true, is_rgb ? j.edit : edits{}, SIMGP_COLOUR_BT601);
+    } else {
+        add(to, j.dither, j.edit, code);
     }
 
     if (j.verbose) {
-        fprintf(stderr, "%s: %s %dx%d\n", in->name().c_str(),
+        fprintf(stderr, "%s: %s %dx%d, %s\n", in->name().c_str(),
                 std::string(in->shape().format->name).c_str(), in->shape().width,
-                in->shape().height);
+                in->shape().height, std::string(c.name).c_str());
         for (const auto &s : stages) fprintf(stderr, "%s\n", s->text().c_str());
     }
 
-    const std::unique_ptr<sink> out =
-        open_sink(j, kind, edited_traits(in->traits(), in->shape(), shape(), j.edit));
+    video_traits traits = edited_traits(in->traits(), in->shape(), shape(), j.edit);
+    traits.colour = note_of(j, c, traits.colour, shape());
+    const std::unique_ptr<sink> out = open_sink(j, kind, traits);
     progress bar(!j.quiet);
     int64_t frames = 0;
     try {
@@ -154,26 +185,20 @@ void run(const job &wish) {
 }
 
 std::string list_conversions() {
-    std::string page = "Conversions of the library (* can be dithered):\n";
+    std::string page = "Every format converts into every other, in one step and in any colour:\n ";
+    for (const pixel_format &f : formats()) page.append(" ").append(f.name);
+    page += "\n\nConversions that can be dithered:\n";
     for (const pixel_format &from : formats()) {
         std::string line;
-        for (const pixel_format &to : formats()) {
-            const bool plain = offered(from, to, method::csc),
-                       dithered = offered(from, to, method::dither);
-            if (plain || dithered) line.append(" ").append(to.name).append(dithered ? "*" : "");
-        }
+        for (const pixel_format &to : formats())
+            if (offered(from, to, method::dither)) line.append(" ").append(to.name);
         if (line.empty()) continue;
         page.append("  ").append(from.name).append(10 - from.name.size(), ' ');
         page.append("->").append(line).append("\n");
     }
-    page += "Formats that no conversion leads to; samples are moved into them from other YUV:\n ";
-    for (const pixel_format &to : formats())
-        for (const pixel_format &from : formats())
-            if (offered(from, to, method::samples)) {
-                page.append(" ").append(to.name);
-                break;
-            }
-    return page + "\nEverything else goes over several of these steps; --verbose names them.\n";
+    page += "Other formats are converted to one of these first; --verbose names it.\n\nColours:\n ";
+    for (const colour &c : colours()) page.append(" ").append(c.name);
+    return page + "\n";
 }
 
 }  // namespace tools

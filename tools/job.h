@@ -19,7 +19,8 @@ struct job {
     int64_t frames = 0;  // stop after so many; 0: all
     bool dither = false;
     edits edit;
-    std::string resize;  // "320x240", the size in `edit`; empty: none
+    bool chroma_mean = false;  // of several pixels or samples, not that of the first
+    std::string resize;        // "320x240", the size in `edit`; empty: none
     bool sheet = false;
     int columns = 0;
     bool verbose = false;

@@ -164,20 +164,4 @@ simgp_img picture::descriptor(bool even_width, bool even_height) {
     return img;
 }
 
-void move_samples(const picture &src, picture &dst) {
-    // The V of a last half group lies outside the line: that of the group before serves, as
-    // everywhere in the library.
-    const bool half_group = src.format().is_packed() && src.width() % 2 == 1;
-    for (int c = 0; c < 3; ++c) {
-        const channel &to = dst.format().channels[c];
-        if (to.step == 0) continue;
-        const bool known = src.format().channels[c].step != 0;
-        for (int y = 0; y < dst.height(); y += 1 << to.y_shift)
-            for (int x = 0; x < dst.width(); x += 1 << to.x_shift) {
-                const int from = half_group && c == 2 && x == src.width() - 1 ? x - 2 : x;
-                *dst.sample(c, x, y) = known && from >= 0 ? *src.sample(c, from, y) : uint8_t{128};
-            }
-    }
-}
-
 }  // namespace tools

@@ -119,11 +119,6 @@ class picture {
     int lines_[3] = {};
 };
 
-// Copies samples from one YUV layout to another, neither of them tiled: chroma that the
-// destination has more of is repeated, of chroma that it has less of the top left sample is kept,
-// and chroma that the source has none of is grey.
-void move_samples(const picture &src, picture &dst);
-
 }  // namespace tools
 
 #endif

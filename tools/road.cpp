@@ -18,10 +18,11 @@ size exchanged(const size &s, bool quarter) { return quarter ? size{s.height, s.
 
 // Every step costs, and more so what it loses: bits of colour, chroma samples, and the rounding of
 // a passage between YUV and RGB.
-int step_cost(const pixel_format &from, const pixel_format &to, method how) {
-    int cost = how == method::samples ? 12 : 2;
+int step_cost(const pixel_format &from, const pixel_format &to) {
+    int cost = 2;
     if (to.is_rgb16() && !from.is_rgb16()) cost += 10;
     if (from.is_rgb() != to.is_rgb()) cost += 2;
+    if (to.chroma() == 0) cost += 20;
     const bool coarser =
         to.chroma_x_shift() > from.chroma_x_shift() || to.chroma_y_shift() > from.chroma_y_shift();
     if (!from.is_rgb() && (coarser || to.chroma() < from.chroma())) cost += 3;
@@ -69,13 +70,15 @@ bool is_resizable(const pixel_format &f, const size &from, const size &to) {
 struct plan {
     const pixel_format &source, &target;
     int turn;
+    int32_t colour;
     std::vector<method> parts;
     std::vector<size> sizes;
 
-    plan(const picture_shape &from, const pixel_format &to, const edits &wish)
+    plan(const picture_shape &from, const pixel_format &to, const edits &wish, int32_t of_colour)
         : source(*from.format),
           target(to),
           turn(wish.thumbnail ? SIMGP_ROT_90R : wish.turn),
+          colour(of_colour),
           sizes{{from.width, from.height}} {
         const auto add = [this](method how, const size &after) {
             parts.push_back(how);
@@ -115,8 +118,8 @@ struct plan {
         for (const pixel_format &to : formats()) {
             // Rounding into RGB and back again.
             const int there_and_back = !source.is_rgb() && f.is_rgb() && !to.is_rgb() ? 12 : 0;
-            for (method how : {method::csc, method::samples})
-                if (offered(f, to, how)) go(done, to, how, step_cost(f, to, how) + there_and_back);
+            if (offered(f, to, method::csc))
+                go(done, to, method::csc, step_cost(f, to) + there_and_back);
         }
         if (done == parts.size()) return;
         const size &from = sizes[done], &to = sizes[done + 1];
@@ -126,9 +129,10 @@ struct plan {
                 if (!is_resizable(f, from, to)) break;
                 const int cost = resize_cost(f, from, to, source, target);
                 if (offered(f, f, method::resize)) go(done + 1, f, method::resize, cost);
-                for (const pixel_format &g : formats())
-                    if (offered(f, g, method::resize_csc))
-                        go(done + 1, g, method::resize_csc, step_cost(f, g, method::csc));
+                if ((colour & ~SIMGP_CHROMA_MEAN) == SIMGP_COLOUR_BT601)
+                    for (const pixel_format &g : formats())
+                        if (offered(f, g, method::resize_csc))
+                            go(done + 1, g, method::resize_csc, step_cost(f, g));
                 if (done + 1 < parts.size() && offered(f, after, method::resize_turn, turn))
                     go(done + 2, after, method::resize_turn, cost + turn_cost(f, to, turn));
                 break;
@@ -137,12 +141,12 @@ struct plan {
                 if (offered(f, after, method::turn, turn))
                     go(done + 1, after, method::turn, turn_cost(f, from, turn));
                 if (offered(f, f, method::turn_bytes)) go(done + 1, f, method::turn_bytes, 6);
-                // Of an odd number of lines the last one gets no chroma.
-                if (from.height % 2 == 0)
+                // Of an odd number of lines the last one gets no chroma; nothing is averaged.
+                if (from.height % 2 == 0 && !(colour & SIMGP_CHROMA_MEAN))
                     for (const pixel_format &g : formats())
                         if (offered(f, g, method::csc_turn, turn))
                             go(done + 1, g, method::csc_turn,
-                               step_cost(f, g, method::csc) + turn_cost(f, from, turn) - 2);
+                               step_cost(f, g) + turn_cost(f, from, turn) - 2);
                 break;
             case method::thumbnail:
                 if (offered(f, after, method::thumbnail)) {
@@ -160,10 +164,11 @@ struct plan {
 }  // namespace
 
 void check_edits(const picture_shape &from, const edits &wish) {
-    plan(from, *from.format, wish).check();
+    plan(from, *from.format, wish, SIMGP_COLOUR_BT601).check();
 }
 
-road::road(const picture_shape &from, const pixel_format &to, bool dither, const edits &wish)
+road::road(const picture_shape &from, const pixel_format &to, bool dither, const edits &wish,
+           int32_t colour)
     : from_(from) {
     constexpr int far = std::numeric_limits<int>::max() / 2;
     struct place {
@@ -174,7 +179,7 @@ road::road(const picture_shape &from, const pixel_format &to, bool dither, const
     };
     // Dijkstra's way over the formats, once for each number of parts that are done. Dithering comes
     // last of all: it is decided after the rest.
-    const plan p(from, to, wish);
+    const plan p(from, to, wish, colour);
     p.check();
     const std::span<const pixel_format> all = formats();
     const size_t count = all.size(), last = p.parts.size() * count;
@@ -203,7 +208,9 @@ road::road(const picture_shape &from, const pixel_format &to, bool dither, const
         cost_ = far;
         for (size_t k = 0; k < count; ++k) {
             if (places[last + k].cost >= far || !offered(all[k], to, method::dither)) continue;
-            const int cost = places[last + k].cost + step_cost(all[k], to, method::dither);
+            // RGB becomes YUV for this alone, so it may as well keep its chroma.
+            const int poorer = from_.format->is_rgb() ? 4 - all[k].chroma() : 0;
+            const int cost = places[last + k].cost + step_cost(all[k], to) + poorer;
             if (cost < cost_) cost_ = cost, end = last + k;
         }
     }
@@ -213,7 +220,9 @@ road::road(const picture_shape &from, const pixel_format &to, bool dither, const
     const auto add = [&](method how, size_t at) {
         const size &s = p.sizes[at / count];
         steps_.emplace_back(how, picture_shape{&all[at % count], s.width, s.height},
-                            how == method::deblock ? wish.deblock : p.turn);
+                            how == method::deblock ? wish.deblock
+                            : how == method::csc   ? colour
+                                                   : p.turn);
     };
     for (size_t k = end; k != start; k = places[k].before) add(places[k].how, k);
     std::reverse(steps_.begin(), steps_.end());

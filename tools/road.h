@@ -24,9 +24,11 @@ void check_edits(const picture_shape &from, const edits &wish);
 // The best chain of steps, with the pictures between them.
 class road : public stage {
   public:
-    // From pictures of `from` to the format `to`. With `dither` the last step is a dithered one.
+    // From pictures of `from` to the format `to`. With `dither` the last step is a dithered one,
+    // which is always one of BT.601. `colour`: SIMGP_COLOUR_*, perhaps with SIMGP_CHROMA_MEAN.
     // Ends in a fault where no chain leads there.
-    road(const picture_shape &from, const pixel_format &to, bool dither, const edits &wish = {});
+    road(const picture_shape &from, const pixel_format &to, bool dither, const edits &wish = {},
+         int32_t colour = SIMGP_COLOUR_BT601);
 
     // Lines and columns beyond the size of `from` are overwritten, and with deblocking it may be
     // changed itself. Where there is nothing to do, the result is `from`.

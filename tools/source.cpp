@@ -8,7 +8,8 @@ std::unique_ptr<source> open_source(const source_options &options) {
         if (!options.size.empty())
             throw fault("--size is for raw frames; a test card has it in its name: testcard:",
                         options.size);
-        return open_testcard(options.path, format ? *format : format_named("yuv420"));
+        return open_testcard(options.path, format ? *format : format_named("yuv420"),
+                             options.colour.empty() ? nullptr : &colour_named(options.colour));
     }
     auto in = std::make_unique<input>(options.path);
     if (!options.size.empty()) {

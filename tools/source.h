@@ -5,6 +5,7 @@
 #include <memory>
 #include <string>
 
+#include "tools/colour.h"
 #include "tools/input.h"
 #include "tools/picture.h"
 
@@ -13,6 +14,7 @@ namespace tools {
 // What a stream says about its frames beyond their shape, in the words of a Y4M header.
 struct video_traits {
     std::string rate = "25:1", interlacing = "p", aspect = "1:1";
+    colour_note colour;
 };
 
 class source {
@@ -35,18 +37,22 @@ class source {
 
 // How the user described the input.
 struct source_options {
-    std::string path;    // a file, "-", or "testcard:[WxH][@FRAMES]"
-    std::string format;  // of raw frames and test cards; empty: as the file says
-    std::string size;    // of raw frames
+    std::string path = {};    // a file, "-", or "testcard:[WxH][@FRAMES]"
+    std::string format = {};  // of raw frames and test cards; empty: as the file says
+    std::string size = {};    // of raw frames
+    std::string colour = {};  // empty: as the file says, or the usual one
 };
 
-// Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M or PNG.
+// Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M or PNG. A colour
+// that they name takes the place of what a file says.
 std::unique_ptr<source> open_source(const source_options &options);
 
 std::unique_ptr<source> open_y4m(std::unique_ptr<input> in);
 std::unique_ptr<source> open_png(std::unique_ptr<input> in, const pixel_format &format);
 std::unique_ptr<source> open_raw(std::unique_ptr<input> in, const picture_shape &shape);
-std::unique_ptr<source> open_testcard(const std::string &spec, const pixel_format &format);
+// `drawn_in` is what it is drawn in; null: the usual one of its size.
+std::unique_ptr<source> open_testcard(const std::string &spec, const pixel_format &format,
+                                      const colour *drawn_in = nullptr);
 
 }  // namespace tools
 

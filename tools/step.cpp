@@ -19,7 +19,7 @@ bool v_first(const pixel_format &format) {
 int32_t call(method how, int code, const simgp_img &src, simgp_img dst) {
     switch (how) {
         case method::csc:
-            return simgp_csc(&src, &dst);
+            return simgp_csc_any(&src, &dst, code);
         case method::dither:
             return simgp_csc_dither(&src, &dst);
         case method::deblock:
@@ -54,26 +54,31 @@ void check(int32_t result, const picture &src, const picture &dst) {
 // begin a tile row of its own, it lies in the last one.
 bool tiles_hold_last_chroma(int height) { return height % 2 == 0 || (height >> 1) % 32 != 0; }
 
-// Converts one picture. The library may leave out the chroma of a last odd column or line; given
-// the next even size it does not, and as chroma is never averaged, nothing of what is added shows.
-// Conversions from YUV to RGB have their own rules for odd sizes, which are kept.
-void convert(method how, picture &src, picture &dst) {
+// Lets the line behind the last one hold the same, where lines of pixels have lines of their own.
+void repeat_last_line(picture &p) {
+    for (int k = 0; k < p.planes(); ++k)
+        if (p.format().planes[k].y_shift == 0)
+            std::copy_n(p.line(k, p.height() - 1), p.line_bytes(k), p.line(k, p.height()));
+}
+
+// Converts one picture, of which every last odd column and line gets chroma of its own. From RGB in
+// BT.601, without means, some kernels of the library leave it out, and tiles have no line for it:
+// these are given the next even size. Between YUV formats each colour has the same result, but
+// BT.601 leaves it out there as well.
+void convert(int32_t colour, picture &src, picture &dst) {
     const pixel_format &from = src.format(), &to = dst.format();
-    if (how == method::samples) return move_samples(src, dst);
-    const bool even_width = !to.is_rgb(), tiled = from.is_tiled();
-    const bool even_height =
-        even_width && ((!tiled && !to.is_tiled()) || tiles_hold_last_chroma(src.height()));
-    check(call(how, 0, src.descriptor(even_width, even_height), dst.descriptor()), src, dst);
-    if (tiled && even_width && !even_height) {
-        // The chroma of the last line is nowhere: that of the line above has to do.
-        for (int k = 1; k < dst.planes(); ++k) {
-            const int last = dst.lines(k) - 1;
-            if (last > 0)
-                std::copy_n(dst.line(k, last - 1), dst.line_bytes(k), dst.line(k, last));
-            else
-                std::fill_n(dst.line(k, last), dst.line_bytes(k), uint8_t{128});
-        }
-    }
+    if (!from.is_rgb() && !to.is_rgb()) colour = SIMGP_COLOUR_BT709 | (colour & SIMGP_CHROMA_MEAN);
+    const bool left_out = from.is_rgb() && !to.is_rgb() && colour == SIMGP_COLOUR_BT601;
+    const bool even_height = to.is_tiled() ? tiles_hold_last_chroma(src.height()) : left_out;
+    if (even_height && src.height() % 2) repeat_last_line(src);
+    check(call(method::csc, colour, src.descriptor(left_out, even_height), dst.descriptor()), src,
+          dst);
+}
+
+// Given the next even size, nothing is left out.
+void dither(picture &src, picture &dst) {
+    const bool even = !dst.format().is_rgb();
+    check(call(method::dither, 0, src.descriptor(even, even), dst.descriptor()), src, dst);
 }
 
 // A plane of bytes in memory.
@@ -126,13 +131,9 @@ bool offered(const pixel_format &from, const pixel_format &to, method how, int t
     const std::span<const pixel_format> all = formats();
     const bool planar = from.kind == pixel_format::family::planar;
     switch (how) {
-        case method::samples: {
-            // Layouts that the library reads but never writes. That pictures can be brought into
-            // them all the same, the tool moves samples into them itself.
-            const auto writes = [&](const pixel_format &f) { return offered(f, to, method::csc); };
-            return !from.is_rgb() && !from.is_tiled() && !to.is_rgb() && &from != &to &&
-                   std::none_of(all.begin(), all.end(), writes);
-        }
+        case method::csc:
+            if (&from == &to) return false;
+            break;
         case method::deblock:  // takes every plane for one of bytes, whatever the format
             return planar && &from == &to &&
                    std::all_of(from.planes, from.planes + from.plane_count,
@@ -169,9 +170,10 @@ step::step(method how, const picture_shape &to, int code) : how_(how), to_(to), 
 picture &step::run(picture &from) {
     switch (how_) {
         case method::csc:
+            convert(code_, from, made_);
+            break;
         case method::dither:
-        case method::samples:
-            convert(how_, from, made_);
+            dither(from, made_);
             break;
         case method::turn_bytes:
             work_by_bytes(from, made_, [this](const byte_plane &src, const byte_plane &dst) {
@@ -201,8 +203,6 @@ std::string step::note() const {
     switch (how_) {
         case method::dither:
             return "dithered";
-        case method::samples:
-            return "samples moved by the tool";
         case method::deblock:
             return std::string("simgp_dbf8x8_yuv ").append(std::to_string(code_));
         case method::resize:

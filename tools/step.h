@@ -13,7 +13,6 @@ namespace tools {
 enum class method {
     csc,
     dither,
-    samples,  // the tool moves samples into layouts that the library never writes
     deblock,  // in place
     resize,
     resize_csc,   // resize and conversion in one pass
@@ -41,7 +40,7 @@ bool offered(const pixel_format &from, const pixel_format &to, method how, int t
 // A step, with the picture that it makes.
 class step {
   public:
-    // `code` is the rotation code, or the strength of deblocking.
+    // `code` is the colour of a conversion, the rotation code, or the strength of deblocking.
     step(method how, const picture_shape &to, int code);
 
     const picture_shape &out() const { return to_; }
@@ -50,7 +49,7 @@ class step {
     bool turns() const { return how_ >= method::resize_turn; }
     // Lines and columns beyond the size of `from` are overwritten.
     picture &run(picture &from);
-    // Who does it, unless simgp_csc does: "simgp_rot 90l".
+    // Who does it, unless simgp_csc_any does: "simgp_rot 90l".
     std::string note() const;
 
   private:

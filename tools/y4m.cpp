@@ -1,5 +1,7 @@
 // Y4M, uncompressed video: a line of text about the stream, then for each frame a line that begins
 // with FRAME and the tight planes.
+#include <ctype.h>
+
 #include <algorithm>
 #include <charconv>
 #include <limits>
@@ -22,6 +24,14 @@ constexpr struct {
                    {"420mpeg2", SIMGP_FMT_YUV420}, {"420paldv", SIMGP_FMT_YUV420},
                    {"422", SIMGP_FMT_YUV422N},     {"444", SIMGP_FMT_YUV444},
                    {"mono", SIMGP_FMT_YUV400}};
+
+// Extensions of the header. The first is common, the second one of our own: there is no common one.
+constexpr std::string_view range_key = "COLORRANGE", matrix_key = "COLORMATRIX";
+
+std::string upper(std::string text) {
+    for (char &c : text) c = char(toupper(c));
+    return text;
+}
 
 const pixel_format *format_of_tag(std::string_view tag) {
     for (const auto &known : colour_tags)
@@ -84,7 +94,8 @@ class y4m_source : public source {
                     traits_.aspect = value;
                     break;
                 case 'X':
-                    break;  // comments and extensions
+                    extension(value, begin);
+                    break;
                 default:
                     fail(begin, "unknown tag '", tag, "' in the Y4M header");
             }
@@ -116,6 +127,22 @@ class y4m_source : public source {
         input_->fail(-1, at, part...);
     }
 
+    // Comments, and what some programs say of the colour.
+    void extension(const std::string &text, int64_t at) {
+        const size_t sign = text.find('=');
+        const std::string key = text.substr(0, sign);
+        if (key != range_key && key != matrix_key) return;
+        std::string value = sign == std::string::npos ? "" : text.substr(sign + 1);
+        for (char &c : value) c = char(tolower(c));
+        const auto &all = colours();
+        const bool known = key == range_key
+                               ? value == "full" || value == "limited"
+                               : std::any_of(all.begin(), all.end(),
+                                             [&](const colour &c) { return c.matrix == value; });
+        if (!known) fail(at, "unknown colour in tag X", text);
+        (key == range_key ? traits_.colour.range : traits_.colour.matrix) = value;
+    }
+
     int64_t number(const std::string &text, int64_t at) const {
         int64_t value = 0;
         const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
@@ -139,7 +166,11 @@ class y4m_sink : public sink {
             std::ostringstream header;
             header << "YUV4MPEG2 W" << p.width() << " H" << p.height() << " F" << traits_.rate
                    << " I" << traits_.interlacing << " A" << traits_.aspect << " C"
-                   << y4m_tag(p.format()) << "\n";
+                   << y4m_tag(p.format());
+            const colour_note &known = traits_.colour;
+            if (!known.range.empty()) header << " X" << range_key << "=" << upper(known.range);
+            if (!known.matrix.empty()) header << " X" << matrix_key << "=" << upper(known.matrix);
+            header << "\n";
             output_.write(header.str());
         }
         output_.write("FRAME\n");

@@ -6,6 +6,24 @@
 
 namespace simgp::SIMD_TARGET {
 
+// The same as row_of_steps below, by functions.
+template <bool PixelsInPairs, class Load, class Write, class Part>
+inline void row_of_steps(ptrdiff_t width, Load load, Write write, Part part) {
+    const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
+    if (whole < bytes) return part(0, int(width));
+    ptrdiff_t x = 0;
+    auto pixels = load(0);
+    for (;;) {
+        const ptrdiff_t next = x + 2 * bytes <= whole ? x + bytes : whole - bytes;
+        const auto ahead = load(next);
+        write(x, pixels);
+        if (next == x) break;
+        x = next;
+        pixels = ahead;
+    }
+    if (whole < width) part(whole, 1);
+}
+
 // A Step converts `bytes` pixels at a time:
 //   pixels_in_pairs         whether a step must begin at an even pixel
 //   load(in, x)             the samples of pixels x ... x + bytes - 1
@@ -22,19 +40,10 @@ namespace simgp::SIMD_TARGET {
 // alone.
 template <class Step, class In, class Out>
 inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
-    const ptrdiff_t whole = Step::pixels_in_pairs ? width & ~ptrdiff_t(1) : width;
-    if (whole < bytes) return Step::part(in, out, 0, int(width));
-    ptrdiff_t x = 0;
-    auto pixels = Step::load(in, 0);
-    for (;;) {
-        const ptrdiff_t next = x + 2 * bytes <= whole ? x + bytes : whole - bytes;
-        const auto ahead = Step::load(in, next);
-        Step::write(out, x, pixels);
-        if (next == x) break;
-        x = next;
-        pixels = ahead;
-    }
-    if (whole < width) Step::part(in, out, whole, 1);
+    row_of_steps<Step::pixels_in_pairs>(
+        width, [&](ptrdiff_t x) { return Step::load(in, x); },
+        [&](ptrdiff_t x, const auto &pixels) { Step::write(out, x, pixels); },
+        [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
 }
 
 // Moves `pairs` >= 1 pairs in steps of a vector: whole(i) does `bytes` of them from pair i on,

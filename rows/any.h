@@ -1,0 +1,117 @@
+// Inner loops between any two formats: with weights that are known at run time, one set of rows
+// serves all matrices, and with orders of channels that are, a row serves several formats.
+#ifndef ROWS_ANY_H
+#define ROWS_ANY_H
+
+#include "rows/conversions.h"
+
+namespace simgp {
+
+// YUV to RGB with 8 fractional bits (see simgp/csc_any.h). `luma` and all sums of chroma have at
+// most one odd factor: luma is even, and so is one of green's two.
+struct yuv_weights {
+    int16_t luma, black, red, green_u, green_v, blue;
+};
+
+// RGB to YUV with 8 fractional bits. The factors are in the order of a pixel's channels in memory,
+// so they differ between RGB and BGR.
+struct rgb_weights {
+    int16_t y[3], u[3], v[3];
+    uint8_t black;
+};
+
+// How the pixels of a packing lie in memory, but for the order of their channels.
+enum class pixel_kind : uint8_t {
+    words,  // of 5, 6 and 5 bits; the first channel is that in the highest bits
+    three,  // bytes
+    four,   // bytes, alpha among them
+    count
+};
+constexpr pixel_kind kind_of(rgb_packing packing) {
+    return pixel_kind(pixels_of[size_t(packing)].size - 2);
+}
+constexpr bool is_blue_first(rgb_packing packing) {
+    const pixel_bytes &at = pixels_of[size_t(packing)];
+    return at.size == 2 ? at.b > at.r : at.b < at.r;
+}
+constexpr bool is_alpha_first(rgb_packing packing) { return pixels_of[size_t(packing)].a == 0; }
+
+// The matrix, and in which order there are chroma and channels.
+struct yuv_to_rgb {
+    yuv_weights weights;
+    bool v_first;                  // of byte pairs
+    bool luma_first;               // of packed groups
+    bool blue_first, alpha_first;  // of pixels
+};
+
+// What yuv_to_rgb_row and yuv_to_rgb_row_pair do (rows/yuv2rgb.h), by matrix and order.
+using any_to_rgb_row = void(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u,
+                            const uint8_t *v, uint8_t *dst, ptrdiff_t width);
+using any_to_rgb_row_pair = void(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
+                                 const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
+                                 ptrdiff_t width);
+
+// Where the samples of a row lie, as far as rows differ by it.
+enum class chroma_in : uint8_t {
+    half,    // u and v: a sample for two pixels
+    full,    // u and v: a sample per pixel
+    pairs,   // u: pairs U V or V U, one for two pixels
+    groups,  // y: YUYV or UYVY; a half group at the end has the V of the group before, or 128
+    count
+};
+
+// Converts `width` >= 1 pixels: luma, and the chroma of pixels 0, 2, 4, ..., (width + 1) / 2
+// samples, to u and v, or to u as pairs, or not at all.
+using any_to_yuv_row = void(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
+                            uint8_t *v, ptrdiff_t width);
+enum class chroma_out : uint8_t { none, half, pairs, count };
+// What any_to_yuv_row reads.
+enum class rgb_in : uint8_t { words, three, four, four_alpha_first, count };
+constexpr rgb_in rgb_in_of(rgb_packing packing) {
+    return is_alpha_first(packing) ? rgb_in::four_alpha_first : rgb_in(kind_of(packing));
+}
+
+// The chroma of `count` >= 1 pixels from planes of their channels.
+using chroma_row = void(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
+                        uint8_t *v, ptrdiff_t count);
+
+// Takes `count` >= 1 pixels apart into planes of their channels. Those of words are widened by
+// shifting alone.
+using split_pixels_row = void(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count);
+
+// Writes `count` >= 1 pixels in another way: the first channel and the last one may change places.
+// Words lose the low bits of their channels; alpha is carried, or is 255.
+struct repacking {
+    bool exchange, from_alpha_first, to_alpha_first;
+};
+using repack_row = void(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count);
+
+// Takes `pairs` >= 1 pairs of pixels apart, bytes Y U Y V or U Y V Y, and puts them together.
+using split_groups_row = void(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
+                              ptrdiff_t pairs, bool luma_first);
+using join_groups_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                             ptrdiff_t pairs, bool luma_first);
+
+// `count` >= 1 samples from lines a and b: the mean of two, a[x] and b[x]; of two, a[2x] and
+// a[2x + 1]; of four, of both lines. Rounded, halves up.
+using mean_row = void(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count);
+
+// `count` >= 1 samples: every second of a, and every sample of a twice (the last may be once).
+using resample_row = void(const uint8_t *a, uint8_t *dst, ptrdiff_t count);
+
+struct any_rows {
+    any_to_rgb_row *to_rgb[size_t(chroma_in::count)][size_t(pixel_kind::count)];
+    any_to_rgb_row_pair *to_rgb_pair[size_t(chroma_in::count)][size_t(pixel_kind::count)];
+    any_to_yuv_row *to_yuv[size_t(rgb_in::count)][size_t(chroma_out::count)];
+    chroma_row *chroma;
+    split_pixels_row *split_pixels[size_t(rgb_in::count)];
+    repack_row *repack[size_t(pixel_kind::count)][size_t(pixel_kind::count)];
+    split_groups_row *split_groups;
+    join_groups_row *join_groups;
+    mean_row *mean_of_lines, *mean_of_pairs, *mean_of_blocks;
+    resample_row *every_second, *twice;
+};
+
+}  // namespace simgp
+
+#endif

@@ -1,0 +1,713 @@
+// Any format to any format: the scalar rows, which define the results, and the walks.
+#include "simgp/csc_any.h"
+
+#include "simgp/csc.h"
+#include "simgp/pixel.h"
+#include "simgp/tile_offset.h"
+#include "simgp/walk.h"
+
+namespace simgp {
+namespace scalar {
+namespace {
+
+int clamp(int v) { return v < 0 ? 0 : v > 255 ? 255 : v; }
+
+// The bytes of a pixel of some kind.
+constexpr int size_of(pixel_kind kind) { return int(kind) + 2; }
+
+void write_pixel(pixel_kind kind, const yuv_to_rgb &how, uint8_t *p, const rgb &c) {
+    const int first = how.blue_first ? c.b : c.r, last = how.blue_first ? c.r : c.b;
+    if (kind == pixel_kind::words) {
+        const int word = first >> 3 << 11 | c.g >> 2 << 5 | last >> 3;
+        p[0] = uint8_t(word);
+        p[1] = uint8_t(word >> 8);
+        return;
+    }
+    if (kind == pixel_kind::four) {
+        p[how.alpha_first ? 0 : 3] = 255;
+        p += how.alpha_first;
+    }
+    p[0] = uint8_t(first);
+    p[1] = uint8_t(c.g);
+    p[2] = uint8_t(last);
+}
+
+rgb from_yuv(const yuv_weights &w, const yuv &p) {
+    const int luma = w.luma * (p.y - w.black), u = p.u - 128, v = p.v - 128;
+    return {clamp((luma + w.red * v + 128) >> 8),
+            clamp((luma - w.green_u * u - w.green_v * v + 128) >> 8),
+            clamp((luma + w.blue * u + 128) >> 8)};
+}
+
+template <chroma_in Layout>
+yuv read_any(const yuv_to_rgb &how, const yuv_samples &s, ptrdiff_t x) {
+    if constexpr (Layout == chroma_in::half) return read_yuv<yuv_layout::half>(s, x);
+    if constexpr (Layout == chroma_in::full) return read_yuv<yuv_layout::full>(s, x);
+    if constexpr (Layout == chroma_in::pairs)
+        return how.v_first ? read_yuv<yuv_layout::vu>(s, x) : read_yuv<yuv_layout::uv>(s, x);
+    if constexpr (Layout == chroma_in::groups)
+        return how.luma_first ? read_yuv<yuv_layout::yuyv>(s, x) : read_yuv<yuv_layout::uyvy>(s, x);
+}
+
+template <chroma_in Layout, pixel_kind Kind>
+void any_to_rgb(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
+                uint8_t *dst, ptrdiff_t width) {
+    const yuv_samples s{y, u, v, width};
+    for (ptrdiff_t x = 0; x < width; x++)
+        write_pixel(Kind, how, dst + size_of(Kind) * x,
+                    from_yuv(how.weights, read_any<Layout>(how, s, x)));
+}
+
+template <chroma_in Layout, pixel_kind Kind>
+void any_to_rgb_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
+                     const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
+    any_to_rgb<Layout, Kind>(how, y0, u, v, dst0, width);
+    any_to_rgb<Layout, Kind>(how, y1, u, v, dst1, width);
+}
+
+// The channels of a pixel in the order of memory.
+struct channels {
+    int c[3];
+};
+template <rgb_in In>
+channels read_channels(const uint8_t *src, ptrdiff_t x) {
+    constexpr rgb_packing packing = In == rgb_in::words   ? rgb_packing::rgb565
+                                    : In == rgb_in::three ? rgb_packing::rgb888
+                                    : In == rgb_in::four  ? rgb_packing::rgba8888
+                                                          : rgb_packing::argb8888;
+    const rgb p = read_rgb<packing>(src, x);
+    return {{p.r, p.g, p.b}};
+}
+int dot(const int16_t (&w)[3], const channels &p) {
+    return w[0] * p.c[0] + w[1] * p.c[1] + w[2] * p.c[2];
+}
+uint8_t luma_of(const rgb_weights &w, const channels &p) {
+    return uint8_t((dot(w.y, p) >> 8) + w.black);
+}
+uint8_t chroma_of(const int16_t (&w)[3], const channels &p) {
+    return uint8_t(clamp(((dot(w, p) + 128) >> 8) + 128));
+}
+
+template <rgb_in In, chroma_out Out>
+void any_to_yuv(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
+                ptrdiff_t width) {
+    for (ptrdiff_t x = 0; x < width; x++) {
+        const channels p = read_channels<In>(src, x);
+        y[x] = luma_of(w, p);
+        if (Out == chroma_out::none || x & 1) continue;
+        const uint8_t of_u = chroma_of(w.u, p), of_v = chroma_of(w.v, p);
+        if (Out == chroma_out::half) {
+            u[x / 2] = of_u;
+            v[x / 2] = of_v;
+        } else {
+            u[x] = of_u;
+            u[x + 1] = of_v;
+        }
+    }
+}
+
+void chroma(const rgb_weights &w, const uint8_t *const of[3], uint8_t *u, uint8_t *v,
+            ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) {
+        const channels p{{of[0][x], of[1][x], of[2][x]}};
+        u[x] = chroma_of(w.u, p);
+        v[x] = chroma_of(w.v, p);
+    }
+}
+
+template <rgb_in In>
+void split_pixels(const uint8_t *src, uint8_t *const of[3], ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) {
+        const channels p = read_channels<In>(src, x);
+        for (int k = 0; k < 3; k++) of[k][x] = uint8_t(p.c[k]);
+    }
+}
+
+// Channels stand in the order of memory here: r for the first, b for the last.
+template <pixel_kind From, pixel_kind To>
+void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
+    const yuv_to_rgb how{{}, false, false, order.exchange, order.to_alpha_first};
+    for (ptrdiff_t x = 0; x < count; x++) {
+        const uint8_t *const p = src + size_of(From) * x;
+        const bool skip = From == pixel_kind::four && order.from_alpha_first;
+        const channels c = From == pixel_kind::words
+                               ? read_channels<rgb_in::words>(p, 0)
+                               : channels{{p[skip], p[skip + 1], p[skip + 2]}};
+        uint8_t *const q = dst + size_of(To) * x;
+        write_pixel(To, how, q, {c.c[0], c.c[1], c.c[2]});
+        if (From == pixel_kind::four && To == pixel_kind::four)
+            q[order.to_alpha_first ? 0 : 3] = p[order.from_alpha_first ? 0 : 3];
+    }
+}
+
+void split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
+                  bool luma_first) {
+    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
+    for (ptrdiff_t i = 0; i < pairs; i++) {
+        y[2 * i] = src[4 * i + luma];
+        y[2 * i + 1] = src[4 * i + luma + 2];
+        u[i] = src[4 * i + of_u];
+        v[i] = src[4 * i + of_u + 2];
+    }
+}
+void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                 ptrdiff_t pairs, bool luma_first) {
+    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
+    for (ptrdiff_t i = 0; i < pairs; i++) {
+        dst[4 * i + luma] = y[2 * i];
+        dst[4 * i + luma + 2] = y[2 * i + 1];
+        dst[4 * i + of_u] = u[i];
+        dst[4 * i + of_u + 2] = v[i];
+    }
+}
+
+void mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[x] + b[x] + 1) >> 1);
+}
+void mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + 1) >> 1);
+}
+void mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++)
+        dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1] + 2) >> 2);
+}
+void every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) dst[x] = a[2 * x];
+}
+void twice(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
+    for (ptrdiff_t x = 0; x < count; x++) dst[x] = a[x / 2];
+}
+
+template <chroma_in Layout, pixel_kind Kind>
+void fill_to_rgb(any_rows &t) {
+    const size_t l = size_t(Layout), k = size_t(Kind);
+    t.to_rgb[l][k] = any_to_rgb<Layout, Kind>;
+    t.to_rgb_pair[l][k] = any_to_rgb_pair<Layout, Kind>;
+}
+template <chroma_in Layout>
+void fill_from_yuv(any_rows &t) {
+    fill_to_rgb<Layout, pixel_kind::words>(t);
+    fill_to_rgb<Layout, pixel_kind::three>(t);
+    fill_to_rgb<Layout, pixel_kind::four>(t);
+}
+template <rgb_in In>
+void fill_from_rgb(any_rows &t) {
+    any_to_yuv_row **const to = t.to_yuv[size_t(In)];
+    to[size_t(chroma_out::none)] = any_to_yuv<In, chroma_out::none>;
+    to[size_t(chroma_out::half)] = any_to_yuv<In, chroma_out::half>;
+    to[size_t(chroma_out::pairs)] = any_to_yuv<In, chroma_out::pairs>;
+    t.split_pixels[size_t(In)] = split_pixels<In>;
+}
+template <pixel_kind From>
+void fill_repack(any_rows &t) {
+    repack_row **const to = t.repack[size_t(From)];
+    to[size_t(pixel_kind::words)] = repack<From, pixel_kind::words>;
+    to[size_t(pixel_kind::three)] = repack<From, pixel_kind::three>;
+    to[size_t(pixel_kind::four)] = repack<From, pixel_kind::four>;
+}
+
+}  // namespace
+
+void fill_any(any_rows &t) {
+    fill_from_yuv<chroma_in::half>(t);
+    fill_from_yuv<chroma_in::full>(t);
+    fill_from_yuv<chroma_in::pairs>(t);
+    fill_from_yuv<chroma_in::groups>(t);
+    fill_from_rgb<rgb_in::words>(t);
+    fill_from_rgb<rgb_in::three>(t);
+    fill_from_rgb<rgb_in::four>(t);
+    fill_from_rgb<rgb_in::four_alpha_first>(t);
+    t.chroma = chroma;
+    fill_repack<pixel_kind::words>(t);
+    fill_repack<pixel_kind::three>(t);
+    fill_repack<pixel_kind::four>(t);
+    t.split_groups = split_groups;
+    t.join_groups = join_groups;
+    t.mean_of_lines = mean_of_lines;
+    t.mean_of_pairs = mean_of_pairs;
+    t.mean_of_blocks = mean_of_blocks;
+    t.every_second = every_second;
+    t.twice = twice;
+}
+
+}  // namespace scalar
+
+namespace {
+
+// The matrices, by colour (ITU-R BT.601, BT.709, BT.2020).
+constexpr yuv_weights to_rgb_weights[] = {
+    {298, 16, 409, 100, 208, 516}, {256, 0, 359, 88, 183, 454},  //
+    {298, 16, 459, 55, 136, 541},  {256, 0, 403, 48, 120, 475},  //
+    {298, 16, 430, 48, 167, 548},  {256, 0, 378, 42, 146, 482},
+};
+constexpr rgb_weights to_yuv_weights[] = {
+    {{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16},
+    {{77, 150, 29}, {-43, -85, 128}, {128, -107, -21}, 0},
+    {{47, 157, 16}, {-26, -86, 112}, {112, -102, -10}, 16},
+    {{54, 184, 18}, {-29, -99, 128}, {128, -116, -12}, 0},
+    {{58, 149, 13}, {-31, -81, 112}, {112, -103, -9}, 16},
+    {{67, 174, 15}, {-36, -92, 128}, {128, -118, -10}, 0},
+};
+constexpr int32_t colours = int32_t(sizeof to_rgb_weights / sizeof *to_rgb_weights);
+
+// One call: the formats, the planes, the size.
+struct job {
+    const format &from, &to;
+    const simgp_img &src, &dst;
+    int32_t colour;
+    bool mean;
+    ptrdiff_t width, height;
+    const any_rows &rows;
+    const layout_rows &layout;
+
+    // Lines of pixels advance by whole pixels, but from linear YUV, as in the kernels.
+    const_lines in(int plane) const {
+        return whole_pixel_lines(const_lines{src.plane[plane], src.stride[plane]},
+                                 from.kind == format_kind::rgb ? from.bytes[0] : 1);
+    }
+    lines out(int plane) const {
+        const bool whole = to.kind == format_kind::rgb &&
+                           (from.kind == format_kind::rgb || from.kind == format_kind::tiled);
+        return whole_pixel_lines(lines{dst.plane[plane], dst.stride[plane]},
+                                 whole ? to.bytes[0] : 1);
+    }
+};
+
+// Two rows of a picture (or its last one, or one alone), and of these as many columns as a strip on
+// the stack has, or all. Strips begin and end with whole tiles.
+constexpr ptrdiff_t strip_width = 256;
+static_assert(strip_width % tile_width == 0);
+struct band {
+    ptrdiff_t x, y, width, rows;
+    ptrdiff_t pairs() const { return (width + 1) / 2; }
+};
+template <class F>
+void for_each_band(const job &j, ptrdiff_t width, ptrdiff_t rows, F f) {
+    for (ptrdiff_t y = 0; y < j.height; y += rows)
+        for (ptrdiff_t x = 0; x < j.width; x += width)
+            f(band{x, y, j.width - x < width ? j.width - x : width,
+                   j.height - y < rows ? j.height - y : rows});
+}
+
+constexpr bool is_rgb(const format &f) { return f.kind == format_kind::rgb; }
+constexpr bool has_pairs(const format &f) {
+    return f.layout == yuv_layout::uv || f.layout == yuv_layout::vu;
+}
+
+// How many pixels share a chroma sample across and down: shifts of 0 or 1. Grey has the chroma of
+// 4:2:0.
+struct sharing {
+    bool across, down;
+};
+constexpr sharing sharing_of(const format &f) {
+    if (f.kind == format_kind::packed) return {true, false};
+    if (f.u < 0) return {true, true};
+    return {f.x_shift[f.u] > 0, f.y_shift[f.u] > 0};
+}
+
+// The samples of a band in planes, of rows 0 and 1; chroma that is shared down has line 0 alone.
+struct planar_band {
+    const uint8_t *y[2], *u[2], *v[2];
+};
+// Room for them.
+struct yuv_strip {
+    uint8_t y[2][strip_width], u[2][strip_width], v[2][strip_width];
+};
+
+// YUV sources
+// -----------------------------------------------------------------------------------------------
+
+// Takes chroma pairs apart.
+void split_pairs(const job &j, bool v_first, const uint8_t *src, uint8_t *u, uint8_t *v,
+                 ptrdiff_t pairs) {
+    j.layout.unpack(src, v_first ? v : u, v_first ? u : v, pairs);
+}
+
+void read_groups(const job &j, const band &b, yuv_strip &s) {
+    const bool luma_first = j.from.layout == yuv_layout::yuyv;
+    for (ptrdiff_t r = 0; r < b.rows; r++) {
+        const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x;
+        const ptrdiff_t whole = b.width / 2;
+        if (whole) j.rows.split_groups(src, s.y[r], s.u[r], s.v[r], whole, luma_first);
+        if (!(b.width & 1)) continue;
+        // The V of a half group would lie behind the line.
+        const uint8_t *const group = src + 4 * whole;
+        s.y[r][2 * whole] = group[!luma_first];
+        s.u[r][whole] = group[luma_first];
+        s.v[r][whole] = b.x + whole ? group[luma_first - 2] : 128;
+    }
+}
+
+// Copies `width` bytes from byte x of a row of a tiled plane on; x is that of a tile.
+void copy_from_tiles(const uint8_t *plane, ptrdiff_t plane_width, ptrdiff_t plane_height,
+                     ptrdiff_t x, ptrdiff_t y, uint8_t *dst, ptrdiff_t width) {
+    for (ptrdiff_t i = 0; i < width; i += tile_width)
+        memcpy(dst + i, plane + tile_offset(plane_width, plane_height, x + i, y),
+               size_t(width - i < tile_width ? width - i : tile_width));
+}
+void copy_to_tiles(const uint8_t *src, uint8_t *plane, ptrdiff_t plane_width,
+                   ptrdiff_t plane_height, ptrdiff_t x, ptrdiff_t y, ptrdiff_t width) {
+    for (ptrdiff_t i = 0; i < width; i += tile_width)
+        memcpy(plane + tile_offset(plane_width, plane_height, x + i, y), src + i,
+               size_t(width - i < tile_width ? width - i : tile_width));
+}
+
+void read_tiles(const job &j, const band &b, yuv_strip &s) {
+    for (ptrdiff_t r = 0; r < b.rows; r++)
+        copy_from_tiles(j.src.plane[0], j.width, j.height, b.x, b.y + r, s.y[r], b.width);
+    // The last row of an odd height may ask for a row of chroma that has no tile.
+    const ptrdiff_t height = j.height >> 1, tile_rows = (height + tile_height - 1) / tile_height;
+    const ptrdiff_t row = b.y / 2 / tile_height < tile_rows ? b.y / 2 : height - 1;
+    if (row < 0) {
+        memset(s.u[0], 128, size_t(b.pairs()));
+        memset(s.v[0], 128, size_t(b.pairs()));
+        return;
+    }
+    uint8_t pairs[strip_width];
+    copy_from_tiles(j.src.plane[1], j.width, height, b.x, row, pairs, 2 * b.pairs());
+    split_pairs(j, false, pairs, s.u[0], s.v[0], b.pairs());
+}
+
+// The samples of a band: where they lie in the source, or in the strip.
+planar_band read_band(const job &j, const band &b, yuv_strip &s) {
+    planar_band p{{s.y[0], s.y[1]}, {s.u[0], s.u[1]}, {s.v[0], s.v[1]}};
+    if (j.from.kind == format_kind::packed) {
+        read_groups(j, b, s);
+        return p;
+    }
+    if (j.from.kind == format_kind::tiled) {
+        read_tiles(j, b, s);
+        return p;
+    }
+    for (ptrdiff_t r = 0; r < b.rows; r++) p.y[r] = j.in(0).line(b.y + r) + b.x;
+    if (j.from.u < 0) {
+        memset(s.u[0], 128, size_t(b.pairs()));
+        p.v[0] = s.u[0];
+    } else if (has_pairs(j.from)) {
+        split_pairs(j, j.from.layout == yuv_layout::vu, j.in(1).line(b.y >> 1) + b.x, s.u[0],
+                    s.v[0], b.pairs());
+    } else {
+        const sharing shared = sharing_of(j.from);
+        for (ptrdiff_t r = 0; r < (shared.down ? 1 : b.rows); r++) {
+            const ptrdiff_t line = (b.y + r) >> shared.down, x = b.x >> shared.across;
+            p.u[r] = j.in(j.from.u).line(line) + x;
+            p.v[r] = j.in(j.from.v).line(line) + x;
+        }
+    }
+    return p;
+}
+
+// YUV destinations
+// ------------------------------------------------------------------------------------------
+
+// A line of chroma of the destination, for `width` pixels, from one or two lines (b may be null) of
+// the source. Averages the lines if there are two, and drops or repeats or averages samples. The
+// result lies in the source or in `room`.
+const uint8_t *chroma_line(const job &j, bool from_across, bool to_across, const uint8_t *a,
+                           const uint8_t *b, uint8_t *room, ptrdiff_t width) {
+    const ptrdiff_t count = (width + to_across) >> to_across;
+    if (from_across == to_across) {
+        if (!b) return a;
+        j.rows.mean_of_lines(a, b, room, count);
+    } else if (from_across) {
+        uint8_t means[strip_width / 2];
+        if (b) j.rows.mean_of_lines(a, b, means, (width + 1) / 2);
+        j.rows.twice(b ? means : a, room, count);
+    } else if (!j.mean) {
+        j.rows.every_second(a, room, count);
+    } else {
+        const ptrdiff_t whole = width / 2;
+        if (whole) (b ? j.rows.mean_of_blocks : j.rows.mean_of_pairs)(a, b, room, whole);
+        if (whole < count)  // of the last pixels across
+            room[whole] = b ? uint8_t((a[width - 1] + b[width - 1] + 1) >> 1) : a[width - 1];
+    }
+    return room;
+}
+
+// Whether a sample of the destination stands for more pixels than one of the source.
+bool averages(const job &j) {
+    const sharing from = is_rgb(j.from) ? sharing{false, false} : sharing_of(j.from);
+    const sharing to = sharing_of(j.to);
+    return j.mean && j.to.u >= 0 && ((to.across && !from.across) || (to.down && !from.down));
+}
+
+void copy_line(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
+    if (src != dst) memcpy(dst, src, size_t(width));
+}
+
+// Where the samples of a band belong in the destination, as far as it has planes for them; else in
+// the strip, from where finish_band brings them to their places.
+struct target_band {
+    uint8_t *y[2], *u[2], *v[2];
+};
+target_band place_band(const job &j, const band &b, yuv_strip &s) {
+    target_band t{{s.y[0], s.y[1]}, {s.u[0], s.u[1]}, {s.v[0], s.v[1]}};
+    if (j.to.kind != format_kind::planar) return t;
+    for (ptrdiff_t r = 0; r < b.rows; r++) t.y[r] = j.out(0).line(b.y + r) + b.x;
+    if (j.to.u < 0 || has_pairs(j.to)) return t;
+    const sharing shared = sharing_of(j.to);
+    for (ptrdiff_t r = 0; r < (shared.down ? 1 : b.rows); r++) {
+        const ptrdiff_t line = (b.y + r) >> shared.down, x = b.x >> shared.across;
+        t.u[r] = j.out(j.to.u).line(line) + x;
+        t.v[r] = j.out(j.to.v).line(line) + x;
+    }
+    return t;
+}
+
+void write_groups(const job &j, const band &b, const planar_band &p) {
+    const bool luma_first = j.to.layout == yuv_layout::yuyv;
+    for (ptrdiff_t r = 0; r < b.rows; r++) {
+        uint8_t *const dst = j.out(0).line(b.y + r) + 2 * b.x;
+        const ptrdiff_t whole = b.width / 2;
+        if (whole) j.rows.join_groups(p.y[r], p.u[r], p.v[r], dst, whole, luma_first);
+        if (!(b.width & 1)) continue;
+        uint8_t *const group = dst + 4 * whole;
+        group[!luma_first] = p.y[r][2 * whole];
+        group[luma_first] = p.u[r][whole];
+    }
+}
+
+void write_pairs(const job &j, const planar_band &p, uint8_t *dst, ptrdiff_t pairs) {
+    const bool v_first = j.to.layout == yuv_layout::vu;
+    j.layout.pack(v_first ? p.v[0] : p.u[0], v_first ? p.u[0] : p.v[0], dst, pairs);
+}
+
+// Brings the samples of a band, which are as many as the destination has, from where they are to
+// their places.
+void finish_band(const job &j, const band &b, const planar_band &p, const target_band &t) {
+    if (j.to.kind == format_kind::packed) return write_groups(j, b, p);
+    if (j.to.kind == format_kind::tiled) {
+        for (ptrdiff_t r = 0; r < b.rows; r++)
+            copy_to_tiles(p.y[r], j.dst.plane[0], j.width, j.height, b.x, b.y + r, b.width);
+        if (b.rows < 2) return;
+        uint8_t pairs[strip_width];
+        write_pairs(j, p, pairs, b.pairs());
+        copy_to_tiles(pairs, j.dst.plane[1], j.width, j.height >> 1, b.x, b.y >> 1, 2 * b.pairs());
+        return;
+    }
+    for (ptrdiff_t r = 0; r < b.rows; r++) copy_line(p.y[r], t.y[r], b.width);
+    if (j.to.u < 0) return;
+    if (has_pairs(j.to)) return write_pairs(j, p, j.out(1).line(b.y >> 1) + b.x, b.pairs());
+    const sharing shared = sharing_of(j.to);
+    const ptrdiff_t count = (b.width + shared.across) >> shared.across;
+    for (ptrdiff_t r = 0; r < (shared.down ? 1 : b.rows); r++) {
+        copy_line(p.u[r], t.u[r], count);
+        copy_line(p.v[r], t.v[r], count);
+    }
+}
+
+// From packed 4:2:2 to the chroma of every second row, straight to its place: to planes, or to pairs
+// U V. Bytes of chroma that are not wanted end in a strip that stays in the cache.
+bool has_way_from_groups(const job &j) {
+    return j.from.kind == format_kind::packed && j.to.kind == format_kind::planar &&
+           (j.to.layout == yuv_layout::uv || j.to.layout == yuv_layout::half) &&
+           sharing_of(j.to).down && !averages(j);
+}
+void groups_to_every_second_row(const job &j) {
+    constexpr ptrdiff_t width = 4 * strip_width;
+    const bool luma_first = j.from.layout == yuv_layout::yuyv, pairs = has_pairs(j.to);
+    for_each_band(j, width, 2, [&](const band &b) {
+        uint8_t unwanted[width];
+        const ptrdiff_t whole = b.width & ~ptrdiff_t(1), line = b.y >> 1;
+        for (ptrdiff_t r = 0; r < b.rows; r++) {
+            const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x, *const last =
+                                                                            src + 2 * whole;
+            uint8_t *const y = j.out(0).line(b.y + r) + b.x;
+            uint8_t *const u = j.out(j.to.u).line(line) + (pairs ? b.x : b.x / 2);
+            uint8_t *const v = pairs ? u + 1 : j.out(j.to.v).line(line) + b.x / 2;
+            if (whole && !r && !pairs) {
+                j.rows.split_groups(src, y, u, v, whole / 2, luma_first);
+            } else if (whole) {
+                uint8_t *const chroma = r ? unwanted : u;
+                j.layout.unpack(src, luma_first ? y : chroma, luma_first ? chroma : y, whole);
+            }
+            if (whole == b.width) continue;
+            y[whole] = last[!luma_first];
+            if (r) continue;
+            const ptrdiff_t at = pairs ? whole : whole / 2;
+            u[at] = last[luma_first];
+            v[at] = b.x + whole ? last[luma_first - 2] : 128;
+        }
+    });
+}
+
+void yuv_to_yuv(const job &j) {
+    if (has_way_from_groups(j)) return groups_to_every_second_row(j);
+    const sharing from = sharing_of(j.from), to = sharing_of(j.to);
+    for_each_band(j, strip_width, 2, [&](const band &b) {
+        yuv_strip read, resampled;
+        planar_band p = read_band(j, b, read);
+        const target_band t = place_band(j, b, resampled);
+        if (j.to.u >= 0) {
+            const bool two = j.mean && to.down && !from.down && b.rows == 2;
+            planar_band q = p;
+            for (int r = 0; r < (to.down ? 1 : b.rows); r++) {
+                const int line = from.down ? 0 : r;
+                q.u[r] = chroma_line(j, from.across, to.across, p.u[line], two ? p.u[1] : nullptr,
+                                     t.u[r], b.width);
+                q.v[r] = chroma_line(j, from.across, to.across, p.v[line], two ? p.v[1] : nullptr,
+                                     t.v[r], b.width);
+            }
+            p = q;
+        }
+        finish_band(j, b, p, t);
+    });
+}
+
+// YUV to RGB
+// ------------------------------------------------------------------------------------------------
+
+chroma_in chroma_in_of(const format &f) {
+    if (f.kind == format_kind::packed) return chroma_in::groups;
+    if (has_pairs(f) && f.kind == format_kind::planar) return chroma_in::pairs;
+    return f.layout == yuv_layout::full ? chroma_in::full : chroma_in::half;
+}
+
+void yuv_to_rgb_pictures(const job &j) {
+    const yuv_to_rgb how{to_rgb_weights[j.colour], j.from.layout == yuv_layout::vu,
+                         j.from.layout == yuv_layout::yuyv, is_blue_first(j.to.packing),
+                         is_alpha_first(j.to.packing)};
+    const size_t in = size_t(chroma_in_of(j.from)), kind = size_t(kind_of(j.to.packing));
+    any_to_rgb_row *const row = j.rows.to_rgb[in][kind];
+    any_to_rgb_row_pair *const row_pair = j.rows.to_rgb_pair[in][kind];
+    const bool shared_down = sharing_of(j.from).down;
+    // Rows read what lies in linear planes, whole lines of it.
+    const bool direct = j.from.kind != format_kind::tiled && j.from.u >= 0;
+    const bool pairs = has_pairs(j.from);
+    for_each_band(j, direct ? j.width : strip_width, 2, [&](const band &b) {
+        yuv_strip strip;
+        planar_band p{};
+        if (!direct || !(pairs || j.from.kind == format_kind::packed)) {
+            p = read_band(j, b, strip);
+        } else {
+            for (ptrdiff_t r = 0; r < b.rows; r++) p.y[r] = j.in(0).line(b.y + r);
+            if (pairs) p.u[0] = j.in(1).line(b.y >> 1);
+        }
+        uint8_t *dst[2];
+        for (ptrdiff_t r = 0; r < 2; r++)
+            dst[r] = j.out(0).line(b.y + (r < b.rows ? r : 0)) + b.x * j.to.bytes[0];
+        if (shared_down && b.rows == 2)
+            return row_pair(how, p.y[0], p.y[1], p.u[0], p.v[0], dst[0], dst[1], b.width);
+        for (ptrdiff_t r = 0; r < b.rows; r++) row(how, p.y[r], p.u[r], p.v[r], dst[r], b.width);
+    });
+}
+
+// RGB
+// ------------------------------------------------------------------------------------------------
+
+// Planes of the channels of a strip, in the order of memory.
+struct rgb_strip {
+    uint8_t c[3][strip_width];
+};
+void split_pixels(const job &j, const uint8_t *src, rgb_strip &s, ptrdiff_t width) {
+    uint8_t *const channels[] = {s.c[0], s.c[1], s.c[2]};
+    j.rows.split_pixels[size_t(rgb_in_of(j.from.packing))](src, channels, width);
+}
+
+template <class T>
+void exchange(T &a, T &b) {
+    const T was_a = a;
+    a = b;
+    b = was_a;
+}
+rgb_weights in_memory_order(rgb_weights w, rgb_packing packing) {
+    if (!is_blue_first(packing)) return w;
+    exchange(w.y[0], w.y[2]);
+    exchange(w.u[0], w.u[2]);
+    exchange(w.v[0], w.v[2]);
+    return w;
+}
+
+// The chroma of a line of the destination from one or two lines of RGB: where samples stand for
+// several pixels, of their mean; for every pixel else.
+void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, const uint8_t *b,
+                      bool across, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    rgb_strip of_a, of_b, means;
+    const uint8_t *channels[3];
+    split_pixels(j, a, of_a, width);
+    if (b) split_pixels(j, b, of_b, width);
+    for (int k = 0; k < 3; k++)
+        channels[k] =
+            chroma_line(j, false, across, of_a.c[k], b ? of_b.c[k] : nullptr, means.c[k], width);
+    j.rows.chroma(w, channels, u, v, (width + across) >> across);
+}
+
+void rgb_to_yuv_pictures(const job &j) {
+    rgb_weights w = in_memory_order(to_yuv_weights[j.colour], j.from.packing);
+    any_to_yuv_row *const *const rows = j.rows.to_yuv[size_t(rgb_in_of(j.from.packing))];
+    any_to_yuv_row *const luma = rows[size_t(chroma_out::none)];
+    const sharing to = sharing_of(j.to);
+    // Rows give the chroma of every second pixel; pairs of theirs need no strip.
+    const bool by_rows = j.to.u >= 0 && to.across && !averages(j);
+    const bool pairs = by_rows && j.to.kind == format_kind::planar && has_pairs(j.to);
+    const bool direct = by_rows ? pairs || j.to.kind == format_kind::planar : j.to.u < 0;
+    if (pairs && j.to.layout == yuv_layout::vu)
+        for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
+    any_to_yuv_row *const with_chroma =
+        !by_rows ? luma : rows[size_t(pairs ? chroma_out::pairs : chroma_out::half)];
+    for_each_band(j, direct ? j.width : strip_width, 2, [&](const band &b) {
+        yuv_strip strip;
+        target_band t = place_band(j, b, strip);
+        if (pairs) t.u[0] = j.out(1).line(b.y >> 1) + b.x;
+        const auto line = [&](ptrdiff_t r) {
+            return j.in(0).line(b.y + r) + b.x * j.from.bytes[0];
+        };
+        for (ptrdiff_t r = 0; r < b.rows; r++) {
+            const bool chroma = !(to.down && r);
+            (chroma ? with_chroma : luma)(w, line(r), t.y[r], t.u[r], t.v[r], b.width);
+            if (!chroma || by_rows || j.to.u < 0) continue;
+            const bool two = averages(j) && to.down && b.rows == 2;
+            chroma_of_pixels(j, w, line(r), two ? line(1) : nullptr, to.across, t.u[r], t.v[r],
+                             b.width);
+        }
+        if (direct) return;
+        finish_band(j, b, {{t.y[0], t.y[1]}, {t.u[0], t.u[1]}, {t.v[0], t.v[1]}}, t);
+    });
+}
+
+void rgb_to_rgb(const job &j) {
+    const repacking order{is_blue_first(j.from.packing) != is_blue_first(j.to.packing),
+                          is_alpha_first(j.from.packing), is_alpha_first(j.to.packing)};
+    repack_row *const row =
+        j.rows.repack[size_t(kind_of(j.from.packing))][size_t(kind_of(j.to.packing))];
+    const const_lines in = j.in(0);
+    const lines out = j.out(0);
+    if (in.stride == j.width * j.from.bytes[0] && out.stride == j.width * j.to.bytes[0])
+        return row(order, in.first, out.first, j.width * j.height);
+    for (ptrdiff_t y = 0; y < j.height; y++) row(order, in.line(y), out.line(y), j.width);
+}
+
+// Equal formats.
+void copy_picture(const job &j) {
+    if (j.from.kind == format_kind::tiled) return yuv_to_yuv(j);
+    for (int k = 0; k < j.from.planes; k++) {
+        const ptrdiff_t width = (j.width + j.from.x_shift[k]) >> j.from.x_shift[k];
+        const ptrdiff_t height = (j.height + j.from.y_shift[k]) >> j.from.y_shift[k];
+        copy_lines(j.in(k), j.out(k), width * j.from.bytes[k], height);
+    }
+}
+
+}  // namespace
+}  // namespace simgp
+
+using namespace simgp;
+
+int32_t simgp_csc_any(const simgp_img *src, const simgp_img *dst, int32_t colour) {
+    const format *const from = find_format(src->format), *const to = find_format(dst->format);
+    const bool mean = colour & SIMGP_CHROMA_MEAN;
+    const int32_t matrix = colour & ~SIMGP_CHROMA_MEAN;
+    if (!from || !to || matrix < 0 || matrix >= colours) return SIMGP_ERR_PARAM;
+    const ptrdiff_t width = src->width[0], height = src->height[0];
+    if (width < 1 || height < 1) return SIMGP_OK;
+    if (colour == SIMGP_COLOUR_BT601 && simgp_csc(src, dst) == SIMGP_OK) return SIMGP_OK;
+
+    const row_table &live = live_rows();
+    const job j{*from, *to, *src, *dst, matrix, mean, width, height, live.any, live.layout};
+    if (from == to)
+        copy_picture(j);
+    else if (is_rgb(*from))
+        is_rgb(*to) ? rgb_to_rgb(j) : rgb_to_yuv_pictures(j);
+    else
+        is_rgb(*to) ? yuv_to_rgb_pictures(j) : yuv_to_yuv(j);
+    return SIMGP_OK;
+}

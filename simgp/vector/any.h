@@ -1,0 +1,614 @@
+// Rows between any two formats, with weights that are known at run time.
+//
+// YUV to RGB is computed at half scale, 7 fractional bits, as in matrix.h. With L, KR, KGU, KGV and
+// KB the weights, `offset` 3248 in the limited ranges (L = 298) and 0 in the full ones (L = 256),
+// and the rounding constant 64:
+//
+//   luma   L / 2 (Y - black) - offset                limited -5632 ... 32363, full 0 ... 32640
+//   r      floor(KR Vc / 2) + 64 + offset            at most 459 127 / 2 + 3312 = 32458
+//   g      floor(-(KGU Uc + KGV Vc) / 2) + 64 + offset
+//                                                    at most 154 128 + 3312 = 23024
+//   b1     KB1 / 2 Uc                                -17536 ... 17399, KB1 = KB / 2 rounded down to even
+//   b2     floor(KB2 Uc / 2) + 64 + offset           KB2 = KB - KB1, at most 138 127 + 3312
+//
+// L is even, and of the factors of a sum at most one is odd, so that half of the whole sum, rounded
+// down, is the sum of these, and the final shift, which rounds down as well, cannot tell it from the
+// exact half. Products of samples, not of Uc and Vc, are computed, modulo 2^16: what they have too
+// much goes into the constants. Green's two become one with a mean that rounds up,
+// -ceil((KGU U + KGV V) / 2).
+//
+// The sums with luma saturate. Above 32767 the channel is 255 anyhow, below -32768 it is 0. Blue
+// adds b1 first: luma + b1 never falls below -5632 - 17536, and where it rises above 32767, Uc and
+// with it b2 is positive and keeps it there. 256 Uc and the rest would do so only with KB >= 512.
+#ifndef SIMGP_VECTOR_ANY_H
+#define SIMGP_VECTOR_ANY_H
+
+#include <string.h>
+
+#include "rows/any.h"
+#include "simgp/vector/packer.h"
+#include "simgp/vector/source.h"
+#include "simgp/vector/steps.h"
+
+namespace simgp::SIMD_TARGET {
+
+// YUV to RGB
+// ------------------------------------------------------------------------------------------------
+
+struct any_terms {
+    s16v r, g, b1, b2;
+};
+struct any_rgb {
+    s16v first, g, last;
+};
+
+struct any_matrix {
+    u16v luma, green_u, green_v, blue1;
+    half_factor red, blue2;
+    s16v luma_c, red_c, green_c, blue1_c, blue2_c;
+    bool blue_first, alpha_first;
+
+    static s16v constant(int c) { return as_s16(set_u16(static_cast<uint16_t>(c))); }
+    static u16v factor(int k) { return set_u16(static_cast<uint16_t>(k)); }
+
+    explicit any_matrix(const yuv_to_rgb &how) {
+        const yuv_weights &w = how.weights;
+        const int offset = w.black ? 3248 : 0, bias = offset + 64;
+        const int of_blue1 = w.blue / 4 * 2, of_blue2 = w.blue - of_blue1;
+        luma = factor(w.luma / 2);
+        luma_c = constant(-w.luma / 2 * w.black - offset);
+        red = set_half_factor(w.red);
+        red_c = constant(bias - 64 * w.red);
+        green_u = factor(w.green_u);
+        green_v = factor(w.green_v);
+        green_c = constant(bias + 64 * (w.green_u + w.green_v));
+        blue1 = factor(of_blue1 / 2);
+        blue1_c = constant(-64 * of_blue1);
+        blue2 = set_half_factor(of_blue2);
+        blue2_c = constant(bias - 64 * of_blue2);
+        blue_first = how.blue_first;
+        alpha_first = how.alpha_first;
+    }
+
+    any_terms terms(u16v u, u16v v) const {
+        return {add(as_s16(half_product(v, red)), red_c),
+                sub(green_c, as_s16(avg_u16(mul(u, green_u), mul(v, green_v)))),
+                add(as_s16(mul(u, blue1)), blue1_c), add(as_s16(half_product(u, blue2)), blue2_c)};
+    }
+    any_rgb apply(u16v y, const any_terms &c) const {
+        const s16v l = add(as_s16(mul(y, luma)), luma_c);
+        const s16v r = add_sat(l, c.r), b = add_sat(add_sat(l, c.b1), c.b2);
+        any_rgb p{r, add_sat(l, c.g), b};
+        if (blue_first) p.first = b, p.last = r;
+        return p;
+    }
+};
+
+template <pixel_kind>
+struct any_packer;
+template <>
+struct any_packer<pixel_kind::words> {
+    static constexpr pixel_order order = pixel_order::by8;
+    static constexpr int size = 2;
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool) {
+        store_zip16(dst, pack565(even.first, even.g, even.last),
+                    pack565(odd.first, odd.g, odd.last));
+    }
+};
+template <>
+struct any_packer<pixel_kind::three> {
+    static constexpr pixel_order order = pixel_order::natural;
+    static constexpr int size = 3;
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool) {
+        store_narrow_zip3<7, 7, 7>(dst, even.first, odd.first, even.g, odd.g, even.last, odd.last);
+    }
+};
+template <>
+struct any_packer<pixel_kind::four> {
+    static constexpr pixel_order order = pixel_order::by4;
+    static constexpr int size = 4;
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool alpha_first) {
+        const u8v first = narrow_join<7>(even.first, odd.first), g = narrow_join<7>(even.g, odd.g),
+                  last = narrow_join<7>(even.last, odd.last), a = set_u8(255);
+        if (alpha_first)
+            store_zip4(dst, a, first, g, last);
+        else
+            store_zip4(dst, first, g, last, a);
+    }
+};
+
+// Chroma of the even and of the odd pixels; the same where they share it.
+struct any_chroma {
+    u16v u, v;
+};
+
+template <chroma_in>
+struct any_source;
+template <>
+struct any_source<chroma_in::half> : source<yuv_layout::half> {
+    explicit any_source(const yuv_to_rgb &) {}
+    static any_chroma chroma(u8v pairs) { return {even(pairs), odd(pairs)}; }
+};
+template <>
+struct any_source<chroma_in::full> : source<yuv_layout::full> {
+    explicit any_source(const yuv_to_rgb &) {}
+    static any_chroma chroma(u8v pairs) { return {even(pairs), odd(pairs)}; }
+};
+template <>
+struct any_source<chroma_in::pairs> : source<yuv_layout::uv> {
+    bool v_first;
+    explicit any_source(const yuv_to_rgb &how) : v_first(how.v_first) {}
+    any_chroma chroma(u8v from) const {
+        any_chroma c{even(from), odd(from)};
+        if (v_first) c = {c.v, c.u};
+        return c;
+    }
+};
+template <>
+struct any_source<chroma_in::groups> {
+    static constexpr bool pixels_in_pairs = true;
+    bool luma_first;
+    explicit any_source(const yuv_to_rgb &how) : luma_first(how.luma_first) {}
+    static any_chroma chroma(u8v pairs) { return {even(pairs), odd(pairs)}; }
+
+    template <pixel_order Order>
+    yuv_half load(const samples &s, ptrdiff_t x) const {
+        yuv_half p = source<yuv_layout::yuyv>::load<Order>(s, x);
+        if (!luma_first) p = {p.pairs, p.y};
+        return p;
+    }
+    void stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
+        if (luma_first)
+            source<yuv_layout::yuyv>::stage(to, s, x, count);
+        else
+            source<yuv_layout::uyvy>::stage(to, s, x, count);
+    }
+};
+
+template <chroma_in In, pixel_kind Kind>
+static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
+                    uint8_t *dst, ptrdiff_t width);
+template <chroma_in In, pixel_kind Kind>
+static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
+                         const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
+                         ptrdiff_t width);
+
+// Less than a vector goes through the stack, by the row for one.
+template <chroma_in In, pixel_kind Kind>
+[[gnu::noinline]] static void any_part(const yuv_to_rgb &how, const samples &in, uint8_t *dst,
+                                       ptrdiff_t x, int count) {
+    constexpr int size = any_packer<Kind>::size;
+    staged to;
+    uint8_t pixels[bytes * size];
+    any_source<In>(how).stage(to, in, x, count);
+    if constexpr (In == chroma_in::pairs)
+        any_row_pair<In, Kind>(how, to.y, to.y, to.u, to.v, pixels, pixels, bytes);
+    else
+        any_row<In, Kind>(how, to.y, to.u, to.v, pixels, bytes);
+    memcpy(dst + x * size, pixels, size_t(count) * size);
+}
+
+template <chroma_in In, pixel_kind Kind>
+static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
+                    uint8_t *dst, ptrdiff_t width) {
+    using to = any_packer<Kind>;
+    const any_matrix m(how);
+    const any_source<In> from(how);
+    const samples in{y, u, v};
+    const auto write_half = [&](ptrdiff_t x, const yuv_half &p) {
+        const any_chroma c = from.chroma(p.pairs);
+        const any_terms t = m.terms(c.u, c.v);
+        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.alpha_first);
+    };
+    const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
+        const auto half = [&](u16v luma, u8v pairs) {
+            return m.apply(luma, m.terms(even(pairs), odd(pairs)));
+        };
+        to::store(dst + x * to::size, half(even(p.y), p.pairs_even), half(odd(p.y), p.pairs_odd),
+                  m.alpha_first);
+    };
+    const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
+    const auto part = [&](ptrdiff_t x, int count) { any_part<In, Kind>(how, in, dst, x, count); };
+    if constexpr (In == chroma_in::full)
+        row_of_steps<false>(width, load, write_full, part);
+    else
+        row_of_steps<true>(width, load, write_half, part);
+}
+
+template <chroma_in In, pixel_kind Kind>
+static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
+                         const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
+                         ptrdiff_t width) {
+    using to = any_packer<Kind>;
+    struct pixels_pair {
+        yuv_half first;
+        u8v second_y;
+    };
+    const any_matrix m(how);
+    const any_source<In> from(how);
+    const samples in{y0, u, v};
+    row_of_steps<true>(
+        width,
+        [&](ptrdiff_t x) {
+            return pixels_pair{from.template load<to::order>(in, x), load_luma<to::order>(y1, x)};
+        },
+        [&](ptrdiff_t x, const pixels_pair &p) {
+            const any_chroma c = from.chroma(p.first.pairs);
+            const any_terms t = m.terms(c.u, c.v);
+            to::store(dst0 + x * to::size, m.apply(even(p.first.y), t), m.apply(odd(p.first.y), t),
+                      m.alpha_first);
+            to::store(dst1 + x * to::size, m.apply(even(p.second_y), t),
+                      m.apply(odd(p.second_y), t), m.alpha_first);
+        },
+        [&](ptrdiff_t x, int count) {
+            any_part<In, Kind>(how, in, dst0, x, count);
+            any_part<In, Kind>(how, {y1, u, v}, dst1, x, count);
+        });
+}
+
+// Rows for one of what rows for two do, and the other way round.
+template <chroma_in In, pixel_kind Kind>
+static void any_row_of_pair(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u,
+                            const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
+    any_row_pair<In, Kind>(how, y, y, u, v, dst, dst, width);
+}
+template <chroma_in In, pixel_kind Kind>
+static void any_pair_of_rows(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
+                             const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
+                             ptrdiff_t width) {
+    any_row<In, Kind>(how, y0, u, v, dst0, width);
+    any_row<In, Kind>(how, y1, u, v, dst1, width);
+}
+
+// RGB to YUV
+// ------------------------------------------------------------------------------------------------
+
+// Luma's sum, at most 256 255, fits 16 bits, unsigned. Chroma's lies in -32640 ... 32640. It is
+// computed with negative factors, since 128 fits no signed byte but -128 does, and taken from the
+// rounding constant: 128 + 32640 saturates to 32767, of which the sample is 255, as it should be.
+// With the sign inverted, which adds 32768, the high byte of a lane is the sample.
+struct any_yuv_matrix {
+    channel_factors y, u, v;
+    u8v black, sign;
+    s16v half;
+
+    explicit any_yuv_matrix(const rgb_weights &w)
+        : y(set_channel_factors(w.y[0], w.y[1], w.y[2])),
+          u(set_channel_factors(-w.u[0], -w.u[1], -w.u[2])),
+          v(set_channel_factors(-w.v[0], -w.v[1], -w.v[2])),
+          black(set_u8(w.black)),
+          sign(set_u8(128)),
+          half(as_s16(set_u16(128))) {}
+
+    u8v luma(rgb_v p) const { return add_u8(dot_high(p, y), black); }
+    // High bytes.
+    u16v chroma(rgb_v p, const channel_factors &f) const {
+        return as_u16(bit_xor(as_u8(as_u16(sub_sat(half, even_dot(p, f)))), sign));
+    }
+};
+
+template <rgb_in In>
+inline constexpr int size_in = In == rgb_in::words   ? 2
+                               : In == rgb_in::three ? 3
+                                                     : 4;
+template <rgb_in In>
+inline rgb_v load_pixels(const uint8_t *p) {
+    if constexpr (In == rgb_in::words) return load_565(p);
+    if constexpr (In == rgb_in::three) return load_888(p);
+    if constexpr (In == rgb_in::four) return load_8888<0>(p);
+    if constexpr (In == rgb_in::four_alpha_first) return load_8888<1>(p);
+}
+
+template <rgb_in In, chroma_out Out>
+static void any_yuv_row(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
+                        uint8_t *v, ptrdiff_t width) {
+    constexpr int size = size_in<In>, chroma_size = Out == chroma_out::pairs ? 2 : 1;
+    const any_yuv_matrix m(w);
+    row_of_steps<Out != chroma_out::none>(
+        width, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
+        [&](ptrdiff_t x, rgb_v p) {
+            store(y + x, m.luma(p));
+            if constexpr (Out == chroma_out::none) return;
+            const u16v of_u = m.chroma(p, m.u), of_v = m.chroma(p, m.v);
+            if constexpr (Out == chroma_out::half) {
+                store_high(u + x / 2, of_u);
+                store_high(v + x / 2, of_v);
+            } else if constexpr (Out == chroma_out::pairs) {
+                store(u + x, join_high(of_u, of_v));
+            }
+        },
+        [&](ptrdiff_t x, int count) {
+            uint8_t pixels[bytes * size] = {}, to_y[bytes], to_u[bytes], to_v[bytes];
+            memcpy(pixels, src + size * x, size_t(count) * size);
+            any_yuv_row<In, Out>(w, pixels, to_y, to_u, to_v, bytes);
+            memcpy(y + x, to_y, size_t(count));
+            if (Out == chroma_out::none) return;
+            const size_t samples = size_t(count + 1) / 2;
+            memcpy(u + chroma_size * (x / 2), to_u, chroma_size * samples);
+            if (Out == chroma_out::half) memcpy(v + x / 2, to_v, samples);
+        });
+}
+
+// Samples in steps of `Step`: vector(x) does so many of them from x on, one(x) one. The last step
+// ends at the last sample and may do some again.
+template <int Step = bytes, class Vector, class One>
+inline void in_steps(ptrdiff_t count, Vector vector, One one) {
+    if (count < Step) {
+        for (ptrdiff_t x = 0; x < count; x++) one(x);
+        return;
+    }
+    for (ptrdiff_t x = 0; x + Step < count; x += Step) vector(x);
+    vector(count - Step);
+}
+
+static void any_chroma_row(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
+                           uint8_t *v, ptrdiff_t count) {
+    const auto plane = [&](const int16_t(&of)[3], uint8_t *dst) {
+        u16v f[3];
+        for (int k = 0; k < 3; k++) f[k] = set_u16(static_cast<uint16_t>(of[k]));
+        const s16v half = as_s16(set_u16(128));
+        const u8v sign = set_u8(128);
+        in_steps(
+            count,
+            [&](ptrdiff_t x) {
+                const u8v c[3] = {load(channels[0] + x), load(channels[1] + x),
+                                  load(channels[2] + x)};
+                const auto high = [&](u16v c0, u16v c1, u16v c2) {
+                    const s16v sum = add(add(as_s16(mul(c0, f[0])), as_s16(mul(c1, f[1]))),
+                                         as_s16(mul(c2, f[2])));
+                    return as_u16(add_sat(sum, half));
+                };
+                store(dst + x, bit_xor(join_high(high(even(c[0]), even(c[1]), even(c[2])),
+                                                 high(odd(c[0]), odd(c[1]), odd(c[2]))),
+                                       sign));
+            },
+            [&](ptrdiff_t x) {
+                const int sum = (of[0] * channels[0][x] + of[1] * channels[1][x] +
+                                 of[2] * channels[2][x] + 128) >>
+                                8;
+                dst[x] = static_cast<uint8_t>(sum > 127 ? 255 : sum + 128);
+            });
+    };
+    plane(w.u, u);
+    plane(w.v, v);
+}
+
+// RGB to RGB
+// ------------------------------------------------------------------------------------------------
+
+template <rgb_in In>
+static void split_pixels_vectors(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count) {
+    constexpr int size = size_in<In>;
+    row_of_steps<false>(
+        count, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
+        [&](ptrdiff_t x, rgb_v p) {
+            const channels_v c = channels_of(p);
+            for (int k = 0; k < 3; k++) store(channels[k] + x, c.c[k]);
+        },
+        [&](ptrdiff_t x, int part) {
+            uint8_t pixels[bytes * size] = {}, to[3][bytes];
+            uint8_t *const planes[] = {to[0], to[1], to[2]};
+            memcpy(pixels, src + size * x, size_t(part) * size);
+            split_pixels_vectors<In>(pixels, planes, bytes);
+            for (int k = 0; k < 3; k++) memcpy(channels[k] + x, to[k], size_t(part));
+        });
+}
+
+template <pixel_kind Kind>
+inline void store_channels(uint8_t *dst, u8v first, u8v g, u8v last, bool alpha_first) {
+    if constexpr (Kind == pixel_kind::three) {
+        store_zip3(dst, first, g, last);
+    } else if constexpr (Kind == pixel_kind::four) {
+        first = natural_to_by4(first), g = natural_to_by4(g), last = natural_to_by4(last);
+        if (alpha_first)
+            store_zip4(dst, set_u8(255), first, g, last);
+        else
+            store_zip4(dst, first, g, last, set_u8(255));
+    } else {
+        // Bits of bytes, by shifts of words: those that come from the neighbour are dropped.
+        const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
+        const u8v high = bit_or(bit_and(first, set_u8(0xF8)), bits(shr<5>(as_u16(g)), 0x07));
+        const u8v low = bit_or(bits(shl<3>(as_u16(g)), 0xE0), bits(shr<3>(as_u16(last)), 0x1F));
+        store_zip8(dst, natural_to_by8(low), natural_to_by8(high));
+    }
+}
+
+template <rgb_in In, pixel_kind To>
+static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    constexpr int size = size_in<In>, to_size = int(To) + 2;
+    row_of_steps<false>(
+        count, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
+        [&](ptrdiff_t x, rgb_v p) {
+            channels_v c = channels_of(p);
+            if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
+            store_channels<To>(dst + to_size * x, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
+        },
+        [&](ptrdiff_t x, int part) {
+            uint8_t pixels[bytes * size] = {}, to[bytes * to_size];
+            memcpy(pixels, src + size * x, size_t(part) * size);
+            repack_pixels<In, To>(order, pixels, to, bytes);
+            memcpy(dst + to_size * x, to, size_t(part) * to_size);
+        });
+}
+template <pixel_kind To>
+static void repack_four(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
+    (order.from_alpha_first ? repack_pixels<rgb_in::four_alpha_first, To>
+                            : repack_pixels<rgb_in::four, To>)(order, src, dst, count);
+}
+
+// The first byte of each byte's pixel, from the start of the block.
+struct first_byte {
+    alignas(64) uint8_t lane[bytes];
+    constexpr first_byte() : lane() {
+        for (int i = 0; i < bytes; i++) lane[i] = static_cast<uint8_t>(i % 16 / 4 * 4);
+    }
+};
+static constexpr first_byte first_byte_of_pixel;
+
+// Four bytes to four: each stays in its pixel.
+static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *dst,
+                         ptrdiff_t count) {
+    // Where the bytes of a pixel come from.
+    const int skip = order.from_alpha_first, at = order.to_alpha_first;
+    uint8_t from[4];
+    from[at ? 0 : 3] = skip ? 0 : 3;
+    for (int k = 0; k < 3; k++)
+        from[at + k] = static_cast<uint8_t>(skip + (order.exchange ? 2 - k : k));
+    const u8v index = add_u8(set_u32(uint32_t(from[0]) | uint32_t(from[1]) << 8 |
+                                     uint32_t(from[2]) << 16 | uint32_t(from[3]) << 24),
+                             load(first_byte_of_pixel.lane));
+    if (count < bytes / 4) {
+        for (ptrdiff_t x = 0; x < count; x++)
+            for (int k = 0; k < 4; k++) dst[4 * x + k] = src[4 * x + from[k]];
+        return;
+    }
+    const auto vector = [&](ptrdiff_t i) { store(dst + i, shuffle(load(src + i), index)); };
+    const ptrdiff_t size = 4 * count;
+    ptrdiff_t i = 0;
+    for (; i + 4 * bytes <= size; i += 4 * bytes)
+        for (int k = 0; k < 4; k++) vector(i + k * bytes);
+    for (; i + bytes < size; i += bytes) vector(i);
+    vector(size - bytes);
+}
+
+// YUV to YUV
+// ------------------------------------------------------------------------------------------------
+
+static void any_split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
+                             ptrdiff_t pairs, bool luma_first) {
+    in_steps<bytes / 2>(
+        pairs,
+        [&](ptrdiff_t i) {
+            const pair_u8 p = load_split_natural(src + 4 * i);
+            store(y + 2 * i, luma_first ? p.even : p.odd);
+            store_split(u + i, v + i, luma_first ? p.odd : p.even);
+        },
+        [&](ptrdiff_t i) {
+            const uint8_t *const luma = src + 4 * i + !luma_first;
+            const uint8_t *const chroma = src + 4 * i + luma_first;
+            y[2 * i] = luma[0];
+            y[2 * i + 1] = luma[2];
+            u[i] = chroma[0];
+            v[i] = chroma[2];
+        });
+}
+
+static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                            ptrdiff_t pairs, bool luma_first) {
+    in_steps<bytes / 2>(
+        pairs,
+        [&](ptrdiff_t i) {
+            const u8v luma = natural_to_by8(load(y + 2 * i));
+            const u8v chroma = natural_to_by8(load_zip(u + i, v + i));
+            store_zip8(dst + 4 * i, luma_first ? luma : chroma, luma_first ? chroma : luma);
+        },
+        [&](ptrdiff_t i) {
+            uint8_t *const luma = dst + 4 * i + !luma_first, *const chroma =
+                                                                 dst + 4 * i + luma_first;
+            luma[0] = y[2 * i];
+            luma[2] = y[2 * i + 1];
+            chroma[0] = u[i];
+            chroma[2] = v[i];
+        });
+}
+
+static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count, [&](ptrdiff_t x) { store(dst + x, avg_u8(load(a + x), load(b + x))); },
+        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[x] + b[x] + 1) >> 1); });
+}
+static void any_mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count,
+        [&](ptrdiff_t x) {
+            const pair_u8 p = load_split_natural(a + 2 * x);
+            store(dst + x, avg_u8(p.even, p.odd));
+        },
+        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[2 * x] + a[2 * x + 1] + 1) >> 1); });
+}
+static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
+    const s16v two = as_s16(set_u16(2));
+    in_steps(
+        count,
+        [&](ptrdiff_t x) {
+            const auto sums = [&](ptrdiff_t at) {
+                const u8v of_a = load(a + at), of_b = load(b + at);
+                const s16v of_even = add(as_s16(even(of_a)), as_s16(even(of_b)));
+                const s16v of_odd = add(as_s16(odd(of_a)), as_s16(odd(of_b)));
+                return sar<2>(add(add(of_even, of_odd), two));
+            };
+            store(dst + x, by8_to_natural(narrow(sums(2 * x), sums(2 * x + bytes))));
+        },
+        [&](ptrdiff_t x) {
+            const int sum = a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1];
+            dst[x] = static_cast<uint8_t>((sum + 2) >> 2);
+        });
+}
+
+// What follows the last sample may lie behind the line.
+static void any_every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count - 1, [&](ptrdiff_t x) { store(dst + x, load_split_natural(a + 2 * x).even); },
+        [&](ptrdiff_t x) { dst[x] = a[2 * x]; });
+    dst[count - 1] = a[2 * (count - 1)];
+}
+static void any_twice(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count / 2,
+        [&](ptrdiff_t i) {
+            const u8v v = natural_to_by8(load(a + i));
+            store_zip8(dst + 2 * i, v, v);
+        },
+        [&](ptrdiff_t i) { dst[2 * i] = dst[2 * i + 1] = a[i]; });
+    if (count & 1) dst[count - 1] = a[count / 2];
+}
+
+template <pixel_kind Kind>
+static void fill_any_kind(any_rows &t) {
+    const size_t k = size_t(Kind);
+    const auto in = [&](chroma_in layout, any_to_rgb_row *row, any_to_rgb_row_pair *pair) {
+        t.to_rgb[size_t(layout)][k] = row;
+        t.to_rgb_pair[size_t(layout)][k] = pair;
+    };
+    in(chroma_in::half, any_row<chroma_in::half, Kind>, any_row_pair<chroma_in::half, Kind>);
+    in(chroma_in::full, any_row<chroma_in::full, Kind>, any_pair_of_rows<chroma_in::full, Kind>);
+    in(chroma_in::pairs, any_row_of_pair<chroma_in::pairs, Kind>,
+       any_row_pair<chroma_in::pairs, Kind>);
+    in(chroma_in::groups, any_row<chroma_in::groups, Kind>,
+       any_pair_of_rows<chroma_in::groups, Kind>);
+    t.repack[size_t(pixel_kind::words)][k] = repack_pixels<rgb_in::words, Kind>;
+    t.repack[size_t(pixel_kind::three)][k] = repack_pixels<rgb_in::three, Kind>;
+    t.repack[size_t(pixel_kind::four)][k] = repack_four<Kind>;
+}
+template <rgb_in In>
+static void fill_any_rgb(any_rows &t) {
+    any_to_yuv_row **const to = t.to_yuv[size_t(In)];
+    to[size_t(chroma_out::none)] = any_yuv_row<In, chroma_out::none>;
+    to[size_t(chroma_out::half)] = any_yuv_row<In, chroma_out::half>;
+    to[size_t(chroma_out::pairs)] = any_yuv_row<In, chroma_out::pairs>;
+    t.split_pixels[size_t(In)] = split_pixels_vectors<In>;
+}
+
+void fill_any(any_rows &t) {
+    fill_any_kind<pixel_kind::words>(t);
+    fill_any_kind<pixel_kind::three>(t);
+    fill_any_kind<pixel_kind::four>(t);
+    t.repack[size_t(pixel_kind::four)][size_t(pixel_kind::four)] = reorder_four;
+    fill_any_rgb<rgb_in::words>(t);
+    fill_any_rgb<rgb_in::three>(t);
+    fill_any_rgb<rgb_in::four>(t);
+    fill_any_rgb<rgb_in::four_alpha_first>(t);
+    t.chroma = any_chroma_row;
+    t.split_groups = any_split_groups;
+    t.join_groups = any_join_groups;
+    t.mean_of_lines = any_mean_of_lines;
+    t.mean_of_pairs = any_mean_of_pairs;
+    t.mean_of_blocks = any_mean_of_blocks;
+    t.every_second = any_every_second;
+    t.twice = any_twice;
+}
+
+}  // namespace simgp::SIMD_TARGET
+
+#endif
