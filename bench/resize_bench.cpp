@@ -157,7 +157,7 @@ std::vector<comparison> resize_comparisons() {
             c.sizes = f.sizes;
             // Peers whose grids meet in the middle of the pictures are half a sample off, and more
             // where they shrink.
-            c.tolerance = 12;
+            c.tolerance = 16;
             c.against_swscale = k.plane == 0;  // which has no call for a plane of pairs
             all.push_back(compare(c));
         }
