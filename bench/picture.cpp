@@ -348,7 +348,8 @@ comparison compare(conversion c) {
             if (simgp_csc(&s, &d) != SIMGP_OK) fail(name + ": simgp_csc does not know the pair");
         };
     if (c.against_swscale)
-        for (peer &p : swscale_peer(c.from, c.to, 0, c.how, c.colour)) c.peers.push_back(std::move(p));
+        for (peer &p : swscale_peer(c.from, c.to, 0, c.how, c.colour))
+            c.peers.push_back(std::move(p));
     if (c.sizes.empty()) c.sizes = {"320x240", "1280x720", "1920x1080", "3840x2160", "1918x1078"};
 
     const auto make = [c](const std::string &name) {
