@@ -277,7 +277,7 @@ struct job {
 // the stack has, or all. Strips begin and end with whole tiles.
 constexpr ptrdiff_t strip_width = 256;
 static_assert(strip_width % tile_width == 0);
-struct band {
+struct strip_rows {
     ptrdiff_t x, y, width, rows;
     ptrdiff_t pairs() const { return (width + 1) / 2; }
 };
@@ -285,8 +285,8 @@ template <class F>
 void for_each_band(const job &j, ptrdiff_t width, ptrdiff_t rows, F f) {
     for (ptrdiff_t y = 0; y < j.height; y += rows)
         for (ptrdiff_t x = 0; x < j.width; x += width)
-            f(band{x, y, j.width - x < width ? j.width - x : width,
-                   j.height - y < rows ? j.height - y : rows});
+            f(strip_rows{x, y, j.width - x < width ? j.width - x : width,
+                         j.height - y < rows ? j.height - y : rows});
 }
 
 constexpr bool is_rgb(const format &f) { return f.kind == format_kind::rgb; }
@@ -323,7 +323,7 @@ void split_pairs(const job &j, bool v_first, const uint8_t *src, uint8_t *u, uin
     j.layout.unpack(src, v_first ? v : u, v_first ? u : v, pairs);
 }
 
-void read_groups(const job &j, const band &b, yuv_strip &s) {
+void read_groups(const job &j, const strip_rows &b, yuv_strip &s) {
     const bool luma_first = j.from.layout == yuv_layout::yuyv;
     for (ptrdiff_t r = 0; r < b.rows; r++) {
         const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x;
@@ -352,7 +352,7 @@ void copy_to_tiles(const uint8_t *src, uint8_t *plane, ptrdiff_t plane_width,
                size_t(width - i < tile_width ? width - i : tile_width));
 }
 
-void read_tiles(const job &j, const band &b, yuv_strip &s) {
+void read_tiles(const job &j, const strip_rows &b, yuv_strip &s) {
     for (ptrdiff_t r = 0; r < b.rows; r++)
         copy_from_tiles(j.src.plane[0], j.width, j.height, b.x, b.y + r, s.y[r], b.width);
     // The last row of an odd height may ask for a row of chroma that has no tile.
@@ -369,7 +369,7 @@ void read_tiles(const job &j, const band &b, yuv_strip &s) {
 }
 
 // The samples of a band: where they lie in the source, or in the strip.
-planar_band read_band(const job &j, const band &b, yuv_strip &s) {
+planar_band read_band(const job &j, const strip_rows &b, yuv_strip &s) {
     planar_band p{{s.y[0], s.y[1]}, {s.u[0], s.u[1]}, {s.v[0], s.v[1]}};
     if (j.from.kind == format_kind::packed) {
         read_groups(j, b, s);
@@ -440,7 +440,7 @@ void copy_line(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
 struct target_band {
     uint8_t *y[2], *u[2], *v[2];
 };
-target_band place_band(const job &j, const band &b, yuv_strip &s) {
+target_band place_band(const job &j, const strip_rows &b, yuv_strip &s) {
     target_band t{{s.y[0], s.y[1]}, {s.u[0], s.u[1]}, {s.v[0], s.v[1]}};
     if (j.to.kind != format_kind::planar) return t;
     for (ptrdiff_t r = 0; r < b.rows; r++) t.y[r] = j.out(0).line(b.y + r) + b.x;
@@ -454,7 +454,7 @@ target_band place_band(const job &j, const band &b, yuv_strip &s) {
     return t;
 }
 
-void write_groups(const job &j, const band &b, const planar_band &p) {
+void write_groups(const job &j, const strip_rows &b, const planar_band &p) {
     const bool luma_first = j.to.layout == yuv_layout::yuyv;
     for (ptrdiff_t r = 0; r < b.rows; r++) {
         uint8_t *const dst = j.out(0).line(b.y + r) + 2 * b.x;
@@ -474,7 +474,7 @@ void write_pairs(const job &j, const planar_band &p, uint8_t *dst, ptrdiff_t pai
 
 // Brings the samples of a band, which are as many as the destination has, from where they are to
 // their places.
-void finish_band(const job &j, const band &b, const planar_band &p, const target_band &t) {
+void finish_band(const job &j, const strip_rows &b, const planar_band &p, const target_band &t) {
     if (j.to.kind == format_kind::packed) return write_groups(j, b, p);
     if (j.to.kind == format_kind::tiled) {
         for (ptrdiff_t r = 0; r < b.rows; r++)
@@ -506,7 +506,7 @@ bool has_way_from_groups(const job &j) {
 void groups_to_every_second_row(const job &j) {
     constexpr ptrdiff_t width = 4 * strip_width;
     const bool luma_first = j.from.layout == yuv_layout::yuyv, pairs = has_pairs(j.to);
-    for_each_band(j, width, 2, [&](const band &b) {
+    for_each_band(j, width, 2, [&](const strip_rows &b) {
         uint8_t unwanted[width];
         const ptrdiff_t whole = b.width & ~ptrdiff_t(1), line = b.y >> 1;
         for (ptrdiff_t r = 0; r < b.rows; r++) {
@@ -534,7 +534,7 @@ void groups_to_every_second_row(const job &j) {
 void yuv_to_yuv(const job &j) {
     if (has_way_from_groups(j)) return groups_to_every_second_row(j);
     const sharing from = sharing_of(j.from), to = sharing_of(j.to);
-    for_each_band(j, strip_width, 2, [&](const band &b) {
+    for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip read, resampled;
         planar_band p = read_band(j, b, read);
         const target_band t = place_band(j, b, resampled);
@@ -574,7 +574,7 @@ void yuv_to_rgb_pictures(const job &j) {
     // Rows read what lies in linear planes, whole lines of it.
     const bool direct = j.from.kind != format_kind::tiled && j.from.u >= 0;
     const bool pairs = has_pairs(j.from);
-    for_each_band(j, direct ? j.width : strip_width, 2, [&](const band &b) {
+    for_each_band(j, direct ? j.width : strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
         planar_band p{};
         if (!direct || !(pairs || j.from.kind == format_kind::packed)) {
@@ -645,7 +645,7 @@ void rgb_to_yuv_pictures(const job &j) {
         for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
     any_to_yuv_row *const with_chroma =
         !by_rows ? luma : rows[size_t(pairs ? chroma_out::pairs : chroma_out::half)];
-    for_each_band(j, direct ? j.width : strip_width, 2, [&](const band &b) {
+    for_each_band(j, direct ? j.width : strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
         target_band t = place_band(j, b, strip);
         if (pairs) t.u[0] = j.out(1).line(b.y >> 1) + b.x;

@@ -89,9 +89,9 @@ enum {
  *   rounded to nearest, halves upward: (sum + 1) >> 1 of two, (sum + 2) >> 2 of four. Where nothing
  *   is averaged, the flag makes no difference to these rules.
  *
- * Odd sizes. Lines of UYVY and YUYV have 2 W bytes. With an odd W, the last pixel takes the V of the
- * group before, or 128 if there is none, and as a destination its own V is not written. T64X32 is
- * read as simgp_csc_t64x32_to_rgb565 reads it (tile.h): with an odd H, the last row takes chroma
+ * Odd sizes. Lines of UYVY and YUYV have 2 W bytes. With an odd W, the last pixel takes the V of
+ * the group before, or 128 if there is none, and as a destination its own V is not written. T64X32
+ * is read as simgp_csc_t64x32_to_rgb565 reads it (tile.h): with an odd H, the last row takes chroma
  * row H / 2 where there is such a tile row, else the last one, or 128. It is written as
  * simgp_csc_yuv420_to_t64x32 writes it: (W + 1) / 2 pairs in H / 2 rows, rounded down, also by a
  * copy.
