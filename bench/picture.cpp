@@ -339,6 +339,16 @@ arena make_arena(const conversion &c, int from_format, const size &from, const s
     return {dst, dst, [=] { memcpy(dst.memory.get(), src.memory.get(), src.bytes); }};
 }
 
+// The bytes of a plane, or of all.
+struct extent {
+    uint8_t *first;
+    size_t count;
+};
+extent dealt_with(const picture &p, int plane) {
+    if (plane < 0) return {p.memory.get(), p.bytes};
+    return {p.plane[plane], size_t(p.stride[plane]) * size_t(p.height[plane])};
+}
+
 }  // namespace
 
 comparison compare(conversion c) {
@@ -368,7 +378,9 @@ comparison compare(conversion c) {
         memcpy(ours.memory.get(), a.dst.memory.get(), ours.bytes);
 
         match m{};
-        m.units = double(a.dst.pixels());
+        const extent from_bytes = dealt_with(a.src, c.plane), to_bytes = dealt_with(a.dst, c.plane);
+        m.units = c.plane < 0 ? double(a.dst.pixels())
+                              : double(a.dst.width[c.plane]) * a.dst.height[c.plane];
         m.restore = a.restore;
         m.ours = [f = c.ours, a] { f(a.src, a.dst); };
         arena b = a;  // of work in place the same: all have the same memory before them
@@ -382,9 +394,9 @@ comparison compare(conversion c) {
         }
         m.limit = c.in_place
                       ? memory_traffic_in_place(a.dst.memory, a.dst.memory.get(), a.dst.bytes)
-                      : memory_traffic(a.src.memory, a.src.plane[0],
-                                       size_t(double(a.src.bytes) * c.part_read),
-                                       a.dst.memory.get(), a.dst.bytes);
+                      : memory_traffic(a.src.memory, from_bytes.first,
+                                       size_t(double(from_bytes.count) * c.part_read),
+                                       to_bytes.first, to_bytes.count);
 
         // Where a goal asks for the speed of memory, it is that of pictures beyond the cache, and
         // the peer's that of those inside.

@@ -93,6 +93,7 @@ struct conversion {
     int32_t colour = 0;            // SIMGP_COLOUR_*, for swscale
     double tolerance = 4;          // for peers, see expect_alike; 0: they are not held against ours
     double part_read = 1;          // of the source's bytes
+    int plane = -1;                // the only one, of both, that is dealt with
     int twin_from = -1;            // the conversion from this format is to be no faster than 0.9
     // Other work of ours on the same pictures, whose speed is to be kept to this part.
     struct {

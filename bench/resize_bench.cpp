@@ -88,19 +88,22 @@ struct factor {
     const char *name;
     std::vector<std::string> sizes;
     double goal_of_bytes;
+    bool all_kinds;  // have a goal
 };
 const factor factors[] = {
     {"2/3",
      {"480x360 to 320x240", "1920x1080 to 1280x720", "2880x1620 to 1920x1080",
       "5760x3240 to 3840x2160"},
-     5},
+     5,
+     true},
     {"3/2",
      {"320x240 to 480x360", "1280x720 to 1920x1080", "1920x1080 to 2880x1620",
       "3840x2160 to 5760x3240"},
-     2.7},
-    {"1/2", {"320x240 to 160x120", "1920x1080 to 960x540", "3840x2160 to 1920x1080"}, 0.8},
-    {"1/4", {"320x240 to 80x60", "1920x1080 to 480x270", "3840x2160 to 960x540"}, 4},
-    {"2", {"160x120 to 320x240", "960x540 to 1920x1080", "1920x1080 to 3840x2160"}, 1},
+     2.7,
+     true},
+    {"1/2", {"320x240 to 160x120", "1920x1080 to 960x540", "3840x2160 to 1920x1080"}, 0.8, false},
+    {"1/4", {"320x240 to 80x60", "1920x1080 to 480x270", "3840x2160 to 960x540"}, 4, false},
+    {"2", {"160x120 to 320x240", "960x540 to 1920x1080", "1920x1080 to 3840x2160"}, 1, false},
 };
 
 struct kind {
@@ -113,7 +116,7 @@ struct kind {
 
 }  // namespace
 
-// Byte pairs are the chroma of pictures of these sizes.
+// Byte pairs are the chroma of pictures of these sizes; times are per pair.
 std::vector<comparison> resize_comparisons() {
     const kind kinds[] = {
         {"rsz_8b",
@@ -140,7 +143,9 @@ std::vector<comparison> resize_comparisons() {
     std::vector<comparison> all;
     for (const kind &k : kinds)
         for (const factor &f : factors) {
-            conversion c{k.format, k.format, {k.goal > 0 ? k.goal : f.goal_of_bytes, 0}};
+            const double goal = k.goal == 0 ? f.goal_of_bytes : f.all_kinds ? k.goal : 0;
+            conversion c{k.format, k.format, {goal, 0}};
+            c.plane = k.plane;
             for (const std::vector<peer> &some : k.peers)
                 c.peers.insert(c.peers.end(), some.begin(), some.end());
             c.name = std::string(k.name) + "_" + f.name;

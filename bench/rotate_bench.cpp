@@ -133,6 +133,21 @@ std::vector<comparison> rotate_comparisons() {
                    {libyuv_plane(RotatePlane270, 2)}));
     halve_rows(add("1x2_to_1x1_rot_90r", bytes, simgp_csc_1x2_to_1x1_rot_90r, turn,
                    {libyuv_plane(RotatePlane90, 2)}));
+    conversion whole{SIMGP_FMT_YUV422N, SIMGP_FMT_YUV420, turn};
+    whole.name = "csc_rot_yuv422n_to_yuv420_90l";
+    whole.ours = [](const simgp_img &s, const simgp_img &d) {
+        if (simgp_csc_rot(&s, SIMGP_ROT_90L, &d) != SIMGP_OK) fail("csc_rot refuses");
+    };
+    whole.peers = {libyuv_peer([](const simgp_img &s, const simgp_img &d) {
+        for (int k = 0, rows = 1; k < 3; k++, rows = 2)
+            RotatePlane270(s.plane[k], rows * s.stride[k], d.plane[k], d.stride[k], s.width[k],
+                           s.height[k] / rows);
+    })};
+    whole.tolerance = 1e-6;
+    whole.against_swscale = false;
+    whole.to_size = [](const size &from) { return size{from.height, from.width}; };
+    whole.sizes = {"320x240", "1920x1080", "3840x2160", "1918x1078"};
+    all.push_back(std::move(whole));
 
     conversion &quarter = add(
         "rsz_8b_rot_90r_quarter", bytes, nullptr, turn,
