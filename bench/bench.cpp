@@ -297,7 +297,7 @@ int run(int argc, char **argv) {
         "  simgp-bench --filter 'nv12_to' --size 1920x1080 --target avx2\n"
         "  simgp-bench --json speed.json");
     settings s;
-    std::string filter = ".", json, markdown, libyuv_set = "all";
+    std::string filter = ".", json, markdown, report, libyuv_set = "all";
     std::vector<std::string> sizes, target_names;
     bool quick = false, list = false;
     app.add_option("--filter", filter, "only operations whose name matches this expression");
@@ -313,6 +313,9 @@ int run(int argc, char **argv) {
     app.add_option("--libyuv", libyuv_set, "instruction sets for libyuv: all, avx2, sse41");
     app.add_option("--json", json, "write all times to this file as well");
     app.add_option("--markdown", markdown, "write tables with one row per operation to this file");
+    app.add_option("--report", report, "put tables and charts into this page, or docs/speed.md")
+        ->expected(0, 1)
+        ->default_str("docs/speed.md");
     app.add_flag("--quick", quick, "320x240 and 1920x1080 alone, few rounds");
     app.add_flag("--list", list, "list the operations and sizes");
     app.allow_extras();
@@ -326,20 +329,36 @@ int run(int argc, char **argv) {
     limit_libyuv(libyuv_set);
 
     table out;
-    std::vector<comparison> all;
-    for (const auto area :
-         {yuv2rgb_comparisons, packed2rgb_comparisons, rgb2yuv_comparisons, layout_comparisons,
-          copy_comparisons, csc_any_comparisons, tile_comparisons, dither_comparisons,
-          deblock_comparisons, rotate_comparisons, resize_comparisons, resize_rot_comparisons,
-          resize_csc_comparisons, irsz_comparisons, scmn_comparisons})
-        for (comparison &c : area()) all.push_back(std::move(c));
-    for (const comparison &c : all) {
+    struct family {
+        const char *name;
+        std::vector<comparison> (*comparisons)();
+    };
+    const family families[] = {{"YUV to RGB", yuv2rgb_comparisons},
+                               {"RGB to RGB565", packed2rgb_comparisons},
+                               {"RGB to YUV", rgb2yuv_comparisons},
+                               {"Layouts", layout_comparisons},
+                               {"Copies", copy_comparisons},
+                               {"Any to any", csc_any_comparisons},
+                               {"Tiles", tile_comparisons},
+                               {"Dithering", dither_comparisons},
+                               {"Deblocking", deblock_comparisons},
+                               {"Turns and mirrors", rotate_comparisons},
+                               {"Resize", resize_comparisons},
+                               {"Resize and turn", resize_rot_comparisons},
+                               {"Resize and convert", resize_csc_comparisons},
+                               {"Line resizer", irsz_comparisons},
+                               {"Common", scmn_comparisons}};
+    std::vector<std::pair<std::string, comparison>> all;
+    for (const family &f : families)
+        for (comparison &c : f.comparisons()) all.emplace_back(f.name, std::move(c));
+    for (const auto &[family_name, c] : all) {
         for (const std::string &size : sizes.empty() ? c.sizes : sizes_like(c.sizes, sizes)) {
-            const auto body = [&out, c, size, s](benchmark::State &state) {
+            const auto body = [&out, name = family_name, c = c, size, s](benchmark::State &state) {
                 rotation r(c.make(size), s);
                 for (auto _ : state) state.SetIterationTime(r.round());
                 for (const auto &[name, ns] : r.times()) state.counters[name] = ns;
                 out.fresh = r.lines(c.name, size);
+                for (line &l : out.fresh) l.family = name;
             };
             int w = 0, h = 0, to_w = 0, to_h = 0;
             sscanf(size.c_str(), "%dx%d to %dx%d", &w, &h, &to_w, &to_h);
@@ -363,6 +382,11 @@ int run(int argc, char **argv) {
     if (list) return 0;
     print_summary(out.all);
     if (!markdown.empty()) write_markdown(markdown, out.all);
+    if (!report.empty()) {
+        std::string command = "./run bench";
+        for (int i = 1; i < argc; i++) command.append(" ").append(argv[i]);
+        write_report(report, command, out.all);
+    }
     return 0;
 }
 

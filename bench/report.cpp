@@ -3,8 +3,13 @@
 #include <stdarg.h>
 #include <stdio.h>
 #include <stdlib.h>
+#include <time.h>
 
 #include <algorithm>
+#include <cmath>
+#include <fstream>
+#include <iterator>
+#include <memory>
 
 namespace bench {
 namespace {
@@ -151,11 +156,9 @@ void write_row(FILE *file, const std::vector<line> &lines) {
 
 }  // namespace
 
-void write_markdown(const std::string &path, const std::vector<line> &lines) {
-    FILE *file = fopen(path.c_str(), "w");
-    if (!file) fail("cannot write " + path);
+static void write_tables(FILE *file, const std::vector<line> &lines, const char *heading) {
     for (const std::string &target : distinct(lines, &line::target_name)) {
-        fprintf(file, "### %s\n\n", target.c_str());
+        fprintf(file, "%s %s\n\n", heading, target.c_str());
         for (const block &b : blocks_of(lines, target)) {
             fprintf(file, "| operation | best peer | goal |");
             for (const std::string &s : b.sizes) fprintf(file, " %s |", s.c_str());
@@ -166,7 +169,203 @@ void write_markdown(const std::string &path, const std::vector<line> &lines) {
             fprintf(file, "\n");
         }
     }
-    if (fclose(file)) fail("cannot write " + path);
+}
+
+namespace {
+
+struct closed {
+    void operator()(FILE *f) const { fclose(f); }
+};
+using owned_file = std::unique_ptr<FILE, closed>;
+
+owned_file create(const std::string &path) {
+    owned_file file(fopen(path.c_str(), "w"));
+    if (!file) fail("cannot write " + path);
+    return file;
+}
+void finish(owned_file file, const std::string &path) {
+    if (fclose(file.release())) fail("cannot write " + path);
+}
+
+std::string contents_of(const std::string &path) {
+    std::ifstream in(path);
+    if (!in) fail("cannot read " + path);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+std::string processor() {
+    const std::string info = contents_of("/proc/cpuinfo");
+    for (const char *key : {"model name", "Model", "uarch"}) {
+        const size_t at = info.find(key);
+        if (at == std::string::npos) continue;
+        const size_t colon = info.find(':', at);
+        return info.substr(colon + 2, info.find('\n', colon) - colon - 2);
+    }
+    return "unknown processor";
+}
+
+double geometric_mean(const std::vector<double> &v) {
+    double sum = 0;
+    for (double x : v) sum += log(x);
+    return v.empty() ? 0 : exp(sum / double(v.size()));
+}
+
+// What a bar of a chart stands for: the quotients to the best peer, by target, and the shares of the
+// memory limit at the largest size.
+struct bar {
+    std::string label;
+    std::vector<double> peer, limit;  // by target; 0: not measured
+};
+
+std::vector<line> only(const std::vector<line> &lines, std::string line::*member,
+                       const std::string &value) {
+    std::vector<line> own;
+    for (const line &l : lines)
+        if (l.*member == value) own.push_back(l);
+    return own;
+}
+
+bar bar_of(const std::string &label, const std::vector<line> &lines,
+           const std::vector<std::string> &targets) {
+    bar b{label, {}, {}};
+    for (const std::string &target : targets) {
+        std::vector<double> peer, limit;
+        for (const std::string &name : distinct(lines, &line::name)) {
+            double largest = 0;
+            for (const line &l : only(lines, &line::name, name)) {
+                if (l.target_name != target) continue;
+                if (l.peer.middle) peer.push_back(l.peer.middle);
+                if (l.limit.middle && l.size.rfind("3840", 0) == 0) largest = l.limit.middle;
+            }
+            if (largest) limit.push_back(largest);
+        }
+        b.peer.push_back(geometric_mean(peer));
+        b.limit.push_back(geometric_mean(limit));
+    }
+    return b;
+}
+
+std::string escaped(const std::string &text) {
+    std::string out;
+    for (char c : text) out += c == '&' ? "&amp;" : c == '<' ? "&lt;" : std::string(1, c);
+    return out;
+}
+
+// Bars on a logarithmic scale from a half to 16: they begin at 1, where we are as fast as the best peer.
+// To their right, the share of the memory limit.
+void write_chart(const std::string &path, const std::string &title, const std::vector<bar> &bars,
+                 const std::vector<std::string> &targets) {
+    constexpr int label = 250, scale = 440, share = 90, top = 62, thick = 9, gap = 7;
+    const char *const colours[] = {"#4878a8", "#e0913a", "#6aa86a", "#a05a9c"};
+    const int row = thick * int(targets.size()) + gap;
+    const int width = label + scale + share, height = top + row * int(bars.size()) + 12;
+    const auto at = [](double quotient) {
+        return label + scale * (log2(std::clamp(quotient, .5, 16.)) + 1) / 5;
+    };
+    const owned_file owner = create(path);
+    FILE *const file = owner.get();
+    fprintf(file,
+            "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"0 0 %d %d\" width=\"%d\" "
+            "font-family=\"sans-serif\" font-size=\"11\">\n"
+            "<rect width=\"%d\" height=\"%d\" fill=\"#fff\"/>\n"
+            "<text x=\"8\" y=\"18\" font-size=\"14\" font-weight=\"bold\">%s</text>\n",
+            width, height, width, width, height, escaped(title).c_str());
+    for (size_t t = 0; t < targets.size(); t++)
+        fprintf(file,
+                "<rect x=\"%zu\" y=\"27\" width=\"10\" height=\"10\" fill=\"%s\"/><text x=\"%zu\" "
+                "y=\"36\">%s</text>\n",
+                8 + 80 * t, colours[t % 4], 22 + 80 * t, targets[t].c_str());
+    fprintf(file,
+            "<text x=\"%d\" y=\"36\" text-anchor=\"middle\">times the speed of the best peer</text>"
+            "<text x=\"%d\" y=\"36\" text-anchor=\"end\">of memory\'s</text>\n",
+            label + scale / 2, width - 8);
+    for (double mark : {.5, 1., 2., 4., 8., 16.})
+        fprintf(file,
+                "<line x1=\"%.1f\" x2=\"%.1f\" y1=\"%d\" y2=\"%d\" stroke=\"%s\"/><text x=\"%.1f\" "
+                "y=\"%d\" text-anchor=\"middle\" fill=\"#555\">%g</text>\n",
+                at(mark), at(mark), top - 8, height - 8, mark == 1 ? "#000" : "#ddd", at(mark),
+                top - 11, mark);
+    int y = top;
+    for (const bar &b : bars) {
+        fprintf(file, "<text x=\"%d\" y=\"%d\" text-anchor=\"end\">%s</text>\n", label - 8,
+                y + row / 2 + 1, escaped(b.label).c_str());
+        for (size_t t = 0; t < targets.size(); t++, y += thick) {
+            if (const double q = b.peer[t]; q > 0) {
+                const double from = std::min(at(1), at(q)), to = std::max(at(1), at(q));
+                fprintf(file,
+                        "<rect x=\"%.1f\" y=\"%d\" width=\"%.1f\" height=\"%d\" "
+                        "fill=\"%s\"/><text x=\"%.1f\" y=\"%d\" font-size=\"9\">%.2f</text>\n",
+                        from, y, std::max(to - from, 1.), thick - 1, colours[t % 4], to + 3,
+                        y + thick - 2, q);
+            }
+            if (b.limit[t] > 0)
+                fprintf(file,
+                        "<text x=\"%d\" y=\"%d\" font-size=\"9\" text-anchor=\"end\" "
+                        "fill=\"%s\">%.2f</text>\n",
+                        width - 8, y + thick - 2, colours[t % 4], b.limit[t]);
+        }
+        y += gap;
+    }
+    fprintf(file, "</svg>\n");
+    if (fflush(file)) fail("cannot write " + path);
+}
+
+// "YUV to RGB" as a part of a file's name.
+std::string slug(std::string text) {
+    for (char &c : text) c = isalnum(c) ? char(tolower(c)) : '-';
+    return text;
+}
+
+constexpr char results_begin[] = "<!-- results -->\n", results_end[] = "<!-- end of results -->\n";
+
+}  // namespace
+
+void write_markdown(const std::string &path, const std::vector<line> &lines) {
+    owned_file file = create(path);
+    write_tables(file.get(), lines, "###");
+    finish(std::move(file), path);
+}
+
+void write_report(const std::string &page, const std::string &command,
+                  const std::vector<line> &lines) {
+    const std::string old = contents_of(page);
+    const size_t begin = old.find(results_begin), end = old.find(results_end);
+    if (begin == std::string::npos || end == std::string::npos || end < begin)
+        fail(page + " has no place for results");
+    const std::vector<std::string> targets = distinct(lines, &line::target_name);
+    const std::string stem = page.substr(0, page.rfind('.'));
+    const std::string local = stem.substr(stem.rfind('/') + 1);
+
+    owned_file file = create(page);
+    fwrite(old.data(), 1, begin + sizeof results_begin - 1, file.get());
+    char date[20];
+    const time_t now = time(nullptr);
+    strftime(date, sizeof date, "%Y-%m-%d", localtime(&now));
+    fprintf(file.get(), "\n    %s\n\non %s, %s, by GCC %s.\n\n", command.c_str(), date,
+            processor().c_str(), __VERSION__);
+    std::vector<bar> families;
+    for (const std::string &family : distinct(lines, &line::family)) {
+        const std::vector<line> own = only(lines, &line::family, family);
+        const bar b = bar_of(family, own, targets);
+        if (*std::max_element(b.peer.begin(), b.peer.end()) > 0) families.push_back(b);
+    }
+    write_chart(stem + ".svg", "All families, geometric means", families, targets);
+    fprintf(file.get(), "![all families](%s.svg)\n\n", local.c_str());
+    for (const std::string &family : distinct(lines, &line::family)) {
+        const std::vector<line> own = only(lines, &line::family, family);
+        std::vector<bar> bars;
+        for (const std::string &name : distinct(own, &line::name))
+            bars.push_back(bar_of(name, only(own, &line::name, name), targets));
+        fprintf(file.get(), "### %s\n\n", family.c_str());
+        if (std::any_of(own.begin(), own.end(), [](const line &l) { return l.peer.middle > 0; })) {
+            const std::string chart = std::string("-").append(slug(family)).append(".svg");
+            write_chart(stem + chart, family, bars, targets);
+            fprintf(file.get(), "![%s](%s%s)\n\n", family.c_str(), local.c_str(), chart.c_str());
+        }
+        write_tables(file.get(), own, "####");
+    }
+    fwrite(old.data() + end, 1, old.size() - end, file.get());
+    finish(std::move(file), page);
 }
 
 }  // namespace bench

@@ -13,7 +13,7 @@ quartiles quartiles_of(std::vector<double> v);
 
 // One comparison with our rows of one target.
 struct line {
-    std::string name, size, target_name, best_peer;
+    std::string family, name, size, target_name, best_peer;
     double ns = 0, peer_ns = 0;
     quartiles peer, scalar, limit, twin;  // quotients of speeds; 0: not measured
     goal goals;
@@ -34,6 +34,12 @@ void print_summary(const std::vector<line> &lines);
 
 // One table for each target, one row for each operation, as Markdown.
 void write_markdown(const std::string &path, const std::vector<line> &lines);
+
+// Puts the tables into a page, between the lines "<!-- results -->" and "<!-- end of results -->", under
+// the machine, the command and the date, and charts over them: an SVG file beside the page for all
+// families, and one for each.
+void write_report(const std::string &page, const std::string &command,
+                  const std::vector<line> &lines);
 
 }  // namespace bench
 
