@@ -244,6 +244,7 @@ int main(int argc, char **argv) {
     app.add_flag("-j,--json", o.as_json, "write JSON, an array with an object for each file");
     app.add_flag("-s,--summary", o.summary_only, "leave the list of pictures out");
     app.add_flag("-q,--quiet", o.quiet, "no progress bar");
+    app.set_version_flag("--version", "simgp-probe " SIMGP_TOOLS_VERSION);
     const auto check = [&] {
         if (o.files.empty() && !o.fourcc) throw CLI::RequiredError("a file or --fourcc");
     };
