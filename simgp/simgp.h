@@ -50,6 +50,7 @@
 #include "simgp/dither.h"
 #include "simgp/img.h"
 #include "simgp/layout.h"
+#include "simgp/names.h"
 #include "simgp/packed2rgb.h"
 #include "simgp/resize.h"
 #include "simgp/resize_csc.h"
