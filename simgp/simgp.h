@@ -47,6 +47,7 @@
 #include "simgp/csc_any.h"
 #include "simgp/csc_rot.h"
 #include "simgp/deblock.h"
+#include "simgp/describe.h"
 #include "simgp/dither.h"
 #include "simgp/img.h"
 #include "simgp/layout.h"
