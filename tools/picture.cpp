@@ -74,8 +74,9 @@ int pixel_format::chroma() const {
 std::span<const pixel_format> formats() { return table; }
 
 const pixel_format *find_format(std::string_view name) {
+    const int32_t code = simgp_format_of_name(std::string(name).c_str());
     for (const pixel_format &format : table)
-        if (format.name == name) return &format;
+        if (format.code == code) return &format;
     return nullptr;
 }
 
