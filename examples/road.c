@@ -53,12 +53,9 @@ static int is(const simgp_img *screen, int32_t x, int32_t y, uint16_t colour) {
 static int try_screen(const simgp_img *frame, int32_t width, int32_t height, int32_t turn) {
     static uint8_t pixels[2 * WIDTH * HEIGHT], memory[2 * WIDTH * HEIGHT];
     const int32_t red_end = turn == SIMGP_ROT_90R ? height / 2 : width / 2;
-    simgp_img screen = {0};
-    screen.format = SIMGP_FMT_RGB565;
-    screen.width[0] = width;
-    screen.height[0] = height;
-    screen.stride[0] = 2 * width;
-    screen.plane[0] = pixels;
+    simgp_img screen;
+    if (simgp_describe(&screen, SIMGP_FMT_RGB565, width, height, 1, pixels, sizeof pixels, NULL))
+        return 0;
     if (show(frame, turn, memory, &screen) != SIMGP_OK) return 0;
     int wrong = 0;
     for (int32_t y = 0; y < height; y++)
@@ -83,12 +80,13 @@ int main(void) {
     }
     decode();
 
-    simgp_img frame = {0};
-    frame.format = SIMGP_FMT_T64X32;
-    frame.width[0] = WIDTH;
-    frame.height[0] = HEIGHT;
-    frame.plane[0] = luma;
-    frame.plane[1] = chroma;
+    simgp_img frame;
+    const char *why = "";
+    if (simgp_describe_planes(&frame, SIMGP_FMT_T64X32, WIDTH, HEIGHT, luma, 0, chroma, 0, NULL, 0,
+                              &why)) {
+        fprintf(stderr, "no picture: %s\n", why);
+        return 1;
+    }
     if (!try_screen(&frame, WIDTH, HEIGHT, SIMGP_ROT_NONE) ||
         !try_screen(&frame, 160, 96, SIMGP_ROT_NONE) ||
         !try_screen(&frame, 96, 160, SIMGP_ROT_90R)) {

@@ -1,6 +1,7 @@
 /* simgp: from decoded frames to pixels on a screen.
  *
- * Fill one descriptor for the picture you have and one for the picture you want, and call:
+ * Fill one descriptor for the picture you have and one for the picture you want, and call
+ * (simgp/describe.h fills descriptors, and checks them; simgp/simgp.hpp does it for C++20):
  *
  *     simgp_img src = {0}, dst = {0};
  *     src.format = SIMGP_FMT_NV12;

@@ -24,7 +24,7 @@ for component in runtime dev tools; do install_to $component --component $compon
 expected='libsimgp\.so\.[0-9.]*$'
 [ -n "$(files runtime)" ] && ! files runtime | grep -vqE "/$expected" || fault "Component runtime has:" "$(files runtime)"
 ! files dev | grep -qE "/bin/|/$expected" || fault "Component dev has:" "$(files dev)"
-[ "$(files tools | xargs -rn 1 basename | xargs)" = "$(xargs <<<"$tools")" ] ||
+[ "$(files tools | xargs -rn 1 basename | xargs)" = "$(xargs <<<"$tools ${tools:+simgp.py}")" ] ||
     fault "Component tools has:" "$(files tools)"
 rest=$(comm -3 <(files prefix) <({ files runtime && files dev && files tools; } | sort))
 [ -z "$rest" ] || fault "In no component, or in two:" "$rest"
@@ -34,6 +34,13 @@ for tool in $tools; do
     ldd "$prefix/bin/$tool" | grep -q "libsimgp.* => $prefix/" ||
         fault "$tool takes the library from elsewhere:" "$(ldd "$prefix/bin/$tool" | grep libsimgp)"
 done
+
+# The Python interface finds the library of its tree.
+if [ -n "$tools" ] && [ -z "$toolchain" ] && /usr/bin/python3 -c 'import numpy' 2>/dev/null; then
+    loaded=$(env -u SIMGP_LIBRARY PYTHONDONTWRITEBYTECODE=1 PYTHONPATH="$prefix/share/simgp/python" /usr/bin/python3 \
+        -c 'import simgp, os; print(simgp.version()[0], os.path.realpath(simgp.library._name))')
+    [[ $loaded == "1 $(realpath "$prefix")"/* ]] || fault "Python takes the library from elsewhere:" "$loaded"
+fi
 
 configure_user() { # FOLDER [ARG ...]
     "$cmake" -G "$generator" -S "$user" -B "$scratch/$1" -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_FIND_ROOT_PATH="$prefix" \
