@@ -16,6 +16,7 @@ extern "C" {
 
 #include "simgp/csc.h"
 #include "simgp/csc_any.h"
+#include "simgp/describe.h"
 #include "simgp/formats.h"
 
 namespace bench {
@@ -25,7 +26,7 @@ namespace {
 // 16-bit RGB.
 struct plane_shape {
     std::string group;
-    int group_pixels_log2, rows_log2;
+    int group_pixels_log2;
 };
 struct format_shape {
     const simgp::format *format;
@@ -43,17 +44,17 @@ format_shape shape_of(int code) {
             group.assign(size_t(at.size), 'A');
             group[size_t(at.r)] = 'R', group[size_t(at.g)] = 'G', group[size_t(at.b)] = 'B';
         }
-        shape.planes = {{group, 0, 0}};
+        shape.planes = {{group, 0}};
     } else if (f->kind == simgp::format_kind::packed) {
-        shape.planes = {{f->layout == simgp::yuv_layout::uyvy ? "UYVY" : "YUYV", 1, 0}};
+        shape.planes = {{f->layout == simgp::yuv_layout::uyvy ? "UYVY" : "YUYV", 1}};
     } else {
-        shape.planes = {{"Y", 0, 0}};
+        shape.planes = {{"Y", 0}};
         for (int k = 1; k < f->planes; k++) {
             const char *const group = f->u == f->v
                                           ? f->layout == simgp::yuv_layout::vu ? "VU" : "UV"
                                       : k == f->u ? "U"
                                                   : "V";
-            shape.planes.push_back({group, f->x_shift[k], f->y_shift[k]});
+            shape.planes.push_back({group, f->x_shift[k]});
         }
     }
     return shape;
@@ -159,28 +160,15 @@ double microseconds(const std::function<void()> &f) {
 }  // namespace
 
 picture::picture(int format, int w, int h) : simgp_img{} {
-    this->format = format;
-    const format_shape shape = shape_of(format);
-    size_t offsets[3] = {};
-    bytes = 0;
-    for (size_t k = 0; k < shape.planes.size(); k++) {
-        const plane_shape &s = shape.planes[k];
-        const int groups = (w + (1 << s.group_pixels_log2) - 1) >> s.group_pixels_log2;
-        width[k] = k ? groups : w;
-        height[k] = (h + (1 << s.rows_log2) - 1) >> s.rows_log2;
-        stride[k] = (groups * int(s.group.size()) + 63) & -64;
-        offsets[k] = bytes;
-        if (format == SIMGP_FMT_T64X32) {  // whole groups of four tiles
-            const size_t tile_rows = size_t(h / int(k + 1) + 31) / 32;
-            bytes += 8192 * (size_t(w + 127) / 128 * (tile_rows / 2) +
-                             tile_rows % 2 * (size_t(w + 255) / 256));
-        } else {
-            bytes += size_t(stride[k]) * size_t(height[k]);
-        }
-    }
+    const char *why = "";
+    simgp_layout layout = {};
+    if (simgp_lay_out(&layout, format, w, h, 64, &why) != SIMGP_OK) fail(why);
+    bytes = layout.bytes;
     memory.reset(static_cast<uint8_t *>(aligned_alloc(4096, (bytes + 4095) & ~size_t(4095))), free);
     memset(memory.get(), 0xA5, bytes);
-    for (size_t k = 0; k < shape.planes.size(); k++) plane[k] = memory.get() + offsets[k];
+    if (simgp_describe(this, format, w, h, 64, memory.get(), bytes, &why) != SIMGP_OK) fail(why);
+    // Ours has no use for them; libyuv finds rows of tiles by them.
+    if (format == SIMGP_FMT_T64X32) stride[0] = stride[1] = (w + 63) & -64;
 }
 
 void paint(const picture &p) {
@@ -230,13 +218,9 @@ void expect_alike(const std::string &what, const picture &a, const picture &b, d
 }
 
 simgp_img lines(const simgp_img &p, int y, int count) {
+    const char *why = "";
     simgp_img part = p;
-    const format_shape shape = shape_of(p.format);
-    for (size_t k = 0; k < shape.planes.size(); k++) {
-        const int log2 = shape.planes[k].rows_log2;
-        part.plane[k] += ptrdiff_t(y >> log2) * p.stride[k];
-        part.height[k] = (count + (1 << log2) - 1) >> log2;
-    }
+    if (simgp_band(&p, y, count, &part, &why) != SIMGP_OK) fail(why);
     return part;
 }
 

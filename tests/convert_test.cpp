@@ -130,6 +130,12 @@ TEST_F(convert_test, raw_files_of_every_yuv_format_keep_the_bars) {
     for (int c = 0; c < 3; ++c) EXPECT_LE(*last.sample(c, 96, 0), 8);
     // 97 x 51: one pair of tile rows of one group; chroma of 25 rows: one single tile row.
     EXPECT_EQ(fs::file_size(at("t64x3297x51.t64x32")), 3u * (8192 + 8192));
+    // Formats go by the names that others give them, in capitals too.
+    good("yuv42097x51.yuv420 --size 97x51 --format I420 --to yuyv422 -o other.raw");
+    good("yuv42097x51.yuv420 --size 97x51 -o own.yuyv");
+    EXPECT_EQ(read("other.raw"), read("own.yuyv"));
+    good("yuv42097x51.yuv420 --size 97x51 -o by_ending.YUY2");
+    EXPECT_EQ(read("by_ending.YUY2"), read("own.yuyv"));
 }
 
 TEST_F(convert_test, every_rgb_format_has_the_bars_and_widens_to_full_white) {

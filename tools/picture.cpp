@@ -54,15 +54,6 @@ constexpr auto table = [] {
 
 int even(int n) { return n + (n & 1); }
 int whole_fours(int n) { return (n + 3) & ~3; }
-int shifted_up(int n, int shift) { return (n + (1 << shift) - 1) >> shift; }
-
-// As simgp/tile.h says: whole pairs of tile rows hold groups of 2 x 2 tiles; a last single one,
-// groups of 4 x 1.
-size_t tiled_plane_bytes(size_t line_bytes, size_t lines) {
-    const size_t tile_rows = (lines + 31) / 32;
-    return 8192 * ((line_bytes + 127) / 128 * (tile_rows / 2) +
-                   (tile_rows % 2 ? (line_bytes + 255) / 256 : 0));
-}
 
 }  // namespace
 
@@ -132,27 +123,27 @@ void parse_size(std::string_view text, const std::string &what, int &width, int 
 }
 
 picture::picture(const picture_shape &shape) : shape_(shape) {
-    size_t total = 0;
-    for (int k = 0; k < planes(); ++k) {
-        const plane_shape &p = format().planes[k];
-        start_[k] = total;
-        if (format().is_tiled()) {
-            lines_[k] = 1;
-            line_bytes_[k] = tiled_plane_bytes(width(), height() >> p.y_shift);
-            total += line_bytes_[k];
-            continue;
-        }
-        lines_[k] = shifted_up(height(), p.y_shift);
-        line_bytes_[k] = size_t(shifted_up(width(), p.x_shift)) * p.bytes;
-        stride_[k] = ptrdiff_t(shifted_up(whole_fours(width()), p.x_shift)) * p.bytes;
-        total += size_t(stride_[k]) * shifted_up(whole_fours(height()), p.y_shift);
-    }
-    memory_.resize(total);
+    const bool tiled = format().is_tiled();
+    const char *why = "";
+    if (simgp_lay_out(&layout_, format().code, tiled ? width() : whole_fours(width()),
+                      tiled ? height() : whole_fours(height()), 1, &why) != SIMGP_OK)
+        throw fault("a picture of ", width(), "x", height(), ": ", why);
+    memory_.resize(layout_.bytes);
+}
+
+size_t picture::line_bytes(int plane) const {
+    return size_t(format().is_tiled()
+                      ? simgp_plane_bytes(format().code, plane, width(), height(), 0)
+                      : simgp_line_bytes(format().code, plane, width()));
+}
+
+int picture::lines(int plane) const {
+    return format().is_tiled() ? 1 : simgp_plane_height(format().code, plane, height());
 }
 
 size_t picture::raw_bytes() const {
     size_t total = 0;
-    for (int k = 0; k < planes(); ++k) total += line_bytes_[k] * lines_[k];
+    for (int k = 0; k < planes(); ++k) total += line_bytes(k) * size_t(lines(k));
     return total;
 }
 
@@ -162,10 +153,9 @@ simgp_img picture::descriptor(bool even_width, bool even_height) {
     simgp_img img = {};
     img.format = format().code;
     for (int k = 0; k < planes(); ++k) {
-        const plane_shape &p = format().planes[k];
-        img.width[k] = shifted_up(w, p.x_shift);
-        img.height[k] = format().is_tiled() ? h >> p.y_shift : shifted_up(h, p.y_shift);
-        img.stride[k] = int32_t(stride_[k]);
+        img.width[k] = simgp_plane_width(img.format, k, w);
+        img.height[k] = simgp_plane_height(img.format, k, h);
+        img.stride[k] = layout_.stride[k];
         img.plane[k] = line(k, 0);
     }
     return img;

@@ -26,7 +26,8 @@ struct channel {
     int plane, first, step, x_shift, y_shift;
 };
 
-// All that the tools know about the layout of a format, made from the library's own table. Only the bits of 16-bit RGB are the business of rgb.cpp.
+// All that the tools know about the layout of a format, made from the library's own table. Only the
+// bits of 16-bit RGB are the business of rgb.cpp.
 struct pixel_format {
     enum class family { planar, packed, tiled, rgb16, rgb };
 
@@ -89,13 +90,15 @@ class picture {
     int height() const { return shape_.height; }
 
     int planes() const { return format().plane_count; }
-    uint8_t *line(int plane, int y) { return memory_.data() + start_[plane] + y * stride_[plane]; }
+    uint8_t *line(int plane, int y) {
+        return memory_.data() + layout_.offset[plane] + ptrdiff_t(y) * layout_.stride[plane];
+    }
     const uint8_t *line(int plane, int y) const {
         return const_cast<picture *>(this)->line(plane, y);
     }
     // Visible bytes in a line and visible lines: what a raw file holds. A tiled plane is one line.
-    size_t line_bytes(int plane) const { return line_bytes_[plane]; }
-    int lines(int plane) const { return lines_[plane]; }
+    size_t line_bytes(int plane) const;
+    int lines(int plane) const;
     size_t raw_bytes() const;
 
     // The library's descriptor. `even_width` and `even_height` round the size up to even numbers;
@@ -114,9 +117,7 @@ class picture {
   private:
     picture_shape shape_;
     std::vector<uint8_t> memory_;
-    size_t start_[3] = {}, line_bytes_[3] = {};
-    ptrdiff_t stride_[3] = {};
-    int lines_[3] = {};
+    simgp_layout layout_ = {};
 };
 
 }  // namespace tools
