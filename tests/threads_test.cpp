@@ -34,7 +34,7 @@ void at_once(const std::function<void(int)> &work) {
 // The library chooses its rows once in a process, so each round has a process of its own. This one,
 // which never calls the library, must stay as it is.
 void in_fresh_processes(const std::function<bool()> &succeeds) {
-    const int rounds = getenv("SIMGP_TEST_QUICK") ? 20 : 200;
+    const int rounds = getenv("SIMGP_TEST_QUICK") ? 10 : 100;
     for (int i = 0; i < rounds; i++) {
         fflush(nullptr);
         const pid_t child = fork();

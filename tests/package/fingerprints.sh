@@ -1,4 +1,4 @@
-# simgp-check calls every exported function, and the table has a line for each.
+# simgp-check calls every exported function, the table has a line for each, and a wrong line is found.
 . "$(dirname "$0")/gate.sh" "$1"
 
 grep '^[a-z]' "$source_dir/cmake/exports.txt" | sort >"$scratch/exports"
@@ -19,4 +19,13 @@ compare "$scratch/called" "Names that simgp-check takes from the library"
 table=$source_dir/docs/fingerprints.txt
 grep '^[a-z]' "$table" | grep -v '^all ' | cut -d ' ' -f 1 | sort >"$scratch/known"
 compare "$scratch/known" "Lines of docs/fingerprints.txt"
+
+# The comparison finds one function that differs, and says which, and one that is missing.
+sed 's/^scmn_ceil_log2 .*/scmn_ceil_log2 12345678/; /^scmn_floor_log2/d' "$table" >"$scratch/altered"
+# shellcheck disable=SC2086
+said=$($emulator "$check" --compare "$scratch/altered" --function scmn_ceil_log2 --function scmn_floor_log2 \
+    --function scmn_bsr_clz_in_code)
+status=$?
+[ $status -eq 1 ] && grep -q '^scmn_ceil_log2 .*should be 12345678' <<<"$said" && grep -q '^scmn_floor_log2 ' <<<"$said" &&
+    ! grep -q '^scmn_bsr_clz_in_code' <<<"$said" || fault "With an altered table, status $status and:" "$said"
 finish
