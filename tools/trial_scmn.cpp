@@ -365,7 +365,7 @@ void weights(trial &t, const function &) { t.result(tbl_rsz_weight, sizeof tbl_r
 }  // namespace
 
 void add_stream_functions(std::vector<function> &all) {
-    constexpr int usual = 48;
+    constexpr int usual = 96;
     const auto add = [&](const char *name, int calls, run_fn run, auto *code, int32_t number = 0) {
         all.push_back({name, calls, run, reinterpret_cast<void (*)()>(code), {number}});
     };

@@ -299,7 +299,7 @@ void resize_table(trial &t, const function &) {
 }  // namespace
 
 void add_pixel_functions(std::vector<function> &all) {
-    constexpr int few = 24, usual = 48, many = int(std::size(formats) * std::size(formats));
+    constexpr int few = 24, usual = 144, many = int(std::size(formats) * std::size(formats));
     const auto add = [&](const char *name, int calls, run_fn run, auto *code, int32_t a = 0,
                          int32_t b = 0, int32_t c = 0) {
         all.push_back({name, calls, run, reinterpret_cast<void (*)()>(code), {a, b, c}});
