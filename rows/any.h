@@ -61,10 +61,11 @@ enum class chroma_in : uint8_t {
     count
 };
 
-// Converts `width` >= 1 pixels: luma, and the chroma of pixels 0, 2, 4, ..., (width + 1) / 2
-// samples, to u and v, or to u as pairs, or not at all.
-using any_to_yuv_row = void(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
-                            uint8_t *v, ptrdiff_t width);
+// Converts `width` >= 1 pixels of a row: luma, and the chroma of pixels 0, 2, 4, ..., (width + 1) / 2
+// samples, to u and v, or to u as pairs, or not at all; and of the row src1, unless that is null,
+// luma alone.
+using any_to_yuv_row = void(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
+                            uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width);
 enum class chroma_out : uint8_t { none, half, pairs, count };
 
 // The chroma of `count` >= 1 pixels from planes of their channels.

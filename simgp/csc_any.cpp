@@ -89,11 +89,15 @@ uint8_t chroma_of(const int16_t (&w)[3], const channels &p) {
 }
 
 template <pixel_kind Kind, chroma_out Out>
-void any_to_yuv(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
-                ptrdiff_t width) {
+void any_to_yuv(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    const auto pixel = [&w](const uint8_t *src, ptrdiff_t x) {
+        return read_channels<rgb_in(Kind)>(src + w.alpha_first, x);
+    };
     for (ptrdiff_t x = 0; x < width; x++) {
-        const channels p = read_channels<rgb_in(Kind)>(src + w.alpha_first, x);
-        y[x] = luma_of(w, p);
+        const channels p = pixel(src0, x);
+        y0[x] = luma_of(w, p);
+        if (src1) y1[x] = luma_of(w, pixel(src1, x));
         if (Out == chroma_out::none || x & 1) continue;
         const uint8_t of_u = chroma_of(w.u, p), of_v = chroma_of(w.v, p);
         if (Out == chroma_out::half) {
@@ -576,24 +580,30 @@ void yuv_to_rgb_pictures(const job &j) {
     any_to_rgb_row *const row = j.rows.to_rgb[in][kind];
     any_to_rgb_row_pair *const row_pair = j.rows.to_rgb_pair[in][kind];
     const bool shared_down = sharing_of(j.from).down;
-    // Rows read what lies in linear planes, whole lines of it.
-    const bool direct = j.from.kind != format_kind::tiled && j.from.u >= 0;
-    const bool pairs = has_pairs(j.from);
-    for_each_band(j, direct ? j.width : strip_width, 2, [&](const strip_rows &b) {
-        yuv_strip strip;
-        planar_band p{};
-        if (!direct || !(pairs || j.from.kind == format_kind::packed)) {
-            p = read_band(j, b, strip);
-        } else {
-            for (ptrdiff_t r = 0; r < b.rows; r++) p.y[r] = j.in(0).line(b.y + r);
-            if (pairs) p.u[0] = j.in(1).line(b.y >> 1);
+    const lines out = j.out(0);
+    if (j.from.kind != format_kind::tiled && j.from.u >= 0) {
+        // Rows read what lies in linear planes, whole lines of it.
+        const const_lines luma = j.in(0), u = j.in(j.from.u), v = j.in(j.from.v);
+        for (ptrdiff_t y = 0; y < j.height; y++) {
+            const ptrdiff_t line = y >> shared_down;
+            if (!shared_down || y + 1 == j.height) {
+                row(how, luma.line(y), u.line(line), v.line(line), out.line(y), j.width);
+                continue;
+            }
+            row_pair(how, luma.line(y), luma.line(y + 1), u.line(line), v.line(line), out.line(y),
+                     out.line(y + 1), j.width);
+            y++;
         }
-        uint8_t *dst[2];
-        for (ptrdiff_t r = 0; r < 2; r++)
-            dst[r] = j.out(0).line(b.y + (r < b.rows ? r : 0)) + b.x * j.to.bytes[0];
-        if (shared_down && b.rows == 2)
-            return row_pair(how, p.y[0], p.y[1], p.u[0], p.v[0], dst[0], dst[1], b.width);
-        for (ptrdiff_t r = 0; r < b.rows; r++) row(how, p.y[r], p.u[r], p.v[r], dst[r], b.width);
+        return;
+    }
+    for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
+        yuv_strip strip;
+        const planar_band p = read_band(j, b, strip);
+        uint8_t *const dst = out.line(b.y) + b.x * j.to.bytes[0];
+        if (b.rows == 2)
+            row_pair(how, p.y[0], p.y[1], p.u[0], p.v[0], dst, dst + out.stride, b.width);
+        else
+            row(how, p.y[0], p.u[0], p.v[0], dst, b.width);
     });
 }
 
@@ -641,32 +651,42 @@ void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, cons
 void rgb_to_yuv_pictures(const job &j) {
     rgb_weights w = in_memory_order(to_yuv_weights[j.colour], j.from.packing);
     any_to_yuv_row *const *const rows = j.rows.to_yuv[size_t(kind_of(j.from.packing))];
-    any_to_yuv_row *const luma = rows[size_t(chroma_out::none)];
     const sharing to = sharing_of(j.to);
     // Rows give the chroma of every second pixel; pairs of theirs need no strip.
     const bool by_rows = j.to.u >= 0 && to.across && !averages(j);
     const bool pairs = by_rows && j.to.kind == format_kind::planar && has_pairs(j.to);
-    const bool direct = by_rows ? pairs || j.to.kind == format_kind::planar : j.to.u < 0;
     if (pairs && j.to.layout == yuv_layout::vu)
         for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
-    any_to_yuv_row *const with_chroma =
-        !by_rows ? luma : rows[size_t(pairs ? chroma_out::pairs : chroma_out::half)];
-    for_each_band(j, direct ? j.width : strip_width, 2, [&](const strip_rows &b) {
+    any_to_yuv_row *const row = rows[size_t(!by_rows ? chroma_out::none
+                                            : pairs  ? chroma_out::pairs
+                                                     : chroma_out::half)];
+    const ptrdiff_t rows_at_once = to.down ? 2 : 1;
+    if (j.to.u < 0 || (by_rows && j.to.kind == format_kind::planar)) {
+        // Straight to their places, whole lines of them.
+        const int of_u = j.to.u < 0 ? 0 : j.to.u, of_v = j.to.u < 0 ? 0 : j.to.v;
+        const const_lines in = j.in(0);
+        const lines luma = j.out(0), u = j.out(of_u), v = j.out(of_v);
+        for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
+            const bool two = to.down && y + 1 < j.height;
+            const ptrdiff_t line = y >> to.down;
+            row(w, in.line(y), two ? in.line(y + 1) : nullptr, luma.line(y),
+                two ? luma.line(y + 1) : nullptr, u.line(line), v.line(line), j.width);
+        }
+        return;
+    }
+    for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
-        target_band t = place_band(j, b, strip);
-        if (pairs) t.u[0] = j.out(1).line(b.y >> 1) + b.x;
-        const auto line = [&](ptrdiff_t r) {
+        const target_band t = place_band(j, b, strip);
+        const auto line = [&](ptrdiff_t r) -> const uint8_t * {
             return j.in(0).line(b.y + r) + b.x * j.from.bytes[0];
         };
-        for (ptrdiff_t r = 0; r < b.rows; r++) {
-            const bool chroma = !(to.down && r);
-            (chroma ? with_chroma : luma)(w, line(r), t.y[r], t.u[r], t.v[r], b.width);
-            if (!chroma || by_rows || j.to.u < 0) continue;
-            const bool two = averages(j) && to.down && b.rows == 2;
-            chroma_of_pixels(j, w, line(r), two ? line(1) : nullptr, to.across, t.u[r], t.v[r],
-                             b.width);
+        for (ptrdiff_t r = 0; r < b.rows; r += rows_at_once) {
+            const uint8_t *const below = to.down && b.rows == 2 ? line(1) : nullptr;
+            row(w, line(r), below, t.y[r], t.y[1], t.u[r], t.v[r], b.width);
+            if (by_rows) continue;
+            chroma_of_pixels(j, w, line(r), averages(j) ? below : nullptr, to.across, t.u[r],
+                             t.v[r], b.width);
         }
-        if (direct) return;
         finish_band(j, b, {{t.y[0], t.y[1]}, {t.u[0], t.u[1]}, {t.v[0], t.v[1]}}, t);
     });
 }

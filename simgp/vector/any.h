@@ -326,23 +326,26 @@ inline auto load_pixels(const uint8_t *p) {
 }
 
 template <pixel_kind Kind, chroma_out Out>
-static void any_yuv_row(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
-                        uint8_t *v, ptrdiff_t width) {
+static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     constexpr int size = int(Kind) + 2, chroma_size = Out == chroma_out::pairs ? 2 : 1;
     const any_yuv_matrix<Kind> m(w);
     row_of_steps<Out != chroma_out::none>(
-        width, [&](ptrdiff_t x) { return src + size * x; },
-        [&](ptrdiff_t x, const uint8_t *from) {
-            const auto p = load_pixels<Kind>(from);
-            store(y + x, m.luma(p));
+        width, [](ptrdiff_t x) { return x; },
+        [&](ptrdiff_t x, ptrdiff_t) {
+            const auto p = load_pixels<Kind>(src0 + size * x);
+            store(y0 + x, m.luma(p));
             if constexpr (Out == chroma_out::half) store_split(u + x / 2, v + x / 2, m.chroma(p));
             if constexpr (Out == chroma_out::pairs) store(u + x, m.chroma(p));
+            if (src1) store(y1 + x, m.luma(load_pixels<Kind>(src1 + size * x)));
         },
         [&](ptrdiff_t x, int count) {
-            uint8_t pixels[bytes * size] = {}, to_y[bytes], to_u[bytes], to_v[bytes];
-            memcpy(pixels, src + size * x, size_t(count) * size);
-            any_yuv_row<Kind, Out>(w, pixels, to_y, to_u, to_v, bytes);
-            memcpy(y + x, to_y, size_t(count));
+            uint8_t pixels[2][bytes * size] = {}, to_y[2][bytes], to_u[bytes], to_v[bytes];
+            memcpy(pixels[0], src0 + size * x, size_t(count) * size);
+            if (src1) memcpy(pixels[1], src1 + size * x, size_t(count) * size);
+            any_yuv_row<Kind, Out>(w, pixels[0], pixels[1], to_y[0], to_y[1], to_u, to_v, bytes);
+            memcpy(y0 + x, to_y[0], size_t(count));
+            if (src1) memcpy(y1 + x, to_y[1], size_t(count));
             if (Out == chroma_out::none) return;
             const size_t samples = size_t(count + 1) / 2;
             memcpy(u + chroma_size * (x / 2), to_u, chroma_size * samples);
