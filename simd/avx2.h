@@ -581,13 +581,13 @@ inline __m256i set_quad(bool skips_first, int a, int b, int c) {
     const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
     return set_u32(skips_first ? all << 8 : all);
 }
-// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these.
+// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
+// the shift, as the weights' sum is even.
 struct quad_weights {
     __m256i weights, offset;
 };
 inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
-    return {set_quad(skips_first, a, b, c),
-            set_u16(static_cast<uint16_t>(128 * (a + b + c) + 256 * d))};
+    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
 }
 inline __m256i add_pairs(__m256i a, __m256i b) {
     const __m256i one = _mm256_set1_epi16(1);
@@ -602,10 +602,10 @@ inline u8v dot_high(const quads_v &v, const quad_weights &w) {
         return _mm256_maddubs_epi16(w.weights, _mm256_xor_si256(x, _mm256_set1_epi8(-128)));
     };
     const auto half = [&](__m256i x, __m256i y) {
-        return _mm256_srli_epi16(_mm256_add_epi16(add_pairs(products(x), products(y)), w.offset),
-                                 8);
+        return _mm256_srai_epi16(add_pairs(products(x), products(y)), 8);
     };
-    return unpack_order(_mm256_packus_epi16(half(v.v[0], v.v[1]), half(v.v[2], v.v[3])));
+    return _mm256_add_epi8(
+        unpack_order(_mm256_packs_epi16(half(v.v[0], v.v[1]), half(v.v[2], v.v[3]))), w.offset);
 }
 using quad_factors = __m256i;
 inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {

@@ -617,9 +617,9 @@ struct quad_factors {
         return a * pixel[0] + b * pixel[1] + c * pixel[2];
     }
 };
-// ((a c0 + b c1 + c c2) >> 8) + d of each pixel. The weights are 0 or more, those of two neighbours
-// in memory, from the first byte on, at most 255 together and all of them 256, and the sum and
-// 256 d fit 16 bits, unsigned.
+// ((a c0 + b c1 + c c2) >> 8) + d of each pixel, kept to 8 bits. The weights are 0 or more, those of
+// two neighbours in memory, from the first byte on, at most 255 together, and the sum of all is even
+// and at most 256.
 using quad_weights = quad_factors;
 inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
     return {a, b, c, d, skips_first};

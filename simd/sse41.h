@@ -505,13 +505,13 @@ inline __m128i set_quad(bool skips_first, int a, int b, int c) {
     const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
     return set_u32(skips_first ? all << 8 : all);
 }
-// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these.
+// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
+// the shift, as the weights' sum is even.
 struct quad_weights {
     __m128i weights, offset;
 };
 inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
-    return {set_quad(skips_first, a, b, c),
-            set_u16(static_cast<uint16_t>(128 * (a + b + c) + 256 * d))};
+    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
 }
 inline __m128i add_pairs(__m128i a, __m128i b) {
     const __m128i one = _mm_set1_epi16(1);
@@ -522,9 +522,9 @@ inline u8v dot_high(const quads_v &v, const quad_weights &w) {
         return _mm_maddubs_epi16(w.weights, _mm_xor_si128(x, _mm_set1_epi8(-128)));
     };
     const auto eight = [&](__m128i x, __m128i y) {
-        return _mm_srli_epi16(_mm_add_epi16(add_pairs(products(x), products(y)), w.offset), 8);
+        return _mm_srai_epi16(add_pairs(products(x), products(y)), 8);
     };
-    return _mm_packus_epi16(eight(v.v[0], v.v[1]), eight(v.v[2], v.v[3]));
+    return _mm_add_epi8(_mm_packs_epi16(eight(v.v[0], v.v[1]), eight(v.v[2], v.v[3])), w.offset);
 }
 using quad_factors = __m128i;
 inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {

@@ -262,6 +262,12 @@ constexpr rgb_weights to_yuv_weights[] = {
     {{58, 149, 13}, {-31, -81, 112}, {112, -103, -9}, 16, false},
     {{67, 174, 15}, {-36, -92, 128}, {128, -118, -10}, 0, false},
 };
+constexpr bool luma_sums_are_even() {
+    for (const rgb_weights &w : to_yuv_weights)
+        if ((w.y[0] + w.y[1] + w.y[2]) % 2) return false;
+    return true;
+}
+static_assert(luma_sums_are_even(), "vector rows count on it");
 constexpr int32_t colours = int32_t(sizeof to_rgb_weights / sizeof *to_rgb_weights);
 
 // One call: the formats, the planes, the size.

@@ -177,7 +177,7 @@ static const operation operations[] = {
     MEMORY("repack_8888_to_888, exchanged", 3 * bytes, repack_8888_to_888(out, in - 4 * bytes, set_narrow_moves(true, false))),
     MEMORY("exchange_888", 3 * bytes, exchange_888(out, in - 3 * bytes)),
     MEMORY("load_quads, dot_high", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(false, 77, 150, 29, 0)))),
-    MEMORY("load_quads, dot_high, widest", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(true, 1, 254, 1, 0)))),
+    MEMORY("load_quads, dot_high, widest", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(true, 1, 254, 1, 200)))),
     MEMORY("load_quads, dot_high, offset", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(true, 47, 157, 16, 16)))),
     MEMORY("load_quads, even_dots_high", bytes, put(out, even_dots_high(load_quads(in - 4 * bytes), set_quad_factors(false, 43, 85, -128), set_quad_factors(true, -128, 107, 21), as_s16(set_u16(128))))),
     MEMORY("load_565, even_dot", bytes, put(out, even_dot<112, -94, -18, 32896>(load_565(in - 2 * bytes)))),
