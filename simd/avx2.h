@@ -317,29 +317,31 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
 // the shuffle takes its even pixels from the lower half of the block, its odd ones from the upper.
 struct zip3_index {
     alignas(32) uint8_t ab[3][32], c[3][32];
-    constexpr zip3_index() : ab(), c() {
+    explicit constexpr zip3_index(bool exchange) : ab(), c() {
         for (int k = 0; k < 3; k++)
             for (int i = 0; i < 32; i++) {
-                const int q = 16 * k + i % 16, pixel = q / 3, channel = q % 3;
+                const int q = 16 * k + i % 16, pixel = q / 3,
+                          channel = exchange ? 2 - q % 3 : q % 3;
                 const bool is_c = channel == 2;
                 ab[k][i] = static_cast<uint8_t>(is_c ? 255 : 2 * (pixel - 4 * k) + channel);
                 c[k][i] = static_cast<uint8_t>(is_c ? 8 * (pixel & 1) + pixel / 2 : 255);
             }
     }
 };
-inline constexpr zip3_index zip3;
+inline constexpr zip3_index zip3[2] = {zip3_index(false), zip3_index(true)};
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
+                              s16v c_even, s16v c_odd, bool exchange = false) {
     static_assert(limits::narrowing_shift<C>);
+    const zip3_index &index = zip3[exchange];
     const __m256i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
     const __m256i c =
         _mm256_packus_epi16(_mm256_srai_epi16(c_even, C), _mm256_srai_epi16(c_odd, C));
     const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
     const __m256i ab_mid = _mm256_alignr_epi8(ab_hi, ab_lo, 8);
-    const auto part = [=](__m256i ab, int k) {
-        return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(zip3.ab[k])),
-                               _mm256_shuffle_epi8(c, load(zip3.c[k])));
+    const auto part = [&](__m256i ab, int k) {
+        return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(index.ab[k])),
+                               _mm256_shuffle_epi8(c, load(index.c[k])));
     };
     store_blocks(p, 48, part(ab_lo, 0));
     store_blocks(p + 16, 48, part(ab_mid, 1));
@@ -559,15 +561,18 @@ struct exchange_index {
 };
 inline constexpr exchange_index exchange;
 inline void exchange_888(uint8_t *p, const uint8_t *q) {
-    for (int k = 0; k < 3; k++) {
-        const auto part = [&](int at, const uint8_t *index) {
+    const auto third = [&](int k) __attribute__((always_inline)) {
+        const auto part = [&](int at, const uint8_t *index) __attribute__((always_inline)) {
             return _mm256_shuffle_epi8(load_blocks(q + 15 * k + at, 48),
                                        _mm256_broadcastsi128_si256(_mm_load_si128(
                                            reinterpret_cast<const __m128i *>(index))));
         };
         store_blocks(p + 16 * k, 48,
                      _mm256_or_si256(part(0, exchange.first[k]), part(2, exchange.second[k])));
-    }
+    };
+    third(0);
+    third(1);
+    third(2);
 }
 
 struct quads_v {

@@ -338,7 +338,7 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = 
     constexpr __mmask64 every_third = 0x9249249249249249;  // bits 0, 3, ... 63
     constexpr __mmask64 second[3] = {every_third << 1, every_third, every_third >> 1};
     constexpr __mmask64 third[3] = {every_third << 2, every_third << 1, every_third};
-    const auto part = [&](int k) {
+    const auto part = [&](int k) __attribute__((always_inline)) {
         const __m512i index = load(places + 64 * k);
         __m512i v = _mm512_permutexvar_epi8(index, a);
         v = _mm512_mask_permutexvar_epi8(v, second[k], index, b);
@@ -357,9 +357,9 @@ inline __m512i pack(s16v even, s16v odd) {
 }
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
-    store_zip3(p, pack<A>(a_even, a_odd), pack<B>(b_even, b_odd), pack<C>(c_even, c_odd),
-               zip3.packed);
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    const __m512i a = pack<A>(a_even, a_odd), c = pack<C>(c_even, c_odd);
+    store_zip3(p, exchange ? c : a, pack<B>(b_even, b_odd), exchange ? a : c, zip3.packed);
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const __m512i ab_lo = _mm512_unpacklo_epi8(a, b), ab_hi = _mm512_unpackhi_epi8(a, b);
@@ -597,13 +597,16 @@ struct exchange_index {
 };
 inline constexpr exchange_index exchange;
 inline void exchange_888(uint8_t *p, const uint8_t *q) {
-    for (int k = 0; k < 3; k++) {
+    const auto third = [&](int k) __attribute__((always_inline)) {
         const __m512i second = load(exchange.second[k]);
         const __m512i v = _mm512_permutexvar_epi8(load(exchange.first[k]), load(q + 63 * k));
         store(p + bytes * k,
               _mm512_mask_permutexvar_epi8(v, _mm512_cmplt_epu8_mask(second, set_u8(128)), second,
                                            load(q + 63 * k + 2)));
-    }
+    };
+    third(0);
+    third(1);
+    third(2);
 }
 
 struct quads_v {

@@ -288,9 +288,9 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
 }
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
-    store_zip3(p, narrow_join<A>(a_even, a_odd), narrow_join<B>(b_even, b_odd),
-               narrow_join<C>(c_even, c_odd));
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    const u8v a = narrow_join<A>(a_even, a_odd), c = narrow_join<C>(c_even, c_odd);
+    store_zip3(p, exchange ? c : a, narrow_join<B>(b_even, b_odd), exchange ? a : c);
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const uint8x16x4_t v = {{a, b, c, d}};

@@ -39,14 +39,18 @@ struct any_terms {
     s16v r, g, b1, b2;
 };
 struct any_rgb {
-    s16v first, g, last;
+    s16v r, g, b;
+};
+// The order of a pixel's channels. Whole vectors change places, as late as they can.
+struct any_order {
+    bool blue_first, alpha_first;
 };
 
 struct any_matrix {
     u16v luma, green_u, green_v, blue1;
     half_factor red, blue2;
     s16v luma_c, red_c, green_c, blue1_c, blue2_c;
-    bool blue_first, alpha_first;
+    any_order order;
 
     static s16v constant(int c) { return as_s16(set_u16(static_cast<uint16_t>(c))); }
     static u16v factor(int k) { return set_u16(static_cast<uint16_t>(k)); }
@@ -66,8 +70,7 @@ struct any_matrix {
         blue1_c = constant(-64 * of_blue1);
         blue2 = set_half_factor(of_blue2);
         blue2_c = constant(bias - 64 * of_blue2);
-        blue_first = how.blue_first;
-        alpha_first = how.alpha_first;
+        order = {how.blue_first, how.alpha_first};
     }
 
     any_terms terms(u16v u, u16v v) const {
@@ -77,10 +80,7 @@ struct any_matrix {
     }
     any_rgb apply(u16v y, const any_terms &c) const {
         const s16v l = add(as_s16(mul(y, luma)), luma_c);
-        const s16v r = add_sat(l, c.r), b = add_sat(add_sat(l, c.b1), c.b2);
-        any_rgb p{r, add_sat(l, c.g), b};
-        if (blue_first) p.first = b, p.last = r;
-        return p;
+        return {add_sat(l, c.r), add_sat(l, c.g), add_sat(add_sat(l, c.b1), c.b2)};
     }
 };
 
@@ -90,27 +90,33 @@ template <>
 struct any_packer<pixel_kind::words> {
     static constexpr pixel_order order = pixel_order::by8;
     static constexpr int size = 2;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool) {
-        store_zip16(dst, pack565(even.first, even.g, even.last),
-                    pack565(odd.first, odd.g, odd.last));
+    static u16v pack(const any_rgb &p, bool blue_first) {
+        s16v first = p.r, last = p.b;
+        if (blue_first) first = p.b, last = p.r;
+        return pack565(first, p.g, last);
+    }
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+        store_zip16(dst, pack(even, o.blue_first), pack(odd, o.blue_first));
     }
 };
 template <>
 struct any_packer<pixel_kind::three> {
     static constexpr pixel_order order = pixel_order::natural;
     static constexpr int size = 3;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool) {
-        store_narrow_zip3<7, 7, 7>(dst, even.first, odd.first, even.g, odd.g, even.last, odd.last);
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+        store_narrow_zip3<7, 7, 7>(dst, even.r, odd.r, even.g, odd.g, even.b, odd.b, o.blue_first);
     }
 };
 template <>
 struct any_packer<pixel_kind::four> {
     static constexpr pixel_order order = pixel_order::by4;
     static constexpr int size = 4;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool alpha_first) {
-        const u8v first = narrow_join<7>(even.first, odd.first), g = narrow_join<7>(even.g, odd.g),
-                  last = narrow_join<7>(even.last, odd.last), a = set_u8(255);
-        if (alpha_first)
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+        const u8v r = narrow_join<7>(even.r, odd.r), g = narrow_join<7>(even.g, odd.g),
+                  b = narrow_join<7>(even.b, odd.b), a = set_u8(255);
+        u8v first = r, last = b;
+        if (o.blue_first) first = b, last = r;
+        if (o.alpha_first)
             store_zip4(dst, a, first, g, last);
         else
             store_zip4(dst, first, g, last, a);
@@ -198,14 +204,14 @@ static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, c
     const auto write_half = [&](ptrdiff_t x, const yuv_half &p) {
         const any_chroma c = from.chroma(p.pairs);
         const any_terms t = m.terms(c.u, c.v);
-        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.alpha_first);
+        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.order);
     };
     const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
         const auto half = [&](u16v luma, u8v pairs) {
             return m.apply(luma, m.terms(even(pairs), odd(pairs)));
         };
         to::store(dst + x * to::size, half(even(p.y), p.pairs_even), half(odd(p.y), p.pairs_odd),
-                  m.alpha_first);
+                  m.order);
     };
     const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
     const auto part = [&](ptrdiff_t x, int count) { any_part<In, Kind>(how, in, dst, x, count); };
@@ -236,9 +242,9 @@ static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t
             const any_chroma c = from.chroma(p.first.pairs);
             const any_terms t = m.terms(c.u, c.v);
             to::store(dst0 + x * to::size, m.apply(even(p.first.y), t), m.apply(odd(p.first.y), t),
-                      m.alpha_first);
+                      m.order);
             to::store(dst1 + x * to::size, m.apply(even(p.second_y), t),
-                      m.apply(odd(p.second_y), t), m.alpha_first);
+                      m.apply(odd(p.second_y), t), m.order);
         },
         [&](ptrdiff_t x, int count) {
             any_part<In, Kind>(how, in, dst0, x, count);

@@ -186,6 +186,7 @@ static const operation operations[] = {
     MEMORY("store_zip16", 2 * bytes, store_zip16(out, u16(in, 0), u16(in, 1))),
     MEMORY("store_zip3", 3 * bytes, store_zip3(out, u8(in, 0), u8(in, 1), u8(in, 2))),
     MEMORY("store_narrow_zip3", 3 * bytes, store_narrow_zip3<7, 6, 5>(out, s16(in, 0), s16(in, 1), s16(in, 2), s16(in, 3), s16(in, 4), s16(in, 5))),
+    MEMORY("store_narrow_zip3, exchanged", 3 * bytes, store_narrow_zip3<7, 6, 5>(out, s16(in, 0), s16(in, 1), s16(in, 2), s16(in, 3), s16(in, 4), s16(in, 5), true)),
     MEMORY("store_zip4", 4 * bytes, store_zip4(out, u8(in, 0), u8(in, 1), u8(in, 2), u8(in, 3))),
 };
 // clang-format on
