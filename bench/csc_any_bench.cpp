@@ -56,7 +56,7 @@ std::vector<comparison> csc_any_comparisons() {
     const auto via_i422 = [](const operation &on) {
         return libyuv_peer(of_planes<1, 3>(YUY2ToI422), SIMGP_FMT_YUV422N, on);
     };
-    const goal rgb24{1.3}, rgb32{1.1}, capture{1.3}, packed{1.0, 0, 0.9}, rgb{1.0};
+    const goal rgb24{1.3}, rgb32{1.1}, capture{1.3}, packed{1.0, 0, 0.9}, of_bgr{1.2}, rgb{1.0};
 
     // clang-format off
     std::vector<conversion> all = {
@@ -75,6 +75,9 @@ std::vector<comparison> csc_any_comparisons() {
         {SIMGP_FMT_BGRA8888, SIMGP_FMT_NV12,     capture, {libyuv_peer(of_planes<1, 2>(ARGBToNV12))}},
         {SIMGP_FMT_BGRA8888, SIMGP_FMT_YUV420,   capture, {libyuv_peer(of_planes<1, 3>(ARGBToI420))}},
 
+        {SIMGP_FMT_BGR888,   SIMGP_FMT_YUV420,   of_bgr, {libyuv_peer(of_planes<1, 3>(RGB24ToI420))}},
+        {SIMGP_FMT_BGR888,   SIMGP_FMT_NV12,     of_bgr, {libyuv_peer(of_planes<1, 1>(RGB24ToARGB), SIMGP_FMT_BGRA8888, of_planes<1, 2>(ARGBToNV12))}},
+
         {SIMGP_FMT_YUYV,     SIMGP_FMT_NV12,     packed, {libyuv_peer(of_planes<1, 2>(YUY2ToNV12))}},
         {SIMGP_FMT_YUYV,     SIMGP_FMT_YUV420,   packed, {libyuv_peer(of_planes<1, 3>(YUY2ToI420))}},
         {SIMGP_FMT_UYVY,     SIMGP_FMT_NV12,     packed, {libyuv_peer(of_planes<1, 2>(UYVYToNV12))}},
@@ -86,12 +89,26 @@ std::vector<comparison> csc_any_comparisons() {
         {SIMGP_FMT_RGB888,   SIMGP_FMT_RGBA8888, rgb, {libyuv_peer(of_planes<1, 1>(RGB24ToARGB)), opencv_peer(3, 4, cv::COLOR_RGB2RGBA)}},
         {SIMGP_FMT_RGB888,   SIMGP_FMT_BGRA8888, rgb, {libyuv_peer(of_planes<1, 1>(RAWToARGB)), opencv_peer(3, 4, cv::COLOR_RGB2BGRA)}},
         {SIMGP_FMT_RGB888,   SIMGP_FMT_BGR888,   rgb, {opencv_peer(3, 3, cv::COLOR_RGB2BGR)}},
+        {SIMGP_FMT_BGR888,   SIMGP_FMT_RGBA8888, rgb, {libyuv_peer(of_planes<1, 1>(RAWToARGB)), opencv_peer(3, 4, cv::COLOR_BGR2RGBA)}},
     };
+    // With averaged chroma, as the peers have it; nothing is asked of these.
+    const size_t first_mean = all.size();
+    for (conversion c : std::initializer_list<conversion>{
+        {SIMGP_FMT_RGBA8888, SIMGP_FMT_NV12,     {}, {libyuv_peer(of_planes<1, 2>(ABGRToNV12))}},
+        {SIMGP_FMT_BGR888,   SIMGP_FMT_YUV420,   {}, {libyuv_peer(of_planes<1, 3>(RGB24ToI420))}},
+        {SIMGP_FMT_YUYV,     SIMGP_FMT_NV12,     {}, {libyuv_peer(of_planes<1, 2>(YUY2ToNV12))}},
+        {SIMGP_FMT_YUV444,   SIMGP_FMT_YUV420,   {}, {libyuv_peer(of_planes<3, 3>(I444ToI420))}},
+    }) {
+        c.goals.scalar = 0;
+        all.push_back(std::move(c));
+    }
     // clang-format on
-    for (conversion &c : all) {
+    for (size_t i = 0; i < all.size(); i++) {
+        conversion &c = all[i];
+        const bool mean = i >= first_mean;
         c.colour = SIMGP_COLOUR_BT709;
-        c.ours = any_of(c.colour);
-        c.name_prefix = "any_";
+        c.ours = any_of(c.colour | (mean ? SIMGP_CHROMA_MEAN : 0));
+        c.name_prefix = mean ? "any_mean_" : "any_";
         if (c.from >= SIMGP_FMT_RGB565 && c.to < SIMGP_FMT_RGB565)
             c.tolerance = 0;  // another matrix
     }

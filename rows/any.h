@@ -14,10 +14,11 @@ struct yuv_weights {
 };
 
 // RGB to YUV with 8 fractional bits. The factors are in the order of a pixel's channels in memory,
-// so they differ between RGB and BGR.
+// so they differ between RGB and BGR; of four bytes, alpha stands before or behind them.
 struct rgb_weights {
     int16_t y[3], u[3], v[3];
     uint8_t black;
+    bool alpha_first;
 };
 
 // How the pixels of a packing lie in memory, but for the order of their channels.
@@ -60,16 +61,12 @@ enum class chroma_in : uint8_t {
     count
 };
 
-// Converts `width` >= 1 pixels: luma, and the chroma of pixels 0, 2, 4, ..., (width + 1) / 2
-// samples, to u and v, or to u as pairs, or not at all.
-using any_to_yuv_row = void(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
-                            uint8_t *v, ptrdiff_t width);
+// Converts `width` >= 1 pixels of a row: luma, and the chroma of pixels 0, 2, 4, ..., (width + 1) / 2
+// samples, to u and v, or to u as pairs, or not at all; and of the row src1, unless that is null,
+// luma alone.
+using any_to_yuv_row = void(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
+                            uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width);
 enum class chroma_out : uint8_t { none, half, pairs, count };
-// What any_to_yuv_row reads.
-enum class rgb_in : uint8_t { words, three, four, four_alpha_first, count };
-constexpr rgb_in rgb_in_of(rgb_packing packing) {
-    return is_alpha_first(packing) ? rgb_in::four_alpha_first : rgb_in(kind_of(packing));
-}
 
 // The chroma of `count` >= 1 pixels from planes of their channels.
 using chroma_row = void(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
@@ -79,7 +76,14 @@ using chroma_row = void(const rgb_weights &w, const uint8_t *const channels[3], 
 // shifting alone.
 using split_pixels_row = void(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count);
 
-// Writes `count` >= 1 pixels in another way: the first channel and the last one may change places.
+// What split_pixels_row reads.
+enum class rgb_in : uint8_t { words, three, four, four_alpha_first, count };
+constexpr rgb_in rgb_in_of(rgb_packing packing) {
+    return is_alpha_first(packing) ? rgb_in::four_alpha_first : rgb_in(kind_of(packing));
+}
+
+// Writes `count` >= 1 pixels in another way: the first channel and the last one may change places,
+// and do so where three bytes become three.
 // Words lose the low bits of their channels; alpha is carried, or is 255.
 struct repacking {
     bool exchange, from_alpha_first, to_alpha_first;
@@ -92,6 +96,12 @@ using split_groups_row = void(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_
 using join_groups_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                              ptrdiff_t pairs, bool luma_first);
 
+// Takes two lines apart, which may be one and the same: the luma of both, and the chroma of the
+// first, to u and v, or to u as pairs U V.
+using groups_to_planes_row = void(const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                                  uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
+                                  bool luma_first);
+
 // `count` >= 1 samples from lines a and b: the mean of two, a[x] and b[x]; of two, a[2x] and
 // a[2x + 1]; of four, of both lines. Rounded, halves up.
 using mean_row = void(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count);
@@ -102,12 +112,13 @@ using resample_row = void(const uint8_t *a, uint8_t *dst, ptrdiff_t count);
 struct any_rows {
     any_to_rgb_row *to_rgb[size_t(chroma_in::count)][size_t(pixel_kind::count)];
     any_to_rgb_row_pair *to_rgb_pair[size_t(chroma_in::count)][size_t(pixel_kind::count)];
-    any_to_yuv_row *to_yuv[size_t(rgb_in::count)][size_t(chroma_out::count)];
+    any_to_yuv_row *to_yuv[size_t(pixel_kind::count)][size_t(chroma_out::count)];
     chroma_row *chroma;
     split_pixels_row *split_pixels[size_t(rgb_in::count)];
     repack_row *repack[size_t(pixel_kind::count)][size_t(pixel_kind::count)];
     split_groups_row *split_groups;
     join_groups_row *join_groups;
+    groups_to_planes_row *groups_to_planes, *groups_to_pairs;
     mean_row *mean_of_lines, *mean_of_pairs, *mean_of_blocks;
     resample_row *every_second, *twice;
 };

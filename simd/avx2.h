@@ -317,29 +317,31 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
 // the shuffle takes its even pixels from the lower half of the block, its odd ones from the upper.
 struct zip3_index {
     alignas(32) uint8_t ab[3][32], c[3][32];
-    constexpr zip3_index() : ab(), c() {
+    explicit constexpr zip3_index(bool exchange) : ab(), c() {
         for (int k = 0; k < 3; k++)
             for (int i = 0; i < 32; i++) {
-                const int q = 16 * k + i % 16, pixel = q / 3, channel = q % 3;
+                const int q = 16 * k + i % 16, pixel = q / 3,
+                          channel = exchange ? 2 - q % 3 : q % 3;
                 const bool is_c = channel == 2;
                 ab[k][i] = static_cast<uint8_t>(is_c ? 255 : 2 * (pixel - 4 * k) + channel);
                 c[k][i] = static_cast<uint8_t>(is_c ? 8 * (pixel & 1) + pixel / 2 : 255);
             }
     }
 };
-inline constexpr zip3_index zip3;
+inline constexpr zip3_index zip3[2] = {zip3_index(false), zip3_index(true)};
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
+                              s16v c_even, s16v c_odd, bool exchange = false) {
     static_assert(limits::narrowing_shift<C>);
+    const zip3_index &index = zip3[exchange];
     const __m256i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
     const __m256i c =
         _mm256_packus_epi16(_mm256_srai_epi16(c_even, C), _mm256_srai_epi16(c_odd, C));
     const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
     const __m256i ab_mid = _mm256_alignr_epi8(ab_hi, ab_lo, 8);
-    const auto part = [=](__m256i ab, int k) {
-        return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(zip3.ab[k])),
-                               _mm256_shuffle_epi8(c, load(zip3.c[k])));
+    const auto part = [&](__m256i ab, int k) {
+        return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(index.ab[k])),
+                               _mm256_shuffle_epi8(c, load(index.c[k])));
     };
     store_blocks(p, 48, part(ab_lo, 0));
     store_blocks(p + 16, 48, part(ab_mid, 1));
@@ -494,6 +496,137 @@ inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
     };
     store_565(p, eight(q, 24, all), eight(q + 12, 24, all), eight(q + 48, 24, all),
               eight(q + 60, 20, last));
+}
+
+// Which byte of a pixel of three goes to each byte of one of four; 128: none.
+inline uint32_t widen_from(bool exchange, bool alpha_first) {
+    const uint32_t channels = exchange ? 0x000102 : 0x020100;
+    return alpha_first ? channels << 8 | 0x80 : channels | 0x80u << 24;
+}
+struct widen_moves {
+    __m256i all, last, alpha;  // the last four pixels are those at byte 4 of a load
+};
+inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
+    const __m256i pixels =
+        _mm256_broadcastsi128_si256(_mm_setr_epi8(0, 0, 0, 0, 3, 3, 3, 3, 6, 6, 6, 6, 9, 9, 9, 9));
+    const __m256i all = _mm256_add_epi8(pixels, set_u32(widen_from(exchange, to_alpha_first)));
+    return {all,
+            _mm256_add_epi8(all, _mm256_setr_epi64x(0, 0, 0x0404040404040404, 0x0404040404040404)),
+            set_u32(to_alpha_first ? 255 : 255u << 24)};
+}
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+    const auto eight = [&](int k, ptrdiff_t step, __m256i moves) {
+        store(p + bytes * k,
+              _mm256_or_si256(_mm256_shuffle_epi8(load_blocks(q + 24 * k, step), moves), m.alpha));
+    };
+    eight(0, 12, m.all);
+    eight(1, 12, m.all);
+    eight(2, 12, m.all);
+    eight(3, 8, m.last);
+}
+using narrow_moves = __m256i;
+inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
+    const __m128i channels =
+        exchange ? _mm_setr_epi8(2, 1, 0, 6, 5, 4, 10, 9, 8, 14, 13, 12, -128, -128, -128, -128)
+                 : _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, -128, -128, -128, -128);
+    return _mm256_add_epi8(_mm256_broadcastsi128_si256(channels), set_u8(from_alpha_first));
+}
+// Eight pixels are six dwords, 0 ... 2 of the first block and 0 ... 2 of the second. Of each eight,
+// they are moved to where the outputs want them.
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+    const auto eight = [&](int k, __m256i places) {
+        return _mm256_permutevar8x32_epi32(_mm256_shuffle_epi8(load(q + bytes * k), m), places);
+    };
+    const __m256i a = eight(0, _mm256_setr_epi32(0, 1, 2, 4, 5, 6, 0, 0)),
+                  b = eight(1, _mm256_setr_epi32(2, 4, 5, 6, 0, 0, 0, 1)),
+                  c = eight(2, _mm256_setr_epi32(5, 6, 0, 0, 0, 1, 2, 4)),
+                  d = eight(3, _mm256_setr_epi32(0, 0, 0, 1, 2, 4, 5, 6));
+    store(p, _mm256_blend_epi32(a, b, 0xC0));
+    store(p + bytes, _mm256_blend_epi32(b, c, 0xF0));
+    store(p + 2 * bytes, _mm256_blend_epi32(c, d, 0xFC));
+}
+
+// Two blocks, of 48 bytes each: three loads of 16 bytes hold what 16 bytes of the result are made of, but for one or two; those
+// lie in loads from two bytes on.
+struct exchange_index {
+    alignas(16) uint8_t first[3][16], second[3][16];
+    constexpr exchange_index() : first(), second() {
+        for (int k = 0; k < 3; k++)
+            for (int i = 0; i < 16; i++) {
+                const int to = 16 * k + i, from = to / 3 * 3 + 2 - to % 3 - (16 - 1) * k;
+                first[k][i] = static_cast<uint8_t>(from < 16 ? from : 128);
+                second[k][i] = static_cast<uint8_t>(from < 16 ? 128 : from - 2);
+            }
+    }
+};
+inline constexpr exchange_index exchange;
+inline void exchange_888(uint8_t *p, const uint8_t *q) {
+    const auto third = [&](int k) __attribute__((always_inline)) {
+        const auto part = [&](int at, const uint8_t *index) __attribute__((always_inline)) {
+            return _mm256_shuffle_epi8(load_blocks(q + 15 * k + at, 48),
+                                       _mm256_broadcastsi128_si256(_mm_load_si128(
+                                           reinterpret_cast<const __m128i *>(index))));
+        };
+        store_blocks(p + 16 * k, 48,
+                     _mm256_or_si256(part(0, exchange.first[k]), part(2, exchange.second[k])));
+    };
+    third(0);
+    third(1);
+    third(2);
+}
+
+struct quads_v {
+    __m256i v[4];
+};
+inline quads_v load_quads(const uint8_t *p) {
+    return {{load(p), load(p + bytes), load(p + 2 * bytes), load(p + 3 * bytes)}};
+}
+inline __m256i set_quad(bool skips_first, int a, int b, int c) {
+    const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
+    const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
+    return set_u32(skips_first ? all << 8 : all);
+}
+// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
+// the shift, as the weights' sum is even.
+struct quad_weights {
+    __m256i weights, offset;
+};
+inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
+    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
+}
+inline __m256i add_pairs(__m256i a, __m256i b) {
+    const __m256i one = _mm256_set1_epi16(1);
+    return _mm256_packs_epi32(_mm256_madd_epi16(a, one), _mm256_madd_epi16(b, one));
+}
+// What two steps of packing leave: granule k of block j belongs to vector k.
+inline __m256i unpack_order(__m256i v) {
+    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+}
+inline u8v dot_high(const quads_v &v, const quad_weights &w) {
+    const auto products = [&](__m256i x) {
+        return _mm256_maddubs_epi16(w.weights, _mm256_xor_si256(x, _mm256_set1_epi8(-128)));
+    };
+    const auto half = [&](__m256i x, __m256i y) {
+        return _mm256_srai_epi16(add_pairs(products(x), products(y)), 8);
+    };
+    return _mm256_add_epi8(
+        unpack_order(_mm256_packs_epi16(half(v.v[0], v.v[1]), half(v.v[2], v.v[3]))), w.offset);
+}
+using quad_factors = __m256i;
+inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
+    return set_quad(skips_first, a, b, c);
+}
+inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
+    const auto even_pixels = [](__m256i x, __m256i y) {
+        return _mm256_castps_si256(
+            _mm256_shuffle_ps(_mm256_castsi256_ps(x), _mm256_castsi256_ps(y), 0x88));
+    };
+    const __m256i low = even_pixels(v.v[0], v.v[1]), high = even_pixels(v.v[2], v.v[3]);
+    const auto dot = [&](__m256i k) {
+        return _mm256_subs_epi16(
+            c, add_pairs(_mm256_maddubs_epi16(low, k), _mm256_maddubs_epi16(high, k)));
+    };
+    return unpack_order(join_high(dot(f), dot(g)));
 }
 
 }  // namespace simgp::avx2

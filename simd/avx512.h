@@ -338,7 +338,7 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = 
     constexpr __mmask64 every_third = 0x9249249249249249;  // bits 0, 3, ... 63
     constexpr __mmask64 second[3] = {every_third << 1, every_third, every_third >> 1};
     constexpr __mmask64 third[3] = {every_third << 2, every_third << 1, every_third};
-    const auto part = [&](int k) {
+    const auto part = [&](int k) __attribute__((always_inline)) {
         const __m512i index = load(places + 64 * k);
         __m512i v = _mm512_permutexvar_epi8(index, a);
         v = _mm512_mask_permutexvar_epi8(v, second[k], index, b);
@@ -357,9 +357,9 @@ inline __m512i pack(s16v even, s16v odd) {
 }
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
-    store_zip3(p, pack<A>(a_even, a_odd), pack<B>(b_even, b_odd), pack<C>(c_even, c_odd),
-               zip3.packed);
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    const __m512i a = pack<A>(a_even, a_odd), c = pack<C>(c_even, c_odd);
+    store_zip3(p, exchange ? c : a, pack<B>(b_even, b_odd), exchange ? a : c, zip3.packed);
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const __m512i ab_lo = _mm512_unpacklo_epi8(a, b), ab_hi = _mm512_unpackhi_epi8(a, b);
@@ -522,6 +522,146 @@ inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
     const uint8_t *order = spread<0>.lane, *last_order = spread<16>.lane;
     store_565(p, sixteen(0, order), sixteen(48, order));
     store_565(p + bytes, sixteen(96, order), sixteen(128, last_order));
+}
+
+// Where the bytes of pixels of four come from, but for the byte within the pixel of three; and
+// where the bytes of pixels of three come from, within a vector, plain and with the first channel
+// and the last exchanged.
+struct repack_index {
+    alignas(64) uint8_t widen[64], narrow[2][3 * 64];
+    constexpr repack_index() : widen(), narrow() {
+        for (int i = 0; i < 64; i++) widen[i] = static_cast<uint8_t>(i / 4 * 3);
+        for (int i = 0; i < 3 * 64; i++)
+            for (int k = 0; k < 2; k++)
+                narrow[k][i] = static_cast<uint8_t>((i / 3 * 4 + (k ? 2 - i % 3 : i % 3)) & 63);
+    }
+};
+inline constexpr repack_index repack_order;
+
+struct widen_moves {
+    __m512i all, last;  // the last sixteen pixels are those at byte 16 of a load
+    __mmask64 channels;
+};
+inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
+    const uint32_t from = exchange ? 0x000102 : 0x020100;
+    const __m512i all =
+        _mm512_add_epi8(load(repack_order.widen), set_u32(to_alpha_first ? from << 8 : from));
+    return {all, _mm512_add_epi8(all, set_u8(16)),
+            to_alpha_first ? 0xEEEEEEEEEEEEEEEE : 0x7777777777777777};
+}
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+    const auto sixteen = [&](int k, int at, __m512i moves) {
+        store(p + bytes * k,
+              _mm512_mask_permutexvar_epi8(_mm512_set1_epi8(-1), m.channels, moves, load(q + at)));
+    };
+    sixteen(0, 0, m.all);
+    sixteen(1, 48, m.all);
+    sixteen(2, 96, m.all);
+    sixteen(3, 128, m.last);
+}
+struct narrow_moves {
+    __m512i part[3];
+};
+inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
+    const __m512i skip = set_u8(from_alpha_first);
+    const auto part = [&](int k) {
+        return _mm512_add_epi8(load(repack_order.narrow[exchange] + bytes * k), skip);
+    };
+    return {{part(0), part(1), part(2)}};
+}
+// Sixteen pixels are 48 bytes: each output takes its first bytes from one vector and the others
+// from the next.
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+    const auto part = [&](int k, __m512i first, __m512i second, __mmask64 of_second) {
+        store(p + bytes * k, _mm512_mask_permutexvar_epi8(_mm512_permutexvar_epi8(m.part[k], first),
+                                                          of_second, m.part[k], second));
+    };
+    const __m512i b = load(q + 64), c = load(q + 128);
+    part(0, load(q), b, 0xFFFF000000000000);
+    part(1, b, c, 0xFFFFFFFF00000000);
+    part(2, c, load(q + 192), 0xFFFFFFFFFFFF0000);
+}
+
+// Three loads of 64 bytes hold what 64 bytes of the result are made of, but for one or two; those
+// lie in loads from two bytes on.
+struct exchange_index {
+    alignas(64) uint8_t first[3][64], second[3][64];
+    constexpr exchange_index() : first(), second() {
+        for (int k = 0; k < 3; k++)
+            for (int i = 0; i < 64; i++) {
+                const int to = 64 * k + i, from = to / 3 * 3 + 2 - to % 3 - (64 - 1) * k;
+                first[k][i] = static_cast<uint8_t>(from < 64 ? from : 128);
+                second[k][i] = static_cast<uint8_t>(from < 64 ? 128 : from - 2);
+            }
+    }
+};
+inline constexpr exchange_index exchange;
+inline void exchange_888(uint8_t *p, const uint8_t *q) {
+    const auto third = [&](int k) __attribute__((always_inline)) {
+        const __m512i second = load(exchange.second[k]);
+        const __m512i v = _mm512_permutexvar_epi8(load(exchange.first[k]), load(q + 63 * k));
+        store(p + bytes * k,
+              _mm512_mask_permutexvar_epi8(v, _mm512_cmplt_epu8_mask(second, set_u8(128)), second,
+                                           load(q + 63 * k + 2)));
+    };
+    third(0);
+    third(1);
+    third(2);
+}
+
+struct quads_v {
+    __m512i v[4];
+};
+inline quads_v load_quads(const uint8_t *p) {
+    return {{load(p), load(p + bytes), load(p + 2 * bytes), load(p + 3 * bytes)}};
+}
+inline __m512i set_quad(bool skips_first, int a, int b, int c) {
+    const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
+    const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
+    return set_u32(skips_first ? all << 8 : all);
+}
+// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
+// the shift, as the weights' sum is even.
+struct quad_weights {
+    __m512i weights, offset;
+};
+inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
+    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
+}
+inline __m512i add_pairs(__m512i a, __m512i b) {
+    const __m512i one = _mm512_set1_epi16(1);
+    return _mm512_packs_epi32(_mm512_madd_epi16(a, one), _mm512_madd_epi16(b, one));
+}
+// What two steps of packing leave: granule k of block j belongs to vector k.
+inline __m512i unpack_order(__m512i v) {
+    return _mm512_permutexvar_epi32(
+        _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15), v);
+}
+inline u8v dot_high(const quads_v &v, const quad_weights &w) {
+    const auto products = [&](__m512i x) {
+        return _mm512_maddubs_epi16(w.weights, _mm512_xor_si512(x, _mm512_set1_epi8(-128)));
+    };
+    const auto half = [&](__m512i x, __m512i y) {
+        return _mm512_srai_epi16(add_pairs(products(x), products(y)), 8);
+    };
+    return _mm512_add_epi8(
+        unpack_order(_mm512_packs_epi16(half(v.v[0], v.v[1]), half(v.v[2], v.v[3]))), w.offset);
+}
+using quad_factors = __m512i;
+inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
+    return set_quad(skips_first, a, b, c);
+}
+inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
+    const auto even_pixels = [](__m512i x, __m512i y) {
+        return _mm512_castps_si512(
+            _mm512_shuffle_ps(_mm512_castsi512_ps(x), _mm512_castsi512_ps(y), 0x88));
+    };
+    const __m512i low = even_pixels(v.v[0], v.v[1]), high = even_pixels(v.v[2], v.v[3]);
+    const auto dot = [&](__m512i k) {
+        return _mm512_subs_epi16(
+            c, add_pairs(_mm512_maddubs_epi16(low, k), _mm512_maddubs_epi16(high, k)));
+    };
+    return unpack_order(join_high(dot(f), dot(g)));
 }
 
 }  // namespace simgp::avx512

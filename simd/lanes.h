@@ -472,12 +472,13 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
         p[3 * i + 2] = c.lane[i];
     }
 }
-// store_zip3 of three pairs, each through narrow_join with its own shift.
+// store_zip3 of three pairs, each through narrow_join with its own shift; a and c may change places
+// behind that.
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
-    store_zip3(p, narrow_join<A>(a_even, a_odd), narrow_join<B>(b_even, b_odd),
-               narrow_join<C>(c_even, c_odd));
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    const u8v a = narrow_join<A>(a_even, a_odd), c = narrow_join<C>(c_even, c_odd);
+    store_zip3(p, exchange ? c : a, narrow_join<B>(b_even, b_odd), exchange ? a : c);
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const u8v v[4] = {a, b, c, d};
@@ -572,6 +573,73 @@ inline void repack_to_565(uint8_t *p, const uint8_t *q) {
 }
 inline void repack_888_to_565(uint8_t *p, const uint8_t *q) { repack_to_565<3>(p, q); }
 inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) { repack_to_565<4>(p, q); }
+
+// `bytes` pixels of three bytes at q become pixels of four at p, and the other way round. The first
+// channel and the last may change places; alpha stands before or behind them, becomes 255, and is
+// dropped.
+struct channel_moves {
+    bool exchange, alpha_first;
+    int from(int channel) const { return exchange ? 2 - channel : channel; }
+};
+using widen_moves = channel_moves;
+inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
+    return {exchange, to_alpha_first};
+}
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+    for (int i = 0; i < bytes; i++) {
+        p[4 * i + (m.alpha_first ? 0 : 3)] = 255;
+        for (int k = 0; k < 3; k++) p[4 * i + k + m.alpha_first] = q[3 * i + m.from(k)];
+    }
+}
+using narrow_moves = channel_moves;
+inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
+    return {exchange, from_alpha_first};
+}
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+    for (int i = 0; i < bytes; i++)
+        for (int k = 0; k < 3; k++) p[3 * i + k] = q[4 * i + m.from(k) + m.alpha_first];
+}
+
+// Pixels of three bytes, the first and the last of which change places.
+inline void exchange_888(uint8_t *p, const uint8_t *q) {
+    for (int i = 0; i < 3 * bytes; i++) p[i] = q[i / 3 * 3 + 2 - i % 3];
+}
+
+// `bytes` pixels of four bytes at p, of which one has no weight, the first or the last.
+struct quads_v {
+    const uint8_t *p;
+};
+inline quads_v load_quads(const uint8_t *p) { return {p}; }
+struct quad_factors {
+    int a, b, c, d;
+    bool skips_first;
+    int of(const uint8_t *pixel) const {
+        pixel += skips_first;
+        return a * pixel[0] + b * pixel[1] + c * pixel[2];
+    }
+};
+// ((a c0 + b c1 + c c2) >> 8) + d of each pixel, kept to 8 bits. The weights are 0 or more, those of
+// two neighbours in memory, from the first byte on, at most 255 together, and the sum of all is even
+// and at most 256.
+using quad_weights = quad_factors;
+inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
+    return {a, b, c, d, skips_first};
+}
+inline u8v dot_high(quads_v v, const quad_weights &w) {
+    return make<u8v>([&](int i) { return (w.of(v.p + 4 * i) >> 8) + w.d; });
+}
+// The high bytes of c - (f0 c0 + f1 c1 + f2 c2) of the even pixels, saturated to 16 bits, signed,
+// with two sets of factors in turn. Factors lie in -128 ... 127; the sum and that of two neighbours
+// in memory, from the first byte on, fit 16 bits, signed.
+inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
+    return {a, b, c, 0, skips_first};
+}
+inline u8v even_dots_high(quads_v v, const quad_factors &f, const quad_factors &g, s16v c) {
+    return make<u8v>([&](int i) {
+        const int dot = (i & 1 ? g : f).of(v.p + 8 * (i / 2));
+        return clamp_to(-32768, 32767, c.lane[i / 2] - dot) >> 8;
+    });
+}
 
 }  // namespace simgp::SIMD_LANES_NAMESPACE
 

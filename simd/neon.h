@@ -288,9 +288,9 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
 }
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
-    store_zip3(p, narrow_join<A>(a_even, a_odd), narrow_join<B>(b_even, b_odd),
-               narrow_join<C>(c_even, c_odd));
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    const u8v a = narrow_join<A>(a_even, a_odd), c = narrow_join<C>(c_even, c_odd);
+    store_zip3(p, exchange ? c : a, narrow_join<B>(b_even, b_odd), exchange ? a : c);
 }
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const uint8x16x4_t v = {{a, b, c, d}};
@@ -384,6 +384,73 @@ inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
 inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
     const uint8x16x4_t v = vld4q_u8(q);
     store_565(p, v.val[0], v.val[1], v.val[2]);
+}
+
+struct channel_moves {
+    bool exchange, alpha_first;
+};
+using widen_moves = channel_moves;
+inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
+    return {exchange, to_alpha_first};
+}
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+    const uint8x16x3_t v = vld3q_u8(q);
+    const u8v first = m.exchange ? v.val[2] : v.val[0], last = m.exchange ? v.val[0] : v.val[2],
+              a = set_u8(255);
+    const uint8x16x4_t before = {{a, first, v.val[1], last}}, behind = {{first, v.val[1], last, a}};
+    if (m.alpha_first)
+        vst4q_u8(p, before);
+    else
+        vst4q_u8(p, behind);
+}
+using narrow_moves = channel_moves;
+inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
+    return {exchange, from_alpha_first};
+}
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+    const uint8x16x4_t v = vld4q_u8(q);
+    const u8v first = m.alpha_first ? v.val[1] : v.val[0],
+              mid = m.alpha_first ? v.val[2] : v.val[1], last = m.alpha_first ? v.val[3] : v.val[2];
+    const uint8x16x3_t kept = {{first, mid, last}}, exchanged = {{last, mid, first}};
+    if (m.exchange)
+        vst3q_u8(p, exchanged);
+    else
+        vst3q_u8(p, kept);
+}
+
+inline void exchange_888(uint8_t *p, const uint8_t *q) {
+    const uint8x16x3_t v = vld3q_u8(q);
+    const uint8x16x3_t exchanged = {{v.val[2], v.val[1], v.val[0]}};
+    vst3q_u8(p, exchanged);
+}
+
+using quads_v = uint8x16x4_t;
+inline quads_v load_quads(const uint8_t *p) { return vld4q_u8(p); }
+inline rgb_v weighted(const quads_v &v, bool skips_first) {
+    return {{skips_first ? v.val[1] : v.val[0], skips_first ? v.val[2] : v.val[1],
+             skips_first ? v.val[3] : v.val[2]}};
+}
+struct quad_factors {
+    channel_factors factors;
+    bool skips_first;
+};
+struct quad_weights : quad_factors {
+    u8v d;
+};
+inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
+    return {{set_channel_factors(a, b, c), skips_first}, set_u8(static_cast<uint8_t>(d))};
+}
+inline u8v dot_high(const quads_v &v, const quad_weights &w) {
+    return vaddq_u8(dot_high(weighted(v, w.skips_first), w.factors), w.d);
+}
+inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
+    return {set_channel_factors(a, b, c), skips_first};
+}
+inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
+    const auto dot = [&](const quad_factors &k) {
+        return as_u16(sub_sat(c, even_dot(weighted(v, k.skips_first), k.factors)));
+    };
+    return join_high(dot(f), dot(g));
 }
 
 }  // namespace simgp::neon

@@ -266,28 +266,30 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
 // the shuffle takes its even pixels from the lower half of the block, its odd ones from the upper.
 struct zip3_index {
     alignas(16) uint8_t ab[3][16], c[3][16];
-    constexpr zip3_index() : ab(), c() {
+    explicit constexpr zip3_index(bool exchange) : ab(), c() {
         for (int k = 0; k < 3; k++)
             for (int i = 0; i < 16; i++) {
-                const int q = 16 * k + i % 16, pixel = q / 3, channel = q % 3;
+                const int q = 16 * k + i % 16, pixel = q / 3,
+                          channel = exchange ? 2 - q % 3 : q % 3;
                 const bool is_c = channel == 2;
                 ab[k][i] = static_cast<uint8_t>(is_c ? 255 : 2 * (pixel - 4 * k) + channel);
                 c[k][i] = static_cast<uint8_t>(is_c ? 8 * (pixel & 1) + pixel / 2 : 255);
             }
     }
 };
-inline constexpr zip3_index zip3;
+inline constexpr zip3_index zip3[2] = {zip3_index(false), zip3_index(true)};
 template <int A, int B, int C>
 inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd) {
+                              s16v c_even, s16v c_odd, bool exchange = false) {
     static_assert(limits::narrowing_shift<C>);
+    const zip3_index &index = zip3[exchange];
     const __m128i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
     const __m128i c = _mm_packus_epi16(_mm_srai_epi16(c_even, C), _mm_srai_epi16(c_odd, C));
     const __m128i ab_lo = _mm_unpacklo_epi8(a, b), ab_hi = _mm_unpackhi_epi8(a, b);
     const __m128i ab_mid = _mm_alignr_epi8(ab_hi, ab_lo, 8);
-    const auto part = [=](__m128i ab, int k) {
-        return _mm_or_si128(_mm_shuffle_epi8(ab, load(zip3.ab[k])),
-                            _mm_shuffle_epi8(c, load(zip3.c[k])));
+    const auto part = [&](__m128i ab, int k) {
+        return _mm_or_si128(_mm_shuffle_epi8(ab, load(index.ab[k])),
+                            _mm_shuffle_epi8(c, load(index.c[k])));
     };
     store(p, part(ab_lo, 0));
     store(p + 16, part(ab_mid, 1));
@@ -431,6 +433,117 @@ inline void repack_888_to_565(uint8_t *p, const uint8_t *q) {
                                         z(8), -1, z(9), z(10), z(11), -1));
     };
     store_565(p, four(0, 0), four(12, 0), four(24, 0), four(32, 4));
+}
+
+// Which byte of a pixel of three goes to each byte of one of four; 128: none.
+inline uint32_t widen_from(bool exchange, bool alpha_first) {
+    const uint32_t channels = exchange ? 0x000102 : 0x020100;
+    return alpha_first ? channels << 8 | 0x80 : channels | 0x80u << 24;
+}
+struct widen_moves {
+    __m128i all, last, alpha;  // the last four pixels are those at byte 4 of a load
+};
+inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
+    const __m128i pixels = _mm_setr_epi8(0, 0, 0, 0, 3, 3, 3, 3, 6, 6, 6, 6, 9, 9, 9, 9);
+    const __m128i all = _mm_add_epi8(pixels, set_u32(widen_from(exchange, to_alpha_first)));
+    return {all, _mm_add_epi8(all, _mm_set1_epi8(4)), set_u32(to_alpha_first ? 255 : 255u << 24)};
+}
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+    const auto four = [&](int k, int at, __m128i moves) {
+        store(p + 16 * k, _mm_or_si128(_mm_shuffle_epi8(load(q + at), moves), m.alpha));
+    };
+    four(0, 0, m.all);
+    four(1, 12, m.all);
+    four(2, 24, m.all);
+    four(3, 32, m.last);
+}
+using narrow_moves = __m128i;
+inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
+    const __m128i channels =
+        exchange ? _mm_setr_epi8(2, 1, 0, 6, 5, 4, 10, 9, 8, 14, 13, 12, -128, -128, -128, -128)
+                 : _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, -128, -128, -128, -128);
+    return _mm_add_epi8(channels, set_u8(from_alpha_first));
+}
+// The four bytes of a block behind those of its pixels are 0.
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+    const auto four = [&](int k) { return _mm_shuffle_epi8(load(q + 16 * k), m); };
+    const __m128i a = four(0), b = four(1), c = four(2), d = four(3);
+    store(p, _mm_or_si128(a, _mm_slli_si128(b, 12)));
+    store(p + 16, _mm_or_si128(_mm_srli_si128(b, 4), _mm_slli_si128(c, 8)));
+    store(p + 32, _mm_or_si128(_mm_srli_si128(c, 8), _mm_slli_si128(d, 4)));
+}
+
+// Three loads of 16 bytes hold what 16 bytes of the result are made of, but for one or two; those
+// lie in loads from two bytes on.
+struct exchange_index {
+    alignas(16) uint8_t first[3][16], second[3][16];
+    constexpr exchange_index() : first(), second() {
+        for (int k = 0; k < 3; k++)
+            for (int i = 0; i < 16; i++) {
+                const int to = 16 * k + i, from = to / 3 * 3 + 2 - to % 3 - (16 - 1) * k;
+                first[k][i] = static_cast<uint8_t>(from < 16 ? from : 128);
+                second[k][i] = static_cast<uint8_t>(from < 16 ? 128 : from - 2);
+            }
+    }
+};
+inline constexpr exchange_index exchange;
+inline void exchange_888(uint8_t *p, const uint8_t *q) {
+    const auto third = [&](int k) __attribute__((always_inline)) {
+        const auto part = [&](int at, const uint8_t *index) __attribute__((always_inline)) {
+            return _mm_shuffle_epi8(load(q + 15 * k + at), load(index));
+        };
+        store(p + 16 * k, _mm_or_si128(part(0, exchange.first[k]), part(2, exchange.second[k])));
+    };
+    third(0);
+    third(1);
+    third(2);
+}
+
+struct quads_v {
+    __m128i v[4];
+};
+inline quads_v load_quads(const uint8_t *p) {
+    return {{load(p), load(p + 16), load(p + 32), load(p + 48)}};
+}
+inline __m128i set_quad(bool skips_first, int a, int b, int c) {
+    const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
+    const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
+    return set_u32(skips_first ? all << 8 : all);
+}
+// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
+// the shift, as the weights' sum is even.
+struct quad_weights {
+    __m128i weights, offset;
+};
+inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
+    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
+}
+inline __m128i add_pairs(__m128i a, __m128i b) {
+    const __m128i one = _mm_set1_epi16(1);
+    return _mm_packs_epi32(_mm_madd_epi16(a, one), _mm_madd_epi16(b, one));
+}
+inline u8v dot_high(const quads_v &v, const quad_weights &w) {
+    const auto products = [&](__m128i x) {
+        return _mm_maddubs_epi16(w.weights, _mm_xor_si128(x, _mm_set1_epi8(-128)));
+    };
+    const auto eight = [&](__m128i x, __m128i y) {
+        return _mm_srai_epi16(add_pairs(products(x), products(y)), 8);
+    };
+    return _mm_add_epi8(_mm_packs_epi16(eight(v.v[0], v.v[1]), eight(v.v[2], v.v[3])), w.offset);
+}
+using quad_factors = __m128i;
+inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
+    return set_quad(skips_first, a, b, c);
+}
+inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
+    const auto even_pixels = [](__m128i x, __m128i y) {
+        return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(x), _mm_castsi128_ps(y), 0x88));
+    };
+    const __m128i low = even_pixels(v.v[0], v.v[1]), high = even_pixels(v.v[2], v.v[3]);
+    const auto dot = [&](__m128i k) {
+        return _mm_subs_epi16(c, add_pairs(_mm_maddubs_epi16(low, k), _mm_maddubs_epi16(high, k)));
+    };
+    return join_high(dot(f), dot(g));
 }
 
 }  // namespace simgp::sse41

@@ -88,12 +88,16 @@ uint8_t chroma_of(const int16_t (&w)[3], const channels &p) {
     return uint8_t(clamp(((dot(w, p) + 128) >> 8) + 128));
 }
 
-template <rgb_in In, chroma_out Out>
-void any_to_yuv(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
-                ptrdiff_t width) {
+template <pixel_kind Kind, chroma_out Out>
+void any_to_yuv(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    const auto pixel = [&w](const uint8_t *src, ptrdiff_t x) {
+        return read_channels<rgb_in(Kind)>(src + w.alpha_first, x);
+    };
     for (ptrdiff_t x = 0; x < width; x++) {
-        const channels p = read_channels<In>(src, x);
-        y[x] = luma_of(w, p);
+        const channels p = pixel(src0, x);
+        y0[x] = luma_of(w, p);
+        if (src1) y1[x] = luma_of(w, pixel(src1, x));
         if (Out == chroma_out::none || x & 1) continue;
         const uint8_t of_u = chroma_of(w.u, p), of_v = chroma_of(w.v, p);
         if (Out == chroma_out::half) {
@@ -161,6 +165,20 @@ void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *
     }
 }
 
+template <bool Pairs>
+void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1, uint8_t *u,
+                   uint8_t *v, ptrdiff_t pairs, bool luma_first) {
+    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
+    for (ptrdiff_t x = 0; x < 2 * pairs; x++) {
+        y0[x] = src0[2 * x + luma];
+        y1[x] = src1[2 * x + luma];
+    }
+    for (ptrdiff_t i = 0; i < pairs; i++) {
+        u[Pairs ? 2 * i : i] = src0[4 * i + of_u];
+        (Pairs ? u[2 * i + 1] : v[i]) = src0[4 * i + of_u + 2];
+    }
+}
+
 void mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[x] + b[x] + 1) >> 1);
 }
@@ -190,16 +208,13 @@ void fill_from_yuv(any_rows &t) {
     fill_to_rgb<Layout, pixel_kind::three>(t);
     fill_to_rgb<Layout, pixel_kind::four>(t);
 }
-template <rgb_in In>
-void fill_from_rgb(any_rows &t) {
-    any_to_yuv_row **const to = t.to_yuv[size_t(In)];
-    to[size_t(chroma_out::none)] = any_to_yuv<In, chroma_out::none>;
-    to[size_t(chroma_out::half)] = any_to_yuv<In, chroma_out::half>;
-    to[size_t(chroma_out::pairs)] = any_to_yuv<In, chroma_out::pairs>;
-    t.split_pixels[size_t(In)] = split_pixels<In>;
-}
 template <pixel_kind From>
-void fill_repack(any_rows &t) {
+void fill_from_rgb(any_rows &t) {
+    any_to_yuv_row **const to_yuv = t.to_yuv[size_t(From)];
+    to_yuv[size_t(chroma_out::none)] = any_to_yuv<From, chroma_out::none>;
+    to_yuv[size_t(chroma_out::half)] = any_to_yuv<From, chroma_out::half>;
+    to_yuv[size_t(chroma_out::pairs)] = any_to_yuv<From, chroma_out::pairs>;
+    t.split_pixels[size_t(From)] = split_pixels<rgb_in(From)>;
     repack_row **const to = t.repack[size_t(From)];
     to[size_t(pixel_kind::words)] = repack<From, pixel_kind::words>;
     to[size_t(pixel_kind::three)] = repack<From, pixel_kind::three>;
@@ -213,16 +228,15 @@ void fill_any(any_rows &t) {
     fill_from_yuv<chroma_in::full>(t);
     fill_from_yuv<chroma_in::pairs>(t);
     fill_from_yuv<chroma_in::groups>(t);
-    fill_from_rgb<rgb_in::words>(t);
-    fill_from_rgb<rgb_in::three>(t);
-    fill_from_rgb<rgb_in::four>(t);
-    fill_from_rgb<rgb_in::four_alpha_first>(t);
+    fill_from_rgb<pixel_kind::words>(t);
+    fill_from_rgb<pixel_kind::three>(t);
+    fill_from_rgb<pixel_kind::four>(t);
+    t.split_pixels[size_t(rgb_in::four_alpha_first)] = split_pixels<rgb_in::four_alpha_first>;
     t.chroma = chroma;
-    fill_repack<pixel_kind::words>(t);
-    fill_repack<pixel_kind::three>(t);
-    fill_repack<pixel_kind::four>(t);
     t.split_groups = split_groups;
     t.join_groups = join_groups;
+    t.groups_to_planes = groups_to_420<false>;
+    t.groups_to_pairs = groups_to_420<true>;
     t.mean_of_lines = mean_of_lines;
     t.mean_of_pairs = mean_of_pairs;
     t.mean_of_blocks = mean_of_blocks;
@@ -241,13 +255,19 @@ constexpr yuv_weights to_rgb_weights[] = {
     {298, 16, 430, 48, 167, 548},  {256, 0, 378, 42, 146, 482},
 };
 constexpr rgb_weights to_yuv_weights[] = {
-    {{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16},
-    {{77, 150, 29}, {-43, -85, 128}, {128, -107, -21}, 0},
-    {{47, 157, 16}, {-26, -86, 112}, {112, -102, -10}, 16},
-    {{54, 184, 18}, {-29, -99, 128}, {128, -116, -12}, 0},
-    {{58, 149, 13}, {-31, -81, 112}, {112, -103, -9}, 16},
-    {{67, 174, 15}, {-36, -92, 128}, {128, -118, -10}, 0},
+    {{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false},
+    {{77, 150, 29}, {-43, -85, 128}, {128, -107, -21}, 0, false},
+    {{47, 157, 16}, {-26, -86, 112}, {112, -102, -10}, 16, false},
+    {{54, 184, 18}, {-29, -99, 128}, {128, -116, -12}, 0, false},
+    {{58, 149, 13}, {-31, -81, 112}, {112, -103, -9}, 16, false},
+    {{67, 174, 15}, {-36, -92, 128}, {128, -118, -10}, 0, false},
 };
+constexpr bool luma_sums_are_even() {
+    for (const rgb_weights &w : to_yuv_weights)
+        if ((w.y[0] + w.y[1] + w.y[2]) % 2) return false;
+    return true;
+}
+static_assert(luma_sums_are_even(), "vector rows count on it");
 constexpr int32_t colours = int32_t(sizeof to_rgb_weights / sizeof *to_rgb_weights);
 
 // One call: the formats, the planes, the size.
@@ -497,38 +517,33 @@ void finish_band(const job &j, const strip_rows &b, const planar_band &p, const 
 }
 
 // From packed 4:2:2 to the chroma of every second row, straight to its place: to planes, or to pairs
-// U V. Bytes of chroma that are not wanted end in a strip that stays in the cache.
+// U V.
 bool has_way_from_groups(const job &j) {
     return j.from.kind == format_kind::packed && j.to.kind == format_kind::planar &&
            (j.to.layout == yuv_layout::uv || j.to.layout == yuv_layout::half) &&
            sharing_of(j.to).down && !averages(j);
 }
 void groups_to_every_second_row(const job &j) {
-    constexpr ptrdiff_t width = 4 * strip_width;
     const bool luma_first = j.from.layout == yuv_layout::yuyv, pairs = has_pairs(j.to);
-    for_each_band(j, width, 2, [&](const strip_rows &b) {
-        uint8_t unwanted[width];
-        const ptrdiff_t whole = b.width & ~ptrdiff_t(1), line = b.y >> 1;
-        for (ptrdiff_t r = 0; r < b.rows; r++) {
-            const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x, *const last =
-                                                                            src + 2 * whole;
-            uint8_t *const y = j.out(0).line(b.y + r) + b.x;
-            uint8_t *const u = j.out(j.to.u).line(line) + (pairs ? b.x : b.x / 2);
-            uint8_t *const v = pairs ? u + 1 : j.out(j.to.v).line(line) + b.x / 2;
-            if (whole && !r && !pairs) {
-                j.rows.split_groups(src, y, u, v, whole / 2, luma_first);
-            } else if (whole) {
-                uint8_t *const chroma = r ? unwanted : u;
-                j.layout.unpack(src, luma_first ? y : chroma, luma_first ? chroma : y, whole);
-            }
-            if (whole == b.width) continue;
-            y[whole] = last[!luma_first];
-            if (r) continue;
-            const ptrdiff_t at = pairs ? whole : whole / 2;
-            u[at] = last[luma_first];
-            v[at] = b.x + whole ? last[luma_first - 2] : 128;
-        }
-    });
+    groups_to_planes_row *const row = pairs ? j.rows.groups_to_pairs : j.rows.groups_to_planes;
+    const const_lines in = j.in(0);
+    const lines luma = j.out(0), of_u = j.out(j.to.u), of_v = j.out(j.to.v);
+    const ptrdiff_t whole = j.width & ~ptrdiff_t(1);
+    for (ptrdiff_t line = 0; line < j.height; line += 2) {
+        // A last row alone is done twice.
+        const ptrdiff_t below = line + 1 < j.height ? line + 1 : line;
+        uint8_t *const u = of_u.line(line >> 1), *const v = of_v.line(line >> 1) + pairs;
+        if (whole)
+            row(in.line(line), in.line(below), luma.line(line), luma.line(below), u, v, whole / 2,
+                luma_first);
+        if (whole == j.width) continue;
+        const uint8_t *const last = in.line(line) + 2 * whole;
+        luma.line(line)[whole] = last[!luma_first];
+        luma.line(below)[whole] = in.line(below)[2 * whole + !luma_first];
+        const ptrdiff_t at = pairs ? whole : whole / 2;
+        u[at] = last[luma_first];
+        v[at] = whole ? last[luma_first - 2] : 128;
+    }
 }
 
 void yuv_to_yuv(const job &j) {
@@ -571,24 +586,30 @@ void yuv_to_rgb_pictures(const job &j) {
     any_to_rgb_row *const row = j.rows.to_rgb[in][kind];
     any_to_rgb_row_pair *const row_pair = j.rows.to_rgb_pair[in][kind];
     const bool shared_down = sharing_of(j.from).down;
-    // Rows read what lies in linear planes, whole lines of it.
-    const bool direct = j.from.kind != format_kind::tiled && j.from.u >= 0;
-    const bool pairs = has_pairs(j.from);
-    for_each_band(j, direct ? j.width : strip_width, 2, [&](const strip_rows &b) {
-        yuv_strip strip;
-        planar_band p{};
-        if (!direct || !(pairs || j.from.kind == format_kind::packed)) {
-            p = read_band(j, b, strip);
-        } else {
-            for (ptrdiff_t r = 0; r < b.rows; r++) p.y[r] = j.in(0).line(b.y + r);
-            if (pairs) p.u[0] = j.in(1).line(b.y >> 1);
+    const lines out = j.out(0);
+    if (j.from.kind != format_kind::tiled && j.from.u >= 0) {
+        // Rows read what lies in linear planes, whole lines of it.
+        const const_lines luma = j.in(0), u = j.in(j.from.u), v = j.in(j.from.v);
+        for (ptrdiff_t y = 0; y < j.height; y++) {
+            const ptrdiff_t line = y >> shared_down;
+            if (!shared_down || y + 1 == j.height) {
+                row(how, luma.line(y), u.line(line), v.line(line), out.line(y), j.width);
+                continue;
+            }
+            row_pair(how, luma.line(y), luma.line(y + 1), u.line(line), v.line(line), out.line(y),
+                     out.line(y + 1), j.width);
+            y++;
         }
-        uint8_t *dst[2];
-        for (ptrdiff_t r = 0; r < 2; r++)
-            dst[r] = j.out(0).line(b.y + (r < b.rows ? r : 0)) + b.x * j.to.bytes[0];
-        if (shared_down && b.rows == 2)
-            return row_pair(how, p.y[0], p.y[1], p.u[0], p.v[0], dst[0], dst[1], b.width);
-        for (ptrdiff_t r = 0; r < b.rows; r++) row(how, p.y[r], p.u[r], p.v[r], dst[r], b.width);
+        return;
+    }
+    for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
+        yuv_strip strip;
+        const planar_band p = read_band(j, b, strip);
+        uint8_t *const dst = out.line(b.y) + b.x * j.to.bytes[0];
+        if (b.rows == 2)
+            row_pair(how, p.y[0], p.y[1], p.u[0], p.v[0], dst, dst + out.stride, b.width);
+        else
+            row(how, p.y[0], p.u[0], p.v[0], dst, b.width);
     });
 }
 
@@ -611,6 +632,7 @@ void exchange(T &a, T &b) {
     b = was_a;
 }
 rgb_weights in_memory_order(rgb_weights w, rgb_packing packing) {
+    w.alpha_first = is_alpha_first(packing);
     if (!is_blue_first(packing)) return w;
     exchange(w.y[0], w.y[2]);
     exchange(w.u[0], w.u[2]);
@@ -634,33 +656,43 @@ void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, cons
 
 void rgb_to_yuv_pictures(const job &j) {
     rgb_weights w = in_memory_order(to_yuv_weights[j.colour], j.from.packing);
-    any_to_yuv_row *const *const rows = j.rows.to_yuv[size_t(rgb_in_of(j.from.packing))];
-    any_to_yuv_row *const luma = rows[size_t(chroma_out::none)];
+    any_to_yuv_row *const *const rows = j.rows.to_yuv[size_t(kind_of(j.from.packing))];
     const sharing to = sharing_of(j.to);
     // Rows give the chroma of every second pixel; pairs of theirs need no strip.
     const bool by_rows = j.to.u >= 0 && to.across && !averages(j);
     const bool pairs = by_rows && j.to.kind == format_kind::planar && has_pairs(j.to);
-    const bool direct = by_rows ? pairs || j.to.kind == format_kind::planar : j.to.u < 0;
     if (pairs && j.to.layout == yuv_layout::vu)
         for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
-    any_to_yuv_row *const with_chroma =
-        !by_rows ? luma : rows[size_t(pairs ? chroma_out::pairs : chroma_out::half)];
-    for_each_band(j, direct ? j.width : strip_width, 2, [&](const strip_rows &b) {
+    any_to_yuv_row *const row = rows[size_t(!by_rows ? chroma_out::none
+                                            : pairs  ? chroma_out::pairs
+                                                     : chroma_out::half)];
+    const ptrdiff_t rows_at_once = to.down ? 2 : 1;
+    if (j.to.u < 0 || (by_rows && j.to.kind == format_kind::planar)) {
+        // Straight to their places, whole lines of them.
+        const int of_u = j.to.u < 0 ? 0 : j.to.u, of_v = j.to.u < 0 ? 0 : j.to.v;
+        const const_lines in = j.in(0);
+        const lines luma = j.out(0), u = j.out(of_u), v = j.out(of_v);
+        for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
+            const bool two = to.down && y + 1 < j.height;
+            const ptrdiff_t line = y >> to.down;
+            row(w, in.line(y), two ? in.line(y + 1) : nullptr, luma.line(y),
+                two ? luma.line(y + 1) : nullptr, u.line(line), v.line(line), j.width);
+        }
+        return;
+    }
+    for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
-        target_band t = place_band(j, b, strip);
-        if (pairs) t.u[0] = j.out(1).line(b.y >> 1) + b.x;
-        const auto line = [&](ptrdiff_t r) {
+        const target_band t = place_band(j, b, strip);
+        const auto line = [&](ptrdiff_t r) -> const uint8_t * {
             return j.in(0).line(b.y + r) + b.x * j.from.bytes[0];
         };
-        for (ptrdiff_t r = 0; r < b.rows; r++) {
-            const bool chroma = !(to.down && r);
-            (chroma ? with_chroma : luma)(w, line(r), t.y[r], t.u[r], t.v[r], b.width);
-            if (!chroma || by_rows || j.to.u < 0) continue;
-            const bool two = averages(j) && to.down && b.rows == 2;
-            chroma_of_pixels(j, w, line(r), two ? line(1) : nullptr, to.across, t.u[r], t.v[r],
-                             b.width);
+        for (ptrdiff_t r = 0; r < b.rows; r += rows_at_once) {
+            const uint8_t *const below = to.down && b.rows == 2 ? line(1) : nullptr;
+            row(w, line(r), below, t.y[r], t.y[1], t.u[r], t.v[r], b.width);
+            if (by_rows) continue;
+            chroma_of_pixels(j, w, line(r), averages(j) ? below : nullptr, to.across, t.u[r],
+                             t.v[r], b.width);
         }
-        if (direct) return;
         finish_band(j, b, {{t.y[0], t.y[1]}, {t.u[0], t.u[1]}, {t.v[0], t.v[1]}}, t);
     });
 }

@@ -39,14 +39,18 @@ struct any_terms {
     s16v r, g, b1, b2;
 };
 struct any_rgb {
-    s16v first, g, last;
+    s16v r, g, b;
+};
+// The order of a pixel's channels. Whole vectors change places, as late as they can.
+struct any_order {
+    bool blue_first, alpha_first;
 };
 
 struct any_matrix {
     u16v luma, green_u, green_v, blue1;
     half_factor red, blue2;
     s16v luma_c, red_c, green_c, blue1_c, blue2_c;
-    bool blue_first, alpha_first;
+    any_order order;
 
     static s16v constant(int c) { return as_s16(set_u16(static_cast<uint16_t>(c))); }
     static u16v factor(int k) { return set_u16(static_cast<uint16_t>(k)); }
@@ -66,8 +70,7 @@ struct any_matrix {
         blue1_c = constant(-64 * of_blue1);
         blue2 = set_half_factor(of_blue2);
         blue2_c = constant(bias - 64 * of_blue2);
-        blue_first = how.blue_first;
-        alpha_first = how.alpha_first;
+        order = {how.blue_first, how.alpha_first};
     }
 
     any_terms terms(u16v u, u16v v) const {
@@ -77,10 +80,7 @@ struct any_matrix {
     }
     any_rgb apply(u16v y, const any_terms &c) const {
         const s16v l = add(as_s16(mul(y, luma)), luma_c);
-        const s16v r = add_sat(l, c.r), b = add_sat(add_sat(l, c.b1), c.b2);
-        any_rgb p{r, add_sat(l, c.g), b};
-        if (blue_first) p.first = b, p.last = r;
-        return p;
+        return {add_sat(l, c.r), add_sat(l, c.g), add_sat(add_sat(l, c.b1), c.b2)};
     }
 };
 
@@ -90,27 +90,33 @@ template <>
 struct any_packer<pixel_kind::words> {
     static constexpr pixel_order order = pixel_order::by8;
     static constexpr int size = 2;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool) {
-        store_zip16(dst, pack565(even.first, even.g, even.last),
-                    pack565(odd.first, odd.g, odd.last));
+    static u16v pack(const any_rgb &p, bool blue_first) {
+        s16v first = p.r, last = p.b;
+        if (blue_first) first = p.b, last = p.r;
+        return pack565(first, p.g, last);
+    }
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+        store_zip16(dst, pack(even, o.blue_first), pack(odd, o.blue_first));
     }
 };
 template <>
 struct any_packer<pixel_kind::three> {
     static constexpr pixel_order order = pixel_order::natural;
     static constexpr int size = 3;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool) {
-        store_narrow_zip3<7, 7, 7>(dst, even.first, odd.first, even.g, odd.g, even.last, odd.last);
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+        store_narrow_zip3<7, 7, 7>(dst, even.r, odd.r, even.g, odd.g, even.b, odd.b, o.blue_first);
     }
 };
 template <>
 struct any_packer<pixel_kind::four> {
     static constexpr pixel_order order = pixel_order::by4;
     static constexpr int size = 4;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, bool alpha_first) {
-        const u8v first = narrow_join<7>(even.first, odd.first), g = narrow_join<7>(even.g, odd.g),
-                  last = narrow_join<7>(even.last, odd.last), a = set_u8(255);
-        if (alpha_first)
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+        const u8v r = narrow_join<7>(even.r, odd.r), g = narrow_join<7>(even.g, odd.g),
+                  b = narrow_join<7>(even.b, odd.b), a = set_u8(255);
+        u8v first = r, last = b;
+        if (o.blue_first) first = b, last = r;
+        if (o.alpha_first)
             store_zip4(dst, a, first, g, last);
         else
             store_zip4(dst, first, g, last, a);
@@ -198,14 +204,14 @@ static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, c
     const auto write_half = [&](ptrdiff_t x, const yuv_half &p) {
         const any_chroma c = from.chroma(p.pairs);
         const any_terms t = m.terms(c.u, c.v);
-        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.alpha_first);
+        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.order);
     };
     const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
         const auto half = [&](u16v luma, u8v pairs) {
             return m.apply(luma, m.terms(even(pairs), odd(pairs)));
         };
         to::store(dst + x * to::size, half(even(p.y), p.pairs_even), half(odd(p.y), p.pairs_odd),
-                  m.alpha_first);
+                  m.order);
     };
     const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
     const auto part = [&](ptrdiff_t x, int count) { any_part<In, Kind>(how, in, dst, x, count); };
@@ -236,9 +242,9 @@ static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t
             const any_chroma c = from.chroma(p.first.pairs);
             const any_terms t = m.terms(c.u, c.v);
             to::store(dst0 + x * to::size, m.apply(even(p.first.y), t), m.apply(odd(p.first.y), t),
-                      m.alpha_first);
+                      m.order);
             to::store(dst1 + x * to::size, m.apply(even(p.second_y), t),
-                      m.apply(odd(p.second_y), t), m.alpha_first);
+                      m.apply(odd(p.second_y), t), m.order);
         },
         [&](ptrdiff_t x, int count) {
             any_part<In, Kind>(how, in, dst0, x, count);
@@ -267,23 +273,41 @@ static void any_pair_of_rows(const yuv_to_rgb &how, const uint8_t *y0, const uin
 // computed with negative factors, since 128 fits no signed byte but -128 does, and taken from the
 // rounding constant: 128 + 32640 saturates to 32767, of which the sample is 255, as it should be.
 // With the sign inverted, which adds 32768, the high byte of a lane is the sample.
+template <pixel_kind>
 struct any_yuv_matrix {
     channel_factors y, u, v;
-    u8v black, sign;
-    s16v half;
+    u8v black;
+    s16v half = as_s16(set_u16(128));
 
     explicit any_yuv_matrix(const rgb_weights &w)
         : y(set_channel_factors(w.y[0], w.y[1], w.y[2])),
           u(set_channel_factors(-w.u[0], -w.u[1], -w.u[2])),
           v(set_channel_factors(-w.v[0], -w.v[1], -w.v[2])),
-          black(set_u8(w.black)),
-          sign(set_u8(128)),
-          half(as_s16(set_u16(128))) {}
+          black(set_u8(w.black)) {}
 
     u8v luma(rgb_v p) const { return add_u8(dot_high(p, y), black); }
-    // High bytes.
-    u16v chroma(rgb_v p, const channel_factors &f) const {
-        return as_u16(bit_xor(as_u8(as_u16(sub_sat(half, even_dot(p, f)))), sign));
+    // Pairs of U and V.
+    u8v chroma(rgb_v p) const {
+        const auto sum = [&](const channel_factors &f) {
+            return as_u16(sub_sat(half, even_dot(p, f)));
+        };
+        return bit_xor(join_high(sum(u), sum(v)), set_u8(128));
+    }
+};
+template <>
+struct any_yuv_matrix<pixel_kind::four> {
+    quad_weights y;
+    quad_factors u, v;
+    s16v half = as_s16(set_u16(128));
+
+    explicit any_yuv_matrix(const rgb_weights &w)
+        : y(set_quad_weights(w.alpha_first, w.y[0], w.y[1], w.y[2], w.black)),
+          u(set_quad_factors(w.alpha_first, -w.u[0], -w.u[1], -w.u[2])),
+          v(set_quad_factors(w.alpha_first, -w.v[0], -w.v[1], -w.v[2])) {}
+
+    u8v luma(const quads_v &p) const { return dot_high(p, y); }
+    u8v chroma(const quads_v &p) const {
+        return bit_xor(even_dots_high(p, u, v, half), set_u8(128));
     }
 };
 
@@ -299,29 +323,35 @@ inline rgb_v load_pixels(const uint8_t *p) {
     if constexpr (In == rgb_in::four_alpha_first) return load_8888<1>(p);
 }
 
-template <rgb_in In, chroma_out Out>
-static void any_yuv_row(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
-                        uint8_t *v, ptrdiff_t width) {
-    constexpr int size = size_in<In>, chroma_size = Out == chroma_out::pairs ? 2 : 1;
-    const any_yuv_matrix m(w);
+template <pixel_kind Kind>
+inline auto load_pixels(const uint8_t *p) {
+    if constexpr (Kind == pixel_kind::four)
+        return load_quads(p);
+    else
+        return load_pixels<rgb_in(Kind)>(p);
+}
+
+template <pixel_kind Kind, chroma_out Out>
+static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    constexpr int size = int(Kind) + 2, chroma_size = Out == chroma_out::pairs ? 2 : 1;
+    const any_yuv_matrix<Kind> m(w);
     row_of_steps<Out != chroma_out::none>(
-        width, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
-        [&](ptrdiff_t x, rgb_v p) {
-            store(y + x, m.luma(p));
-            if constexpr (Out == chroma_out::none) return;
-            const u16v of_u = m.chroma(p, m.u), of_v = m.chroma(p, m.v);
-            if constexpr (Out == chroma_out::half) {
-                store_high(u + x / 2, of_u);
-                store_high(v + x / 2, of_v);
-            } else if constexpr (Out == chroma_out::pairs) {
-                store(u + x, join_high(of_u, of_v));
-            }
+        width, [](ptrdiff_t x) { return x; },
+        [&](ptrdiff_t x, ptrdiff_t) {
+            const auto p = load_pixels<Kind>(src0 + size * x);
+            store(y0 + x, m.luma(p));
+            if constexpr (Out == chroma_out::half) store_split(u + x / 2, v + x / 2, m.chroma(p));
+            if constexpr (Out == chroma_out::pairs) store(u + x, m.chroma(p));
+            if (src1) store(y1 + x, m.luma(load_pixels<Kind>(src1 + size * x)));
         },
         [&](ptrdiff_t x, int count) {
-            uint8_t pixels[bytes * size] = {}, to_y[bytes], to_u[bytes], to_v[bytes];
-            memcpy(pixels, src + size * x, size_t(count) * size);
-            any_yuv_row<In, Out>(w, pixels, to_y, to_u, to_v, bytes);
-            memcpy(y + x, to_y, size_t(count));
+            uint8_t pixels[2][bytes * size] = {}, to_y[2][bytes], to_u[bytes], to_v[bytes];
+            memcpy(pixels[0], src0 + size * x, size_t(count) * size);
+            if (src1) memcpy(pixels[1], src1 + size * x, size_t(count) * size);
+            any_yuv_row<Kind, Out>(w, pixels[0], pixels[1], to_y[0], to_y[1], to_u, to_v, bytes);
+            memcpy(y0 + x, to_y[0], size_t(count));
+            if (src1) memcpy(y1 + x, to_y[1], size_t(count));
             if (Out == chroma_out::none) return;
             const size_t samples = size_t(count + 1) / 2;
             memcpy(u + chroma_size * (x / 2), to_u, chroma_size * samples);
@@ -413,28 +443,51 @@ inline void store_channels(uint8_t *dst, u8v first, u8v g, u8v last, bool alpha_
     }
 }
 
+// Calls convert(p, q) for every `bytes` pixels of `size` bytes at q that become pixels of `to_size`
+// bytes at p; what is left goes through the stack.
+template <int Size, int ToSize, class Convert>
+inline void repack_in_steps(const uint8_t *src, uint8_t *dst, ptrdiff_t count, Convert convert) {
+    row_of_steps<false>(
+        count, [&](ptrdiff_t x) { return src + Size * x; },
+        [&](ptrdiff_t x, const uint8_t *from) { convert(dst + ToSize * x, from); },
+        [&](ptrdiff_t x, int part) {
+            uint8_t pixels[bytes * Size] = {}, to[bytes * ToSize];
+            memcpy(pixels, src + Size * x, size_t(part) * Size);
+            convert(to, pixels);
+            memcpy(dst + ToSize * x, to, size_t(part) * ToSize);
+        });
+}
+
 template <rgb_in In, pixel_kind To>
 static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
-    constexpr int size = size_in<In>, to_size = int(To) + 2;
-    row_of_steps<false>(
-        count, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
-        [&](ptrdiff_t x, rgb_v p) {
-            channels_v c = channels_of(p);
-            if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
-            store_channels<To>(dst + to_size * x, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
-        },
-        [&](ptrdiff_t x, int part) {
-            uint8_t pixels[bytes * size] = {}, to[bytes * to_size];
-            memcpy(pixels, src + size * x, size_t(part) * size);
-            repack_pixels<In, To>(order, pixels, to, bytes);
-            memcpy(dst + to_size * x, to, size_t(part) * to_size);
-        });
+    repack_in_steps<size_in<In>, int(To) + 2>(src, dst, count, [&](uint8_t *p, const uint8_t *q) {
+        channels_v c = channels_of(load_pixels<In>(q));
+        if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
+        store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
+    });
 }
-template <pixel_kind To>
-static void repack_four(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    (order.from_alpha_first ? repack_pixels<rgb_in::four_alpha_first, To>
-                            : repack_pixels<rgb_in::four, To>)(order, src, dst, count);
+static void four_to_words(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    (order.from_alpha_first
+         ? repack_pixels<rgb_in::four_alpha_first, pixel_kind::words>
+         : repack_pixels<rgb_in::four, pixel_kind::words>)(order, src, dst, count);
+}
+static void exchange_three(const repacking &, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
+    repack_in_steps<3, 3>(src, dst, count,
+                          [](uint8_t *p, const uint8_t *q) { exchange_888(p, q); });
+}
+static void three_to_four(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    const widen_moves m = set_widen_moves(order.exchange, order.to_alpha_first);
+    repack_in_steps<3, 4>(src, dst, count,
+                          [&](uint8_t *p, const uint8_t *q) { repack_888_to_8888(p, q, m); });
+}
+static void four_to_three(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    const narrow_moves m = set_narrow_moves(order.exchange, order.from_alpha_first);
+    repack_in_steps<4, 3>(src, dst, count,
+                          [&](uint8_t *p, const uint8_t *q) { repack_8888_to_888(p, q, m); });
 }
 
 // The first byte of each byte's pixel, from the start of the block.
@@ -513,6 +566,38 @@ static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v
         });
 }
 
+template <bool LumaFirst, bool Pairs>
+static void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                          uint8_t *u, uint8_t *v, ptrdiff_t pairs) {
+    in_steps<bytes / 2>(
+        pairs,
+        [&](ptrdiff_t i) {
+            const pair_u8 p = load_split(src0 + 4 * i);
+            const pair_u8 q = load_split(src1 + 4 * i);
+            const u8v chroma = by8_to_natural(LumaFirst ? p.odd : p.even);
+            store(y0 + 2 * i, by8_to_natural(LumaFirst ? p.even : p.odd));
+            store(y1 + 2 * i, by8_to_natural(LumaFirst ? q.even : q.odd));
+            if constexpr (Pairs)
+                store(u + 2 * i, chroma);
+            else
+                store_split(u + i, v + i, chroma);
+        },
+        [&](ptrdiff_t i) {
+            constexpr int luma = LumaFirst ? 0 : 1, chroma = 1 - luma;
+            for (int k = 0; k < 2; k++) {
+                y0[2 * i + k] = src0[4 * i + 2 * k + luma];
+                y1[2 * i + k] = src1[4 * i + 2 * k + luma];
+                *(Pairs ? u + 2 * i + k : k ? v + i : u + i) = src0[4 * i + 2 * k + chroma];
+            }
+        });
+}
+template <bool Pairs>
+static void any_groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                              uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool luma_first) {
+    (luma_first ? groups_to_420<true, Pairs> : groups_to_420<false, Pairs>)(src0, src1, y0, y1, u,
+                                                                            v, pairs);
+}
+
 static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
     in_steps(
         count, [&](ptrdiff_t x) { store(dst + x, avg_u8(load(a + x), load(b + x))); },
@@ -577,31 +662,41 @@ static void fill_any_kind(any_rows &t) {
        any_row_pair<chroma_in::pairs, Kind>);
     in(chroma_in::groups, any_row<chroma_in::groups, Kind>,
        any_pair_of_rows<chroma_in::groups, Kind>);
-    t.repack[size_t(pixel_kind::words)][k] = repack_pixels<rgb_in::words, Kind>;
-    t.repack[size_t(pixel_kind::three)][k] = repack_pixels<rgb_in::three, Kind>;
-    t.repack[size_t(pixel_kind::four)][k] = repack_four<Kind>;
 }
-template <rgb_in In>
+template <pixel_kind Kind>
 static void fill_any_rgb(any_rows &t) {
-    any_to_yuv_row **const to = t.to_yuv[size_t(In)];
-    to[size_t(chroma_out::none)] = any_yuv_row<In, chroma_out::none>;
-    to[size_t(chroma_out::half)] = any_yuv_row<In, chroma_out::half>;
-    to[size_t(chroma_out::pairs)] = any_yuv_row<In, chroma_out::pairs>;
-    t.split_pixels[size_t(In)] = split_pixels_vectors<In>;
+    any_to_yuv_row **const to = t.to_yuv[size_t(Kind)];
+    to[size_t(chroma_out::none)] = any_yuv_row<Kind, chroma_out::none>;
+    to[size_t(chroma_out::half)] = any_yuv_row<Kind, chroma_out::half>;
+    to[size_t(chroma_out::pairs)] = any_yuv_row<Kind, chroma_out::pairs>;
+    t.split_pixels[size_t(Kind)] = split_pixels_vectors<rgb_in(Kind)>;
 }
 
 void fill_any(any_rows &t) {
     fill_any_kind<pixel_kind::words>(t);
     fill_any_kind<pixel_kind::three>(t);
     fill_any_kind<pixel_kind::four>(t);
-    t.repack[size_t(pixel_kind::four)][size_t(pixel_kind::four)] = reorder_four;
-    fill_any_rgb<rgb_in::words>(t);
-    fill_any_rgb<rgb_in::three>(t);
-    fill_any_rgb<rgb_in::four>(t);
-    fill_any_rgb<rgb_in::four_alpha_first>(t);
+    constexpr size_t words = size_t(pixel_kind::words), three = size_t(pixel_kind::three),
+                     four = size_t(pixel_kind::four);
+    t.repack[words][words] = repack_pixels<rgb_in::words, pixel_kind::words>;
+    t.repack[words][three] = repack_pixels<rgb_in::words, pixel_kind::three>;
+    t.repack[words][four] = repack_pixels<rgb_in::words, pixel_kind::four>;
+    t.repack[three][words] = repack_pixels<rgb_in::three, pixel_kind::words>;
+    t.repack[three][three] = exchange_three;
+    t.repack[three][four] = three_to_four;
+    t.repack[four][words] = four_to_words;
+    t.repack[four][three] = four_to_three;
+    t.repack[four][four] = reorder_four;
+    fill_any_rgb<pixel_kind::words>(t);
+    fill_any_rgb<pixel_kind::three>(t);
+    fill_any_rgb<pixel_kind::four>(t);
+    t.split_pixels[size_t(rgb_in::four_alpha_first)] =
+        split_pixels_vectors<rgb_in::four_alpha_first>;
     t.chroma = any_chroma_row;
     t.split_groups = any_split_groups;
     t.join_groups = any_join_groups;
+    t.groups_to_planes = any_groups_to_420<false>;
+    t.groups_to_pairs = any_groups_to_420<true>;
     t.mean_of_lines = any_mean_of_lines;
     t.mean_of_pairs = any_mean_of_pairs;
     t.mean_of_blocks = any_mean_of_blocks;
