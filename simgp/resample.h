@@ -229,18 +229,30 @@ class resampled_lines {
         int at = held(row);
         if (at >= 0) return at;
         at = wanted >= 0 ? 1 - wanted : held_[0] <= held_[1] ? 0 : 1;
-        r_.loops.across(strip_, source_.fetch(row), ring_[at], ahead(rows_ahead));
+        r_.loops.across(strip_, source_.fetch(row), ring_[at],
+                        ahead(r_.y.cell(2) > rows_ahead ? r_.y.cell(2) : rows_ahead));
         held_[at] = row;
         return at;
     }
 
+    // Of two lines that have a row in common the last of the one is the first of the other. A line of
+    // phase 0 takes any row as its second, and so the next line's first.
+    bool shares_row(ptrdiff_t line) const {
+        return r_.y.phase(line) == 0 || r_.y.next(line) == r_.y.cell(line + 1);
+    }
+    // A line is made alone if the next one shares its row with the one after it, not with this one.
     int make_from_rows(ptrdiff_t line, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
         const resize_axis &y = r_.y;
-        const int count = line + 1 < end ? 2 : 1;
-        resize_line two[2];
-        for (int k = 0; k < count; k++)
-            two[k] = {source_.fetch(y.cell(line + k)), source_.fetch(y.next(line + k)),
-                      y.phase(line + k)};
+        const bool shares = shares_row(line);
+        const bool pair = line + 1 < end && (shares || line + 2 >= end || !shares_row(line + 1));
+        const uint8_t *const above = source_.fetch(y.cell(line));
+        const uint8_t *const below =
+            source_.fetch(pair && shares ? y.cell(line + 1) : y.next(line));
+        resize_line two[2] = {{above, below, y.phase(line)}, {}};
+        if (pair)
+            two[1] = {shares ? below : source_.fetch(y.cell(line + 1)),
+                      source_.fetch(y.next(line + 1)), y.phase(line + 1)};
+        const int count = pair ? 2 : 1;
         r_.loops.both(strip_, two, count, dst, stride, ahead(y.cell(2)));
         return count;
     }

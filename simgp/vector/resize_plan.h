@@ -56,6 +56,8 @@ template <int C>
 static void measure(resize_strip &s, int32_t kept_vectors) {
     const int64_t need = window_bytes<C>(s);
     s.windows = need <= 16 ? 1 : need <= 32 ? 2 : need <= 64 ? 4 : 0;
+    // Many windows are more work than what is gained by not keeping rows.
+    if (s.windows == 0 || s.windows == 4) s.keeps = true;
     s.shared = s.windows == 1 && shared_window_bytes<C>(s) <= 16;
     const size_t plan = s.windows == 1   ? sizeof(step_plan<1>)
                         : s.windows == 2 ? sizeof(step_plan<2>)
