@@ -279,7 +279,9 @@ static void lines_down(const resize_strip &s, const resize_line *lines, uint8_t 
             store(to1 + lane, Pixel::down(a, b, second));
         }
     };
-    for (int32_t t = 0; t < s.steps; t++) step(t, t * bytes < s.last ? t * bytes : s.last);
+    const int32_t whole = s.steps - 1;
+    for (int32_t t = 0; t < whole; t++) step(t, t * bytes);
+    step(whole, s.last);
 }
 template <class Pixel>
 static void down(const resize_strip &s, const resize_line *lines, int32_t count, uint8_t *dst,
