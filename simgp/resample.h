@@ -29,6 +29,8 @@ struct resize_axis {
     ptrdiff_t tap() const { return ptrdiff_t(1) << shift; }
     // The second neighbour; the first again where it has no weight.
     ptrdiff_t next(ptrdiff_t i) const { return cell(i) + (phase(i) ? tap() : 0); }
+    // How far n samples reach, to the nearest sample that may be a neighbour.
+    ptrdiff_t reach(ptrdiff_t n) const { return ptrdiff_t((at(n) + (1 << 17)) >> 18) * tap(); }
     // How much of the source the first n >= 1 samples need.
     ptrdiff_t extent(ptrdiff_t n) const { return next(n - 1) + 1; }
 };
@@ -230,7 +232,7 @@ class resampled_lines {
         if (at >= 0) return at;
         at = wanted >= 0 ? 1 - wanted : held_[0] <= held_[1] ? 0 : 1;
         r_.loops.across(strip_, source_.fetch(row), ring_[at],
-                        ahead(r_.y.cell(2) > rows_ahead ? r_.y.cell(2) : rows_ahead));
+                        ahead(r_.y.reach(2) > rows_ahead ? r_.y.reach(2) : rows_ahead));
         held_[at] = row;
         return at;
     }
@@ -253,7 +255,7 @@ class resampled_lines {
             two[1] = {shares ? below : source_.fetch(y.cell(line + 1)),
                       source_.fetch(y.next(line + 1)), y.phase(line + 1)};
         const int count = pair ? 2 : 1;
-        r_.loops.both(strip_, two, count, dst, stride, ahead(y.cell(2)));
+        r_.loops.both(strip_, two, count, dst, stride, ahead(y.reach(2)));
         return count;
     }
 

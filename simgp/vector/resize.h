@@ -220,14 +220,18 @@ struct word_lanes {
 // --------------------------------------------------------------------------------------------------
 
 // A row that is shorter than a window is read from a copy.
+[[gnu::noinline]] static void copy_short_row(uint8_t (&copy)[16], const uint8_t *row,
+                                             int32_t count) {
+    memset(copy, 0, sizeof copy);
+    memcpy(copy, row, size_t(count));
+}
 struct readable_row {
     uint8_t copy[16];
     const uint8_t *row;
 
     SIMD_INLINE readable_row(const resize_strip &s, const uint8_t *p) : row(p) {
         if (s.row_bytes >= 16 || s.windows == 0) return;
-        memset(copy, 0, sizeof copy);
-        memcpy(copy, p, size_t(s.row_bytes));
+        copy_short_row(copy, p, s.row_bytes);
         row = copy;
     }
 };
