@@ -55,16 +55,18 @@ using resize_measure_row = void(resize_strip &s);
 // Makes the plan.
 using resize_plan_row = void(resize_strip &s);
 
-// Blends a row of the source across and keeps the result for `down`. A row that will be wanted soon
-// lies `ahead` bytes further: a hint, which may lead out of the plane.
-using resize_across_row = void(const resize_strip &s, const uint8_t *row, uint8_t *kept,
-                               ptrdiff_t ahead);
-
 // A line of the destination between two rows; below is above where the phase, 0 ... 7, is 0.
 struct resize_line {
     const uint8_t *above, *below;
     int32_t phase;
 };
+
+// Blends a row of the source across and keeps the result for `down`. Then writes `count` lines, 0 to
+// 2, as `down` does, for which it is the lower row. A row that will be wanted soon lies `ahead` bytes
+// further: a hint, which may lead out of the plane.
+using resize_across_row = void(const resize_strip &s, const uint8_t *row, uint8_t *kept,
+                               ptrdiff_t ahead, const resize_line *lines, int32_t count,
+                               uint8_t *dst, ptrdiff_t stride);
 
 // Writes `count` lines, 1 or 2, of the strip at dst and dst + stride, from kept rows. Both lines lie
 // between the same rows.

@@ -219,11 +219,15 @@ class resampled_lines {
         const ptrdiff_t row = y.cell(line);
         const bool pair = line + 1 < end && y.cell(line + 1) == row && y.phase(line + 1);
         const ptrdiff_t below = pair ? y.next(line + 1) : y.next(line);
-        const int b = held(below), a = keep(row, b), c = keep(below, a);
+        const int count = pair ? 2 : 1, held_below = held(below), a = keep(row, held_below);
+        const int c = below == row ? a : 1 - a;
         const resize_line two[2] = {{ring_[a], ring_[c], y.phase(line)},
                                     {ring_[a], ring_[c], y.phase(line + 1)}};
-        r_.loops.down(strip_, two, pair ? 2 : 1, dst, stride);
-        return pair ? 2 : 1;
+        if (c == a || c == held_below)
+            r_.loops.down(strip_, two, count, dst, stride);
+        else
+            blend(below, c, two, count, dst, stride);
+        return count;
     }
     int held(ptrdiff_t row) const { return held_[0] == row ? 0 : held_[1] == row ? 1 : -1; }
     // Where the row is kept, from now on if it was not; the one at `wanted` stays.
@@ -231,10 +235,16 @@ class resampled_lines {
         int at = held(row);
         if (at >= 0) return at;
         at = wanted >= 0 ? 1 - wanted : held_[0] <= held_[1] ? 0 : 1;
-        r_.loops.across(strip_, source_.fetch(row), ring_[at],
-                        ahead(r_.y.reach(2) > rows_ahead ? r_.y.reach(2) : rows_ahead));
-        held_[at] = row;
+        blend(row, at, nullptr, 0, nullptr, 0);
         return at;
+    }
+    // Keeps a row, and makes the lines above it.
+    void blend(ptrdiff_t row, int at, const resize_line *above, int count, uint8_t *dst,
+               ptrdiff_t stride) {
+        const ptrdiff_t reach = r_.y.reach(2);
+        r_.loops.across(strip_, source_.fetch(row), ring_[at],
+                        ahead(reach > rows_ahead ? reach : rows_ahead), above, count, dst, stride);
+        held_[at] = row;
     }
 
     // Of two lines that have a row in common the last of the one is the first of the other. A line of
