@@ -30,7 +30,7 @@ struct resize_strip {
     // Whoever wants a strip.
     uint32_t step;      // from a column to the next: 18 fractional bits, in units of 2^shift pixels
     int32_t shift;      // 0 ... 4
-    bool keeps;         // for `across` and `down`; else for `both`
+    bool keeps;         // for `across` and `down`; else for `both`. `measure` may choose the first
     int32_t x;          // the first column of the destination
     int32_t columns;    // at least 1
     int32_t first;      // the column of the source at which the rows begin that are handed over
@@ -49,16 +49,11 @@ struct resize_strip {
     int32_t direct_from, direct_to;
 };
 
-// Looks at step, shift and keeps only.
+// Looks at step, shift and keeps only; may set keeps.
 using resize_measure_row = void(resize_strip &s);
 
 // Makes the plan.
 using resize_plan_row = void(resize_strip &s);
-
-// Blends a row of the source across and keeps the result for `down`. A row that will be wanted soon
-// lies `ahead` bytes further: a hint, which may lead out of the plane.
-using resize_across_row = void(const resize_strip &s, const uint8_t *row, uint8_t *kept,
-                               ptrdiff_t ahead);
 
 // A line of the destination between two rows; below is above where the phase, 0 ... 7, is 0.
 struct resize_line {
@@ -66,12 +61,20 @@ struct resize_line {
     int32_t phase;
 };
 
+// Blends a row of the source across and keeps the result for `down`. Then writes `count` lines, 0 to
+// 2, as `down` does, for which it is the lower row. A row that will be wanted soon lies `ahead` bytes
+// further: a hint, which may lead out of the plane.
+using resize_across_row = void(const resize_strip &s, const uint8_t *row, uint8_t *kept,
+                               ptrdiff_t ahead, const resize_line *lines, int32_t count,
+                               uint8_t *dst, ptrdiff_t stride);
+
 // Writes `count` lines, 1 or 2, of the strip at dst and dst + stride, from kept rows. Both lines lie
 // between the same rows.
 using resize_down_row = void(const resize_strip &s, const resize_line *lines, int32_t count,
                              uint8_t *dst, ptrdiff_t stride);
 
-// The same from rows of the source, any two for each line. `ahead` is a hint as above.
+// The same from rows of the source, any two for each line; it is less work where what lies below the
+// first of two lines lies above the second. `ahead` is a hint as above.
 using resize_both_row = void(const resize_strip &s, const resize_line *lines, int32_t count,
                              uint8_t *dst, ptrdiff_t stride, ptrdiff_t ahead);
 

@@ -29,6 +29,8 @@ struct resize_axis {
     ptrdiff_t tap() const { return ptrdiff_t(1) << shift; }
     // The second neighbour; the first again where it has no weight.
     ptrdiff_t next(ptrdiff_t i) const { return cell(i) + (phase(i) ? tap() : 0); }
+    // How far n samples reach, to the nearest sample that may be a neighbour.
+    ptrdiff_t reach(ptrdiff_t n) const { return ptrdiff_t((at(n) + (1 << 17)) >> 18) * tap(); }
     // How much of the source the first n >= 1 samples need.
     ptrdiff_t extent(ptrdiff_t n) const { return next(n - 1) + 1; }
 };
@@ -217,11 +219,15 @@ class resampled_lines {
         const ptrdiff_t row = y.cell(line);
         const bool pair = line + 1 < end && y.cell(line + 1) == row && y.phase(line + 1);
         const ptrdiff_t below = pair ? y.next(line + 1) : y.next(line);
-        const int b = held(below), a = keep(row, b), c = keep(below, a);
+        const int count = pair ? 2 : 1, held_below = held(below), a = keep(row, held_below);
+        const int c = below == row ? a : 1 - a;
         const resize_line two[2] = {{ring_[a], ring_[c], y.phase(line)},
                                     {ring_[a], ring_[c], y.phase(line + 1)}};
-        r_.loops.down(strip_, two, pair ? 2 : 1, dst, stride);
-        return pair ? 2 : 1;
+        if (c == a || c == held_below)
+            r_.loops.down(strip_, two, count, dst, stride);
+        else
+            blend(below, c, two, count, dst, stride);
+        return count;
     }
     int held(ptrdiff_t row) const { return held_[0] == row ? 0 : held_[1] == row ? 1 : -1; }
     // Where the row is kept, from now on if it was not; the one at `wanted` stays.
@@ -229,19 +235,37 @@ class resampled_lines {
         int at = held(row);
         if (at >= 0) return at;
         at = wanted >= 0 ? 1 - wanted : held_[0] <= held_[1] ? 0 : 1;
-        r_.loops.across(strip_, source_.fetch(row), ring_[at], ahead(rows_ahead));
-        held_[at] = row;
+        blend(row, at, nullptr, 0, nullptr, 0);
         return at;
     }
+    // Keeps a row, and makes the lines above it.
+    void blend(ptrdiff_t row, int at, const resize_line *above, int count, uint8_t *dst,
+               ptrdiff_t stride) {
+        const ptrdiff_t reach = r_.y.reach(2);
+        r_.loops.across(strip_, source_.fetch(row), ring_[at],
+                        ahead(reach > rows_ahead ? reach : rows_ahead), above, count, dst, stride);
+        held_[at] = row;
+    }
 
+    // Of two lines that have a row in common the last of the one is the first of the other. A line of
+    // phase 0 takes any row as its second, and so the next line's first.
+    bool shares_row(ptrdiff_t line) const {
+        return r_.y.phase(line) == 0 || r_.y.next(line) == r_.y.cell(line + 1);
+    }
+    // A line is made alone if the next one shares its row with the one after it, not with this one.
     int make_from_rows(ptrdiff_t line, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
         const resize_axis &y = r_.y;
-        const int count = line + 1 < end ? 2 : 1;
-        resize_line two[2];
-        for (int k = 0; k < count; k++)
-            two[k] = {source_.fetch(y.cell(line + k)), source_.fetch(y.next(line + k)),
-                      y.phase(line + k)};
-        r_.loops.both(strip_, two, count, dst, stride, ahead(y.cell(2)));
+        const bool shares = shares_row(line);
+        const bool pair = line + 1 < end && (shares || line + 2 >= end || !shares_row(line + 1));
+        const uint8_t *const above = source_.fetch(y.cell(line));
+        const uint8_t *const below =
+            source_.fetch(pair && shares ? y.cell(line + 1) : y.next(line));
+        resize_line two[2] = {{above, below, y.phase(line)}, {}};
+        if (pair)
+            two[1] = {shares ? below : source_.fetch(y.cell(line + 1)),
+                      source_.fetch(y.next(line + 1)), y.phase(line + 1)};
+        const int count = pair ? 2 : 1;
+        r_.loops.both(strip_, two, count, dst, stride, ahead(y.reach(2)));
         return count;
     }
 

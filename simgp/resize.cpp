@@ -69,15 +69,6 @@ void plan(resize_strip &) {}
 
 // Kept are 16 bits for each channel.
 template <class Pixel>
-void across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t) {
-    for (ptrdiff_t i = 0; i < s.columns; i++)
-        for (int k = 0; k < Pixel::channels; k++, kept += 2) {
-            const uint16_t blend = uint16_t(blend_across<Pixel>(row, column(s, i), k));
-            memcpy(kept, &blend, 2);
-        }
-}
-
-template <class Pixel>
 void down(const resize_strip &s, const resize_line *lines, int32_t count, uint8_t *dst,
           ptrdiff_t stride) {
     const auto kept = [](const uint8_t *row, ptrdiff_t at) {
@@ -94,6 +85,17 @@ void down(const resize_strip &s, const resize_line *lines, int32_t count, uint8_
             }
             Pixel::write(dst + i * Pixel::size, c);
         }
+}
+
+template <class Pixel>
+void across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t,
+            const resize_line *lines, int32_t count, uint8_t *dst, ptrdiff_t stride) {
+    for (ptrdiff_t i = 0; i < s.columns; i++)
+        for (int k = 0; k < Pixel::channels; k++, kept += 2) {
+            const uint16_t blend = uint16_t(blend_across<Pixel>(row, column(s, i), k));
+            memcpy(kept, &blend, 2);
+        }
+    down<Pixel>(s, lines, count, dst, stride);
 }
 
 template <class Pixel>

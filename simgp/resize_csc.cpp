@@ -40,29 +40,31 @@ grids grids_of(const int32_t *src_widths, const int32_t *src_heights, const int3
     }
 }
 
-// The resampled lines of a strip as a source of lines, see walk.h: two are made at a time.
+// The resampled lines of a strip as a source of lines, see walk.h: one or two are made at a time, in a
+// ring of three, so that the one that was asked for last stays.
+inline constexpr ptrdiff_t lines_in_ring = 3;
 template <class Source>
-class line_pairs {
+class line_ring {
   public:
-    line_pairs(const resampling &r, const resize_strip &strip, const Source &source,
-               ptrdiff_t height, uint8_t *ring, uint8_t *lines)
-        : made_(r, strip, source, ring),
+    line_ring(const resampling &r, const resize_strip &strip, const Source &source,
+              ptrdiff_t height, uint8_t *kept, uint8_t *lines)
+        : made_(r, strip, source, kept),
           height_(height),
           stride_(strip.columns * r.pixel_bytes),
           lines_(lines) {}
 
     const uint8_t *fetch(ptrdiff_t y) {
-        if (y >= end_) {
-            first_ = y;
-            end_ = y + 1 < height_ ? y + 2 : y + 1;
-            made_.make(first_, end_ - first_, lines_, stride_);
-        }
-        return lines_ + (y - first_) * stride_;
+        uint8_t *const line = lines_ + y % lines_in_ring * stride_;
+        const bool wraps = y % lines_in_ring == lines_in_ring - 1;
+        if (y >= end_)
+            end_ = y + made_.make_some(y, height_, line,
+                                       wraps ? (1 - lines_in_ring) * stride_ : stride_);
+        return line;
     }
 
   private:
     resampled_lines<Source> made_;
-    ptrdiff_t height_, stride_, first_ = 0, end_ = 0;
+    ptrdiff_t height_, stride_, end_ = 0;
     uint8_t *lines_;
 };
 
@@ -143,7 +145,7 @@ class untiled_rows {
     int next_ = 0;
 };
 
-// The memory of a strip for luma or chroma: a plan, and for each plane what is kept and two lines.
+// The memory of a strip for luma or chroma: a plan, and for each plane what is kept and some lines.
 struct plane_memory {
     uint8_t *plan, *ring[2], *lines[2];
 
@@ -151,7 +153,7 @@ struct plane_memory {
         : plan(from.take(r.plan_bytes(columns))), ring(), lines() {
         for (int k = 0; k < planes; k++) {
             ring[k] = from.take(r.ring_bytes(columns));
-            lines[k] = from.take(2 * columns * r.pixel_bytes);
+            lines[k] = from.take(lines_in_ring * columns * r.pixel_bytes);
         }
     }
 };
@@ -257,12 +259,12 @@ class fused {
         const resize_strip chroma =
             chroma_.plan(pairs.x, pairs.columns, span_of(chroma_, pairs, of_chroma), m.chroma.plan);
 
-        line_pairs y(luma_, luma, rows_of(0, luma_, at, of_luma, m.luma_rows), of_luma.dst_height,
-                     m.luma.ring[0], m.luma.lines[0]);
+        line_ring y(luma_, luma, rows_of(0, luma_, at, of_luma, m.luma_rows), of_luma.dst_height,
+                    m.luma.ring[0], m.luma.lines[0]);
         const auto plane = [&](int which, int k) {
-            return line_pairs(chroma_, chroma,
-                              rows_of(which, chroma_, pairs, of_chroma, m.chroma_rows),
-                              of_chroma.dst_height, m.chroma.ring[k], m.chroma.lines[k]);
+            return line_ring(chroma_, chroma,
+                             rows_of(which, chroma_, pairs, of_chroma, m.chroma_rows),
+                             of_chroma.dst_height, m.chroma.ring[k], m.chroma.lines[k]);
         };
         const auto walk = [&](auto &&u, auto &&v) {
             walk_yuv_to_rgb<like, formats::RGB565, yuv_rule::usual>(

@@ -54,11 +54,11 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 }
 
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
-// Of large planes the lines of the destination are asked for meanwhile, some between every `step`
-// lines that are made: they lie far apart, and no processor foresees them.
+// Of large planes the lines of the destination are asked for meanwhile, some whenever lines have been
+// made: they lie far apart, and no processor foresees them.
 template <sample_kind S, bool Right>
 void quarter_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32, step = 4;
+    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
@@ -75,12 +75,13 @@ void quarter_turn(const resize_args &args) {
                 const lines to = Right ? in.upside_down(rows) : in;
                 const ptrdiff_t column = Right ? height - y - rows : y;
                 uintptr_t ahead = reinterpret_cast<uintptr_t>(dst.line(x) + column * size);
-                const ptrdiff_t each = (columns * step + rows - 1) / rows;
-                for (ptrdiff_t k = 0; k < rows; k += step) {
-                    if (fetch)
-                        for (ptrdiff_t i = 0; i < each; i++, ahead += uintptr_t(dst.stride))
-                            __builtin_prefetch(reinterpret_cast<const void *>(ahead), 1);
-                    made.make(y + k, rows - k < step ? rows - k : step, to.line(k), to.stride);
+                const ptrdiff_t each = (columns + rows - 1) / rows;
+                for (ptrdiff_t k = 0; k < rows;) {
+                    const int count = made.make_some(y + k, y + rows, to.line(k), to.stride);
+                    k += count;
+                    if (!fetch) continue;
+                    for (ptrdiff_t i = 0; i < count * each; i++, ahead += uintptr_t(dst.stride))
+                        __builtin_prefetch(reinterpret_cast<const void *>(ahead), 1);
                 }
                 for (ptrdiff_t i = 0; i < columns; i += side)
                     transpose(in.first + i * size, in.stride, dst.line(x + i) + column * size,
@@ -101,12 +102,10 @@ void half_turn(const resize_args &args) {
         r, a.src, a.width, band,
         [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
             const ptrdiff_t column = a.width - x - columns;
-            for (ptrdiff_t y = 0; y < a.height; y += band) {
-                const ptrdiff_t rows = a.height - y < band ? a.height - y : band;
-                made.make(y, rows, block.first, block.stride);
-                for (ptrdiff_t k = 0; k < rows; k++)
-                    reverse(block.first + k * block.stride, dst.line(y + k) + column * size,
-                            columns);
+            for (ptrdiff_t y = 0; y < a.height;) {
+                const int rows = made.make_some(y, a.height, block.first, block.stride);
+                for (ptrdiff_t k = 0; k < rows; k++, y++)
+                    reverse(block.first + k * block.stride, dst.line(y) + column * size, columns);
             }
         });
 }

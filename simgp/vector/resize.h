@@ -98,37 +98,36 @@ struct from_afar {
     SIMD_INLINE void fetch_ahead(const uint8_t *, ptrdiff_t, int32_t) const {}
 };
 
-// Calls f(source, t, lane) for the steps t of a strip.
-template <bool Natural, class F>
+// What is done with a step: lines are made of it, it is kept, or both.
+enum class use { made, kept, kept_and_made };
+
+// Calls f(source, t, lane) for step t, whose first lane that is. Shared windows are worth a loop only
+// where rows are kept, and what comes from many windows, or from afar, is only kept.
+template <use Use, class F>
 SIMD_INLINE void for_each_step(const resize_strip &s, F f) {
-    const int32_t whole = s.steps - 1;
-    const auto run = [=](const auto &source, int32_t from, int32_t to) SIMD_INLINED {
-        for (int32_t t = from; t < to; t++) f(source, t, t * bytes);
+    const int32_t steps = s.steps, last = s.last;
+    const auto run = [=](const auto &source, int32_t t, int32_t end) SIMD_INLINED {
+        for (; t < end; t++) f(source, t, t * bytes < last ? t * bytes : last);
     };
-    const auto all = [=, last = s.last](const auto &source) SIMD_INLINED {
-        run(source, 0, whole);
-        f(source, whole, last);
-    };
-    if (s.windows == 1 && s.shared) {
-        all(from_shared_windows(s));
+    if (Use != use::made && s.windows == 1 && s.shared) {
+        run(from_shared_windows(s), 0, steps);
     } else if (s.windows == 1) {
         const from_windows<1> windows(s);
-        const from_row<Natural> row(s);
-        const int32_t from = s.direct_from < whole ? s.direct_from : whole;
-        const int32_t to = s.direct_to < whole ? s.direct_to : whole;
-        run(windows, 0, from);
-        run(row, from, to);
-        run(windows, to, whole);
-        if (s.direct_to == s.steps)
-            f(row, whole, s.last);
-        else
-            f(windows, whole, s.last);
+        const from_row<Use == use::made> row(s);
+        int32_t t = 0;
+        for (int32_t end = s.direct_from;; end = steps) {
+            run(windows, t, end);
+            if (end == steps) break;
+            run(row, end, s.direct_to);
+            t = s.direct_to;
+        }
     } else if (s.windows == 2) {
-        all(from_windows<2>(s));
-    } else if (s.windows == 4) {
-        all(from_windows<4>(s));
-    } else {
-        all(from_afar(s));
+        run(from_windows<2>(s), 0, steps);
+    } else if constexpr (Use == use::kept) {
+        if (s.windows == 4)
+            run(from_windows<4>(s), 0, steps);
+        else
+            run(from_afar(s), 0, steps);
     }
 }
 
@@ -224,14 +223,18 @@ struct word_lanes {
 // --------------------------------------------------------------------------------------------------
 
 // A row that is shorter than a window is read from a copy.
+[[gnu::noinline]] static void copy_short_row(uint8_t (&copy)[16], const uint8_t *row,
+                                             int32_t count) {
+    memset(copy, 0, sizeof copy);
+    memcpy(copy, row, size_t(count));
+}
 struct readable_row {
     uint8_t copy[16];
     const uint8_t *row;
 
     SIMD_INLINE readable_row(const resize_strip &s, const uint8_t *p) : row(p) {
         if (s.row_bytes >= 16 || s.windows == 0) return;
-        memset(copy, 0, sizeof copy);
-        memcpy(copy, p, size_t(s.row_bytes));
+        copy_short_row(copy, p, s.row_bytes);
         row = copy;
     }
 };
@@ -254,34 +257,42 @@ class written_line {
     uint8_t *const to;
 };
 
-template <class Pixel>
-static void across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t ahead) {
-    const readable_row from(s, row);
-    const uint8_t *const p = from.row;
-    for_each_step<false>(s, [=](const auto &source, int32_t t, int32_t) SIMD_INLINED {
-        source.fetch_ahead(row, ahead, t);
-        Pixel::keep(kept + t * Pixel::kept_vectors * bytes,
-                    Pixel::across(source.pairs(p, t), source.weights(t)));
-    });
-}
+// Writes N lines between two rows.
+template <class Pixel, int N>
+struct lines_between {
+    using phase = typename Pixel::phase;
+    phase first, second;
+    uint8_t *const to0, *const to1;
+    const ptrdiff_t ahead;
+
+    lines_between(const resize_line *lines, const written_line &line0, const written_line &line1,
+                  ptrdiff_t stride)
+        : first(lines[0].phase),
+          second(lines[N - 1].phase),
+          to0(line0.to),
+          to1(line1.to),
+          ahead(N * stride) {}
+
+    template <class Blend>
+    SIMD_INLINE void write(const Blend &a, const Blend &b, int32_t lane) const {
+        fetch_for_write(to0 + lane, ahead);
+        store(to0 + lane, Pixel::down(a, b, first));
+        if constexpr (N > 1) {
+            fetch_for_write(to1 + lane, ahead);
+            store(to1 + lane, Pixel::down(a, b, second));
+        }
+    }
+};
 
 template <class Pixel, int N>
 static void lines_down(const resize_strip &s, const resize_line *lines, uint8_t *dst,
                        ptrdiff_t stride) {
-    using phase = typename Pixel::phase;
     const uint8_t *const above = lines[0].above, *const below = lines[0].below;
-    const phase first(lines[0].phase), second(lines[N - 1].phase);
     const written_line line0(s, dst), line1(s, dst + (N - 1) * stride);
-    uint8_t *const to0 = line0.to, *const to1 = line1.to;
+    const lines_between<Pixel, N> made(lines, line0, line1, stride);
     const auto step = [=](int32_t t, int32_t lane) SIMD_INLINED {
         const ptrdiff_t at = ptrdiff_t(t) * Pixel::kept_vectors * bytes;
-        const auto a = Pixel::kept(above + at), b = Pixel::kept(below + at);
-        fetch_for_write(to0 + lane, N * stride);
-        store(to0 + lane, Pixel::down(a, b, first));
-        if constexpr (N > 1) {
-            fetch_for_write(to1 + lane, N * stride);
-            store(to1 + lane, Pixel::down(a, b, second));
-        }
+        made.write(Pixel::kept(above + at), Pixel::kept(below + at), lane);
     };
     const int32_t whole = s.steps - 1;
     for (int32_t t = 0; t < whole; t++) step(t, t * bytes);
@@ -294,7 +305,50 @@ static void down(const resize_strip &s, const resize_line *lines, int32_t count,
     lines_down<Pixel, 2>(s, lines, dst, stride);
 }
 
-// Chained: what lies below the first line lies above the second.
+template <class Pixel>
+static void row_across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t ahead) {
+    const readable_row from(s, row);
+    const uint8_t *const p = from.row;
+    for_each_step<use::kept>(s, [=](const auto &source, int32_t t, int32_t) SIMD_INLINED {
+        source.fetch_ahead(row, ahead, t);
+        Pixel::keep(kept + t * Pixel::kept_vectors * bytes,
+                    Pixel::across(source.pairs(p, t), source.weights(t)));
+    });
+}
+template <class Pixel, int N>
+static void across_and_down(const resize_strip &s, const uint8_t *row, uint8_t *kept,
+                            ptrdiff_t ahead, const resize_line *lines, uint8_t *dst,
+                            ptrdiff_t stride) {
+    const readable_row from(s, row);
+    const uint8_t *const p = from.row, *const above = lines[0].above;
+    const written_line line0(s, dst), line1(s, dst + (N - 1) * stride);
+    const lines_between<Pixel, N> made(lines, line0, line1, stride);
+    for_each_step<use::kept_and_made>(
+        s, [=](const auto &source, int32_t t, int32_t lane) SIMD_INLINED {
+            const ptrdiff_t at = ptrdiff_t(t) * Pixel::kept_vectors * bytes;
+            source.fetch_ahead(row, ahead, t);
+            const auto b = Pixel::across(source.pairs(p, t), source.weights(t));
+            const auto a = Pixel::kept(above + at);
+            Pixel::keep(kept + at, b);
+            made.write(a, b, lane);
+        });
+}
+template <class Pixel>
+static void across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t ahead,
+                   const resize_line *lines, int32_t count, uint8_t *dst, ptrdiff_t stride) {
+    const bool rare = s.windows == 0 || s.windows == 4;
+    if (count == 0 || rare) {
+        row_across<Pixel>(s, row, kept, ahead);
+        if (count > 0) down<Pixel>(s, lines, count, dst, stride);
+    } else if (count == 1) {
+        across_and_down<Pixel, 1>(s, row, kept, ahead, lines, dst, stride);
+    } else {
+        across_and_down<Pixel, 2>(s, row, kept, ahead, lines, dst, stride);
+    }
+}
+
+// N lines. Chained: what lies below the first lies above the second. All that is loaded is loaded
+// before the stores: compilers would load it again.
 template <class Pixel, int N, bool Chained>
 static void lines_at_once(const resize_strip &s, const resize_line *lines, uint8_t *dst,
                           ptrdiff_t stride, ptrdiff_t ahead) {
@@ -306,26 +360,28 @@ static void lines_at_once(const resize_strip &s, const resize_line *lines, uint8
     const phase first(l0.phase), second(l1.phase);
     const written_line line0(s, dst), line1(s, dst + (N - 1) * stride);
     uint8_t *const to0 = line0.to, *const to1 = line1.to;
-    for_each_step<true>(s, [=](const auto &source, int32_t t, int32_t lane) SIMD_INLINED {
+    for_each_step<use::made>(s, [=](const auto &source, int32_t t, int32_t lane) SIMD_INLINED {
         const auto ordered = [&](u8v v)
                                  SIMD_INLINED { return source.natural ? by8_to_natural(v) : v; };
         const two_vectors weights = source.weights(t);
         const auto blend = [&](const uint8_t *row) SIMD_INLINED {
+            source.fetch_ahead(row, ahead, t);
             return Pixel::across(source.pairs(row, t), weights);
         };
-        source.fetch_ahead(above0, ahead, t);
-        source.fetch_ahead(below0, ahead, t);
-        fetch_for_write(to0 + lane, N * stride);
-        const auto b = blend(below0);
-        store(to0 + lane, ordered(Pixel::down(blend(above0), b, first)));
-        if constexpr (N > 1) {
-            if constexpr (!Chained) source.fetch_ahead(above1, ahead, t);
-            source.fetch_ahead(below1, ahead, t);
-            fetch_for_write(to1 + lane, N * stride);
-            if constexpr (Chained)
-                store(to1 + lane, ordered(Pixel::down(b, blend(below1), second)));
-            else
-                store(to1 + lane, ordered(Pixel::down(blend(above1), blend(below1), second)));
+        const auto a = blend(above0), b = blend(below0);
+        const u8v made = ordered(Pixel::down(a, b, first));
+        if constexpr (N == 1) {
+            store(to0 + lane, made);
+        } else {
+            u8v next;
+            if constexpr (Chained) {
+                next = ordered(Pixel::down(b, blend(below1), second));
+            } else {
+                const auto c = blend(above1);
+                next = ordered(Pixel::down(c, blend(below1), second));
+            }
+            store(to0 + lane, made);
+            store(to1 + lane, next);
         }
     });
 }

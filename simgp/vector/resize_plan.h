@@ -56,6 +56,8 @@ template <int C>
 static void measure(resize_strip &s, int32_t kept_vectors) {
     const int64_t need = window_bytes<C>(s);
     s.windows = need <= 16 ? 1 : need <= 32 ? 2 : need <= 64 ? 4 : 0;
+    // Many windows are more work than what is gained by not keeping rows.
+    if (s.windows == 0 || s.windows == 4) s.keeps = true;
     s.shared = s.windows == 1 && shared_window_bytes<C>(s) <= 16;
     const size_t plan = s.windows == 1   ? sizeof(step_plan<1>)
                         : s.windows == 2 ? sizeof(step_plan<2>)
@@ -88,81 +90,111 @@ inline constexpr int plan_parts = 32 / sizeof(plan_vector);
     memcpy(to + h * int(sizeof pairs), &pairs, sizeof pairs);
 }
 
-// Pixel and channel of the lanes that follow one of channel k of its pixel.
-template <int C>
-struct following {
-    alignas(32) int32_t pixel[C][8], channel[C][8];
-    constexpr following() : pixel(), channel() {
-        for (int k = 0; k < C; k++)
-            for (int i = 0; i < 8; i++) {
-                pixel[k][i] = (k + i) / C;
-                channel[k][i] = (k + i) % C;
-            }
-    }
+// What a strip is made of: pixels of `bytes_of` bytes, and weights that are multiplied by `scale`.
+struct plan_kind {
+    int32_t bytes_of, scale;
 };
 
-// Eight lanes: the bytes of the row that they need, and their phases.
-template <int C>
+// Pixel and channel of the lanes that follow one of channel k of its pixel, of C bytes.
+struct following_lanes {
+    alignas(32) int32_t pixel[10][8], channel[10][8];
+    static constexpr int row(int C, int k) { return C * (C - 1) / 2 + k; }
+    constexpr following_lanes() : pixel(), channel() {
+        for (int C = 1; C <= 4; C++)
+            for (int k = 0; k < C; k++)
+                for (int i = 0; i < 8; i++) {
+                    pixel[row(C, k)][i] = (k + i) / C;
+                    channel[row(C, k)][i] = (k + i) % C;
+                }
+    }
+};
+static constexpr following_lanes following{};
+
+// Eight lanes: the bytes of the row that they need, those of q behind those of p, and their phases.
 struct eight_lanes {
-    static constexpr following<C> after{};
-    plan_vector p[plan_parts], q[plan_parts], phase[plan_parts];
+    plan_vector p[plan_parts], apart[plan_parts], phase[plan_parts];
     int32_t first;  // the lowest of the bytes
 
-    [[gnu::always_inline]] eight_lanes(const resize_strip &s, int32_t lane) {
-        const int32_t last_column = s.x + s.columns - 1, origin = C * s.first;
-        const bool whole = lane + 8 <= s.lanes;
-        if (lane >= s.lanes) lane = s.lanes - 1;
-        const int32_t column = s.x + lane / C, k = lane % C;
-        for (int h = 0; h < plan_parts; h++) {
-            plan_vector x, channel;
-            memcpy(&x, after.pixel[k] + 8 / plan_parts * h, sizeof x);
-            memcpy(&channel, after.channel[k] + 8 / plan_parts * h, sizeof channel);
-            x += column;
-            if (!whole) {
-                const plan_vector inside = x < last_column;
-                x = (x & inside) | (last_column & ~inside);
-            }
-            const plan_vector eighths = (plan_vector)((unsigned_plan_vector)x * s.step) >> 15;
-            phase[h] = eighths & 7;
-            p[h] = ((eighths >> 3) << s.shift) * C + (channel - origin);
-            q[h] = p[h] + ((phase[h] != 0) & (C << s.shift));
-        }
-        // That of the first lane, or channel 0 of the next pixel where that lies before it.
-        const auto pixel = [&](int32_t x) {
-            return ((int32_t(uint32_t(x) * s.step) >> 18) << s.shift) * C - origin;
-        };
-        first = pixel(column) + k;
-        if (C > 1 && k > 0) {
-            const int32_t next = pixel(column < last_column ? column + 1 : column);
-            first = next < first ? next : first;
-        }
-    }
     // The weights of p and q, 8 * scale together.
     [[gnu::always_inline]] void put_weights(uint8_t *to, int scale) const {
         for (int h = 0; h < plan_parts; h++)
-            put_pairs(to, h, pairs_of((8 - phase[h]) * scale, phase[h] * scale));
+            put_pairs(to, h,
+                      __builtin_convertvector(8 * scale + phase[h] * (255 * scale), plan_pairs));
     }
+};
+// What it takes to plan them, held where stores to the plan cannot change it.
+class lanes_in_turn {
+  public:
+    [[gnu::always_inline]] lanes_in_turn(const resize_strip &s, int32_t size)
+        : C_(size),
+          ahead_(8 / size),
+          pitch_(size << s.shift),
+          origin_(size * s.first),
+          first_column_(s.x),
+          last_column_(s.x + s.columns - 1),
+          step_(s.step) {}
+
+    [[gnu::always_inline]] void begin(int32_t lane) {
+        column_ = first_column_ + lane / C_;
+        k_ = lane % C_;
+    }
+    // Columns behind the last one stand for that.
+    [[gnu::always_inline]] eight_lanes next() {
+        eight_lanes l;
+        const int row = following_lanes::row(C_, k_);
+        for (int h = 0; h < plan_parts; h++) {
+            plan_vector x, channel;
+            memcpy(&x, following.pixel[row] + 8 / plan_parts * h, sizeof x);
+            memcpy(&channel, following.channel[row] + 8 / plan_parts * h, sizeof channel);
+            x += column_;
+            const plan_vector inside = x < last_column_;
+            x = (x & inside) | (last_column_ & ~inside);
+            const plan_vector eighths = (plan_vector)((unsigned_plan_vector)x * step_) >> 15;
+            l.phase[h] = eighths & 7;
+            l.p[h] = (eighths >> 3) * pitch_ + (channel - origin_);
+            l.apart[h] = (l.phase[h] != 0) & pitch_;
+        }
+        // That of the first lane, or channel 0 of the next pixel where that lies before it.
+        l.first = byte(column_) + k_;
+        if (k_ > 0) {
+            const int32_t second = byte(column_ + 1);
+            l.first = second < l.first ? second : l.first;
+        }
+        column_ += ahead_;
+        if (C_ == 3 && (k_ += 2) >= 3) {
+            k_ -= 3;
+            column_++;
+        }
+        return l;
+    }
+
+  private:
+    int32_t byte(int32_t x) const {
+        x = x < last_column_ ? x : last_column_;
+        return (int32_t(uint32_t(x) * step_) >> 18) * pitch_ - origin_;
+    }
+
+    const int32_t C_, ahead_, pitch_, origin_, first_column_, last_column_;
+    const uint32_t step_;
+    int32_t column_ = 0, k_ = 0;
 };
 
 inline constexpr uint8_t in_order[16] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
 
 // The part of a step in block j of vector v. Returns whether its pairs lie in the row as they are.
-template <int C, int Scale, int W>
-[[gnu::always_inline]] inline bool plan_block(const resize_strip &s, step_plan<W> &p, int v, int j,
-                                              int32_t lane) {
-    const eight_lanes<C> l(s, lane);
-    const int32_t limit = s.row_bytes > 16 ? s.row_bytes - 16 : 0;
-    l.put_weights(p.weight[v] + 16 * j, Scale);
+template <int W>
+[[gnu::always_inline]] inline bool plan_block(const eight_lanes &l, int32_t limit, bool shared,
+                                              step_plan<W> &p, int v, int j) {
     plan_pairs moved = {};
     for (int w = 0; w < W; w++) {
         const int32_t from = l.first + 16 * w;
-        const int32_t base = s.shared && v ? p.at[0][0][j] : from < limit ? from : limit;
+        const int32_t base = shared && v ? p.at[0][0][j] : from < limit ? from : limit;
         p.at[v][w][j] = base;
         for (int h = 0; h < plan_parts; h++) {
-            plan_vector low = l.p[h] - base, high = l.q[h] - base;
+            plan_vector low = l.p[h] - base, high = low + l.apart[h];
             if constexpr (W > 1) {
                 const plan_vector in_low = ((l.p[h] - from) & ~15) == 0;
-                const plan_vector in_high = ((l.q[h] - from) & ~15) == 0;
+                const plan_vector in_high = ((l.p[h] + l.apart[h] - from) & ~15) == 0;
                 low = (low & in_low) | (0x80 & ~in_low);
                 high = (high & in_high) | (0x80 & ~in_high);
             }
@@ -183,16 +215,23 @@ template <int C, int Scale, int W>
 // A run of steps whose pairs lie in the row as they are, and end to end, is noted down: these need
 // no windows. Where nothing is kept, they are done in the order of the lanes, and so are their
 // weights.
-template <int C, int Scale, int W>
-static void plan_windows(resize_strip &s) {
+template <int W>
+static void plan_windows(resize_strip &s, plan_kind kind) {
     step_plan<W> *const plan = reinterpret_cast<step_plan<W> *>(s.plan);
+    const int32_t limit = s.row_bytes > 16 ? s.row_bytes - 16 : 0;
+    const bool shared = s.shared;
+    lanes_in_turn lanes(s, kind.bytes_of);
     s.direct_from = s.direct_to = 0;
     for (int32_t t = 0; t < s.steps; t++) {
         step_plan<W> &p = plan[t];
         bool direct = W == 1;
-        for (int j = 0; j < blocks; j++)
-            for (int v = 0; v < 2; v++)
-                direct &= plan_block<C, Scale>(s, p, v, j, begin_of_step(s, t) + 16 * j + 8 * v);
+        lanes.begin(begin_of_step(s, t));
+#pragma GCC unroll 1
+        for (int k = 0; k < 2 * blocks; k++) {
+            const eight_lanes l = lanes.next();
+            l.put_weights(p.weight[k & 1] + 8 * (k & ~1), kind.scale);
+            direct &= plan_block(l, limit, shared, p, k & 1, k / 2);
+        }
         for (int j = 0; direct && j < blocks; j++)
             for (int v = 0; v < 2; v++) direct = p.at[v][0][j] == p.at[0][0][0] + 32 * j + 16 * v;
         if (!direct) continue;
@@ -207,42 +246,47 @@ static void plan_windows(resize_strip &s) {
     }
 }
 
-template <int C, int Scale>
-static void plan_far(resize_strip &s) {
+static void plan_far(resize_strip &s, plan_kind kind) {
     far_plan *const plan = reinterpret_cast<far_plan *>(s.plan);
+    lanes_in_turn lanes(s, kind.bytes_of);
     s.direct_from = s.direct_to = 0;
-    for (int32_t t = 0; t < s.steps; t++)
-        for (int v = 0; v < 2; v++)
-            for (int j = 0; j < blocks; j++) {
-                const eight_lanes<C> l(s, begin_of_step(s, t) + 16 * j + 8 * v);
-                l.put_weights(plan[t].weight[v] + 16 * j, Scale);
-                int32_t *const at = plan[t].at + v * bytes + 16 * j;
-                int32_t p[8], q[8];
-                memcpy(p, l.p, sizeof p);
-                memcpy(q, l.q, sizeof q);
-                for (int i = 0; i < 8; i++) {
-                    at[2 * i] = p[i];
-                    at[2 * i + 1] = q[i];
-                }
+    for (int32_t t = 0; t < s.steps; t++) {
+        lanes.begin(begin_of_step(s, t));
+#pragma GCC unroll 1
+        for (int k = 0; k < 2 * blocks; k++) {
+            const int v = k & 1, j = k / 2;
+            const eight_lanes l = lanes.next();
+            l.put_weights(plan[t].weight[v] + 16 * j, kind.scale);
+            int32_t *const at = plan[t].at + v * bytes + 16 * j;
+            int32_t p[8], apart[8];
+            memcpy(p, l.p, sizeof p);
+            memcpy(apart, l.apart, sizeof apart);
+            for (int i = 0; i < 8; i++) {
+                at[2 * i] = p[i];
+                at[2 * i + 1] = p[i] + apart[i];
             }
+        }
+    }
 }
 
-// Weights are multiplied by Scale.
-template <int C, int Scale>
-static void make_plan(resize_strip &s) {
-    s.lanes = s.columns * C;
+[[gnu::noinline]] static void make_plan_of(resize_strip &s, plan_kind kind) {
+    s.lanes = s.columns * kind.bytes_of;
     s.steps = (s.lanes + bytes - 1) / bytes;
     s.last = s.lanes < bytes ? 0 : s.lanes - bytes;
     switch (s.windows) {
         case 1:
-            return plan_windows<C, Scale, 1>(s);
+            return plan_windows<1>(s, kind);
         case 2:
-            return plan_windows<C, Scale, 2>(s);
+            return plan_windows<2>(s, kind);
         case 4:
-            return plan_windows<C, Scale, 4>(s);
+            return plan_windows<4>(s, kind);
         default:
-            return plan_far<C, Scale>(s);
+            return plan_far(s, kind);
     }
+}
+template <int C, int Scale>
+static void make_plan(resize_strip &s) {
+    make_plan_of(s, {C, Scale});
 }
 
 }  // namespace simgp::SIMD_TARGET
