@@ -39,7 +39,6 @@ void draw(SDL_Surface *to, picture &p, int x, int y) {
 }  // namespace
 
 window::window(const std::string &title, int width, int height, bool fixed) {
-    SDL_SetMainReady();
     // A screen saver may come; desktop effects may stay.
     SDL_SetHint(SDL_HINT_VIDEO_X11_NET_WM_BYPASS_COMPOSITOR, "0");
     if (SDL_Init(SDL_INIT_VIDEO) != 0) fail("no screen");
@@ -67,7 +66,7 @@ int window::width() const { return surface_of(window_)->w; }
 int window::height() const { return surface_of(window_)->h; }
 
 const pixel_format &window::natural_format() const {
-    const bool is_rgb565 = surface_of(window_)->format->format == SDL_PIXELFORMAT_RGB565;
+    const bool is_rgb565 = SDL_GetWindowPixelFormat(window_) == SDL_PIXELFORMAT_RGB565;
     return format_coded(is_rgb565 ? SIMGP_FMT_RGB565 : SIMGP_FMT_BGRA8888);
 }
 
