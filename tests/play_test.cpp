@@ -367,7 +367,11 @@ TEST_F(play_test, arrows_lead_to_key_frames) {
          "-c:v libx264 -pix_fmt yuv420p -g 20 -keyint_min 20 -bf 0 -sc_threshold 0",
          {0, 20, 40}},
         {"clip.avi", "-c:v mpeg4 -g 20 -bf 0 -sc_threshold 1000000000", {0, 20, 40}},
+        // I-pictures at 19, 37 and 55 in the stream; two B-pictures behind each are shown before it.
+        {"clip.mp4", "-c:v mpeg4 -g 20 -bf 2 -sc_threshold 1000000000", {0, 21, 39, 57}},
         {"clip.wmv", "-c:v wmv2 -g 20 -sc_threshold 1000000000", {0, 20, 40}},
+        // A codec that is the container's business.
+        {"clip.mkv", "-c:v mpeg2video -g 20 -bf 0 -sc_threshold 1000000000", {0, 20, 40}},
         // The container marks the I-pictures of open groups, but none of them is an IDR picture.
         {"open.mp4",
          "-c:v libx264 -pix_fmt yuv420p -x264-params open-gop=1:keyint=20:scenecut=0 -bf 2",
@@ -418,6 +422,13 @@ TEST_F(play_test, the_picture_takes_the_size_of_the_window) {
                   size);
         expect_same(on_screen(), s.p, "screen");
     }
+}
+
+TEST_F(play_test, pixels_that_are_not_square_give_the_window_its_width) {
+    encode("clip.mp4", "-vf setsar=2 -c:v libx264 -pix_fmt yuv420p");
+    play("clip.mp4");
+    expect_same(shoot().p, converted("clip.y4m", "--resize 320x120"), "upright");
+    expect_in(shoot_after("r").p, converted("clip.y4m", "--resize 45x120 --rotate 90r"), "turned");
 }
 
 TEST_F(play_test, ends_by_itself_after_its_frames) {

@@ -108,8 +108,9 @@ class decoded_film : public film {
             }
             // Packets carry their numbers where FFmpeg expects times.
             if (frame_->pts != AV_NOPTS_VALUE) shown_ = size_t(frame_->pts);
-            // Pictures that refer to what was before the place where decoding has begun.
-            if (has_times() && position(shown_) < position(begun_) - frame_time_ / 2) continue;
+            // Pictures that refer to what was before the key frame that was sought.
+            if (begun_ > 0 && has_times() && position(shown_) < position(begun_) - frame_time_ / 2)
+                continue;
             to.place = position(shown_);
             to.time = has_times() ? position(shown_)
                                   : (double(begun_) + double(delivered_)) * frame_time_;
@@ -322,7 +323,7 @@ class decoded_film : public film {
     // Finds the packet by its time; it is the first one ahead then.
     bool jump(size_t number_wanted) {
         const packet wanted = packets_[number_wanted];
-        if (wanted.dts == AV_NOPTS_VALUE || !has_times()) return false;
+        if (wanted.dts == AV_NOPTS_VALUE) return false;
         if (av_seek_frame(file_, track_, wanted.dts, AVSEEK_FLAG_BACKWARD) < 0) return false;
         av_bsf_flush(filter_);
         while (AVPacket *p = receive()) {
@@ -356,10 +357,13 @@ class decoded_film : public film {
                 break;
             case AVCOL_SPC_UNSPECIFIED:
             case AVCOL_SPC_RESERVED:
+            case AVCOL_SPC_RGB:  // said of grey pictures
                 break;
-            default:
-                fail("no matrix for YUV in ", av_color_space_name(f.colorspace),
+            default: {
+                const char *given = av_color_space_name(f.colorspace);
+                fail("no matrix for YUV in ", given ? given : "an unknown colour space",
                      "; there are bt601, bt709 and bt2020");
+            }
         }
         const bool jpeg = f.format == AV_PIX_FMT_YUVJ420P || f.format == AV_PIX_FMT_YUVJ422P ||
                           f.format == AV_PIX_FMT_YUVJ440P || f.format == AV_PIX_FMT_YUVJ444P;
@@ -411,9 +415,10 @@ class card_film : public film {
     explicit card_film(const std::string &spec) {
         name_ = spec;
         keys_ = "none";
+        card_ = open_source({.path = spec});
         // As long as anybody may look at it.
         const bool counted = spec.find('@') != std::string::npos;
-        card_ = open_source({.path = counted ? spec : spec + "@1000000000"});
+        if (!counted) card_ = open_source({.path = spec + "@1000000000"});
     }
     bool next(film_frame &to) override {
         if (!card_->next(to.image)) return false;
