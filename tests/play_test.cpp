@@ -424,6 +424,18 @@ TEST_F(play_test, the_picture_takes_the_size_of_the_window) {
     }
 }
 
+// FFmpeg itself turns them when it converts.
+TEST_F(play_test, films_that_were_taken_upright_stand_upright) {
+    encode("lying.mp4", "-c:v libx264 -pix_fmt yuv420p");
+    shell(
+        "ffmpeg -v error -i lying.mp4 -c copy -metadata:s:v rotate=90 upright.mp4"
+        "; ffmpeg -v error -i upright.mp4 -frames:v 1 -f yuv4mpegpipe upright.y4m");
+    play("upright.mp4");
+    const picture upright = converted("upright.y4m", "");
+    ASSERT_EQ(upright.height(), 160);
+    expect_same(shoot().p, upright, "as it was taken");
+}
+
 TEST_F(play_test, pixels_that_are_not_square_give_the_window_its_width) {
     encode("clip.mp4", "-vf setsar=2 -c:v libx264 -pix_fmt yuv420p");
     play("clip.mp4");

@@ -21,6 +21,7 @@ extern "C" {
 #include <libavcodec/avcodec.h>
 #include <libavcodec/bsf.h>
 #include <libavformat/avformat.h>
+#include <libavutil/display.h>
 #include <libavutil/pixdesc.h>
 }
 
@@ -62,6 +63,9 @@ constexpr struct {
     {AV_PIX_FMT_BGRA, SIMGP_FMT_BGRA8888},   {AV_PIX_FMT_ARGB, SIMGP_FMT_ARGB8888},
     {AV_PIX_FMT_RGB0, SIMGP_FMT_RGBA8888},   {AV_PIX_FMT_BGR0, SIMGP_FMT_BGRA8888},
     {AV_PIX_FMT_0RGB, SIMGP_FMT_ARGB8888}};
+
+// Bytes of packets that are kept, at most, in search of the next key frame.
+constexpr int64_t most_ahead = 256 << 20;
 
 class decoded_film : public film {
   public:
@@ -115,6 +119,7 @@ class decoded_film : public film {
             to.time = has_times() ? position(shown_)
                                   : (double(begun_) + double(delivered_)) * frame_time_;
             take(*frame_, to);
+            if (!any_) read_turn(*frame_);
             ++delivered_;
             any_ = true;
             return true;
@@ -138,8 +143,11 @@ class decoded_film : public film {
         }
         if (!forward) return false;
         // Behind all that has been read so far.
-        while (AVPacket *p = read()) {
+        for (int64_t bytes = 0; bytes < most_ahead;) {
+            AVPacket *p = read();
+            if (!p) break;
             ahead_.push_back(p);
+            bytes += p->size;
             const size_t number = size_t(p->pts);
             if (!packets_[number].key || position(number) <= here + near) continue;
             while (ahead_.front() != p) drop_first_ahead();
@@ -172,6 +180,10 @@ class decoded_film : public film {
         // The name is that of a file, whatever colons it has.
         int result = avformat_open_input(&file_, ("file:" + name_).c_str(), nullptr, nullptr);
         if (result < 0) fail(words(result));
+#if LIBAVFORMAT_VERSION_INT < AV_VERSION_INT(60, 16, 100)
+        // What is known of the whole film comes with its first frame. Newer ones do so by themselves.
+        av_format_inject_global_side_data(file_);
+#endif
         check(avformat_find_stream_info(file_, nullptr), "cannot be read");
         track_ = av_find_best_stream(file_, AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
         if (track_ < 0) fail("holds no video");
@@ -372,6 +384,16 @@ class decoded_film : public film {
         else if (f.color_range == AVCOL_RANGE_MPEG)
             note.range = "limited";
         return note;
+    }
+
+    // Cameras that are held upright film on their side, and say so.
+    void read_turn(const AVFrame &first) {
+        const AVFrameSideData *matrix = av_frame_get_side_data(&first, AV_FRAME_DATA_DISPLAYMATRIX);
+        if (!matrix || matrix->size < 9 * sizeof(int32_t)) return;
+        int32_t values[9];
+        memcpy(values, matrix->data, sizeof values);
+        const double left = av_display_rotation_get(values);  // degrees, to the left
+        if (!std::isnan(left)) quarters_ = int(std::lround(-left / 90) + 4) % 4;
     }
 
     // Copies a decoded frame: the decoder still refers to its own.

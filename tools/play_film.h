@@ -34,10 +34,13 @@ class film {
     double frame_time() const { return frame_time_; }
     // Width of a pixel over its height.
     double pixel_aspect() const { return pixel_aspect_; }
+    // Quarter turns to the right that make the film upright; known with the first frame.
+    int quarters() const { return quarters_; }
 
   protected:
     std::string name_, keys_;
     double frame_time_ = 1. / 25, pixel_aspect_ = 1;
+    int quarters_ = 0;
 };
 
 // "testcard:[WxH][@FRAMES]", which goes on for ever without a number, or anything that FFmpeg opens.

@@ -55,6 +55,7 @@ class player {
     explicit player(const play_options &options)
         : options_(options), film_(open_film(options.path)), look_(options.first) {
         if (!film_->next(frame_)) throw fault(film_->name(), ": holds no frame");
+        look_.quarters = (look_.quarters + film_->quarters()) % 4;
         int width = 0, height = 0;
         if (options.size.empty()) {
             // As high as the film has lines, or, lying on its side, as wide.
@@ -79,17 +80,17 @@ class player {
         while (!quit_ && !is_done()) {
             if (is_moving() && !has_coming_) fetch();
             const bool moving = is_moving() && has_coming_;
-            const double left = std::chrono::duration<double>(due() - clock::now()).count();
+            const double left =
+                moving ? std::chrono::duration<double>(due() - clock::now()).count() : .5;
             char key = 0;
-            const window::event event = window_->wait(stale_ ? 0 : moving ? left : .5, key);
+            const window::event event = window_->wait(stale_ ? 0 : left, key);
             if (event != window::event::none) handle(event, key);
             // Of many events the picture is drawn once; but they may not stop a film.
-            if (event == window::event::none || left < -most_late) {
-                if (is_moving() && has_coming_ && clock::now() >= due())
-                    step_on();
-                else if (stale_)
-                    draw();
-            }
+            if (event != window::event::none && left > -most_late) continue;
+            if (is_moving() && has_coming_ && clock::now() >= due())
+                step_on();
+            else if (stale_)
+                draw();
         }
         if (options_.screenshot_at_end && !quit_) save();
     }
@@ -111,10 +112,9 @@ class player {
 
     // When the frame that comes is to be seen.
     clock::time_point due() const {
-        const double after =
-            std::min(coming_.time - begun_at_, longest_wait + frame_.time - begun_at_);
-        return begun_ +
-               std::chrono::duration_cast<clock::duration>(std::chrono::duration<double>(after));
+        const double time = std::min(coming_.time, frame_.time + longest_wait);
+        return begun_ + std::chrono::duration_cast<clock::duration>(
+                            std::chrono::duration<double>(time - begun_at_));
     }
     void begin_clock() {
         begun_ = clock::now();
@@ -133,14 +133,12 @@ class player {
         if (!has_coming_) fetch();
         if (!has_coming_) return;
         const bool late = clock::now() - due() > std::chrono::duration<double>(most_late);
-        const bool waits =
-            due() < begun_ + std::chrono::duration_cast<clock::duration>(
-                                 std::chrono::duration<double>(coming_.time - begun_at_));
+        const bool leaps = coming_.time > frame_.time + longest_wait;
         std::swap(frame_, coming_);
         has_coming_ = false;
         ++frames_;
         draw();
-        if (late || waits) begin_clock();
+        if (late || leaps) begin_clock();
     }
 
     // The chain for the frame, the window and the look of now.
