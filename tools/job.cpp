@@ -184,21 +184,12 @@ void run(const job &wish) {
     auto shape = [&] { return stages.empty() ? in->shape() : stages.back()->out(); };
     const colour &c = colour_of_frames(j, *in);
     const int32_t code = c.code | (j.chroma_mean ? int32_t{SIMGP_CHROMA_MEAN} : 0);
-    const auto add = [&](const pixel_format &to, bool dither, const edits &edit, int32_t of) {
-        auto r = std::make_unique<road>(shape(), to, dither, edit, of);
+    const pixel_format &to = target(j, shape(), kind, code);
+    for (auto &r : roads(shape(), to, j.dither, j.edit, code)) {
         if (!j.quiet && !j.verbose && !r->loss().empty())
             fprintf(stderr, "simgp-convert: note: %s passes through %s\n", r->text().c_str(),
                     r->loss().c_str());
         stages.push_back(std::move(r));
-    };
-    const pixel_format &to = target(j, shape(), kind, code);
-    // Dithered conversions to RGB are in BT.601: other colours become RGB first, and then that.
-    if (j.dither && to.is_rgb() && c.code != SIMGP_COLOUR_BT601) {
-        const bool is_rgb = in->shape().format->is_rgb();
-        if (!is_rgb) add(format_coded(SIMGP_FMT_RGB888), false, j.edit, code);
-        add(to, true, is_rgb ? j.edit : edits{}, SIMGP_COLOUR_BT601);
-    } else {
-        add(to, j.dither, j.edit, code);
     }
 
     if (j.verbose) {

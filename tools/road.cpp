@@ -277,4 +277,21 @@ std::string road::loss() const {
     return kept == 0 ? "luma alone" : kept == 1 ? "4:2:0 chroma" : "4:2:2 chroma";
 }
 
+std::vector<std::unique_ptr<road>> roads(const picture_shape &from, const pixel_format &to,
+                                         bool dither, const edits &wish, int32_t colour) {
+    std::vector<std::unique_ptr<road>> all;
+    const bool in_bt601 = (colour & ~SIMGP_CHROMA_MEAN) == SIMGP_COLOUR_BT601;
+    if (!dither || !to.is_rgb() || in_bt601) {
+        all.push_back(std::make_unique<road>(from, to, dither, wish, colour));
+        return all;
+    }
+    const bool is_rgb = from.format->is_rgb();
+    if (!is_rgb)
+        all.push_back(
+            std::make_unique<road>(from, format_coded(SIMGP_FMT_RGB888), false, wish, colour));
+    all.push_back(std::make_unique<road>(is_rgb ? from : all.back()->out(), to, true,
+                                         is_rgb ? wish : edits{}, SIMGP_COLOUR_BT601));
+    return all;
+}
+
 }  // namespace tools

@@ -2,6 +2,7 @@
 #ifndef TOOLS_ROAD_H
 #define TOOLS_ROAD_H
 
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -40,12 +41,19 @@ class road : public stage {
     std::string loss() const;
     // Comparable between roads: fewer and gentler steps cost less.
     int cost() const { return cost_; }
+    // For callers that take the steps of run() one by one.
+    std::vector<step> &steps() { return steps_; }
 
   private:
     picture_shape from_;
     std::vector<step> steps_;
     int cost_ = 0;
 };
+
+// The roads to `to`, one after the other, where dithering is wanted in any colour: a dithered
+// conversion to RGB is one of BT.601, so other colours become RGB first, and then that.
+std::vector<std::unique_ptr<road>> roads(const picture_shape &from, const pixel_format &to,
+                                         bool dither, const edits &wish, int32_t colour);
 
 }  // namespace tools
 
