@@ -2,10 +2,9 @@
 // The bytes end at an inaccessible page.
 #include <string.h>
 
-#include "rows/choose.h"
 #include "scmn/keyframe.h"
-#include "tests/guard.h"
 #include "tests/keyframe_rule.h"
+#include "tests/rig.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
     if (size == 0) return 0;
@@ -13,9 +12,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
     const rig::guarded picture(--size);
     if (size > 0) memcpy(picture.data(), data + 1, size);
     const int expected = keyframe_rule::of(type, picture.data(), int64_t(size));
-    for (int t = 0; t < int(simgp::target::count); t++) {
-        if (!simgp::target_available(simgp::target(t))) continue;
-        simgp::force_rows(&simgp::rows_of(simgp::target(t)));
+    for (const rig::target_rows &t : rig::all_targets()) {
+        const rig::forced rows(t);
         if (scmn_is_vkeyfrm(type, picture.data(), int32_t(size)) != expected) abort();
     }
     return 0;

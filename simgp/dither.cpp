@@ -124,6 +124,7 @@ void luma_to_rgb(const csc_args &a, Luma &&luma) {
 // picture of their own, without dithering; so is what has less than 4 rows.
 template <const format &From, const format &To>
 void dither_and_convert(const csc_args &a) {
+    if (a.src_widths[0] < 1) return;  // there are no last rows to point to
     if constexpr (From.u < 0) return luma_to_rgb<From, To>(a, dithered_luma(a, a.src_heights[0]));
 
     constexpr int32_t tail = 4;

@@ -47,8 +47,10 @@ template <sample_kind S>
 void turn_right(const plane_args &a) {
     turn_right<S>(a.src, a.width, a.height, a.dst);
 }
+// Of an empty plane there is no last line to point to.
 template <sample_kind S>
 void half_turn(const plane_args &a) {
+    if (a.width < 1) return;
     mirror<S>(a.src, a.width, a.height, a.dst.upside_down(a.height));
 }
 template <sample_kind S>
@@ -57,6 +59,7 @@ void mirror_across(const plane_args &a) {
 }
 template <sample_kind S>
 void mirror_down(const plane_args &a) {
+    if (a.width < 1) return;
     copy_lines(a.src, a.dst.upside_down(a.height), a.width * sample_size<S>, a.height);
 }
 

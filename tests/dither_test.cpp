@@ -110,6 +110,22 @@ TEST(dither, no_rows_no_write) {
     for (int width : {0, -1}) simgp_dit_8b(&sample, width, 8, 8, 8, nullptr);
 }
 
+// Pointers that lead nowhere are not even added up: a sanitizer would tell.
+TEST(dither, of_pictures_without_columns_nothing_is_looked_at) {
+    for (simgp_csc_fn *const kernel :
+         {simgp_csc_yuv400_to_rgb565_dither, simgp_csc_yuv420_to_rgb565_dither,
+          simgp_csc_yuv422n_to_bgr565_dither, simgp_csc_yuv444_to_rgb565_dither})
+        for (int32_t width : {0, -1, INT32_MIN}) {
+            uint8_t memory[8] = {};
+            uint8_t *const planes[4] = {memory, memory, memory, memory};
+            const int32_t widths[4] = {width, width, width, width};
+            const int32_t heights[4] = {INT32_MAX, 0, 0, 0};
+            const int32_t strides[4] = {INT32_MIN, INT32_MIN, INT32_MIN, INT32_MIN};
+            kernel(planes, widths, heights, strides, strides, planes);
+            for (uint8_t byte : memory) EXPECT_EQ(byte, 0);
+        }
+}
+
 // Wrappers ------------------------------------------------------------------------------------
 
 struct wrapper {

@@ -9,6 +9,7 @@
 
 #include "scmn/scmn.h"
 #include "simgp/resize.h"
+#include "tests/irsz_kinds.h"
 #include "tests/rig.h"
 
 // Memory
@@ -66,23 +67,8 @@ namespace {
 // The reference
 // -----------------------------------------------------------------------------------------
 
-struct kind {
-    const char *name;
-    int32_t format;
-    int src_bytes, dst_bytes;
-    int unit;  // bytes that a length counts in
-    scmn_irsz_fn *entry;
-    scmn_irsz_line_fn *line;
-    scmn_irsz_full_fn *full;
-};
-const kind kinds[] = {
-    {"8b", 20, 1, 1, 1, scmn_irsz8b, scmn_irsz8b_line, scmn_irsz8b_full},
-    {"8b8b8b", 21, 3, 3, 1, scmn_irsz8b8b8b, scmn_irsz8b8b8b_line, scmn_irsz8b8b8b_full},
-    {"8b8b8b_5b6b5b", 23, 3, 2, 1, scmn_irsz8b8b8b_5b6b5b, scmn_irsz8b8b8b_5b6b5b_line,
-     scmn_irsz8b8b8b_5b6b5b_full},
-    {"5b6b5b", 25, 2, 2, 2, scmn_irsz5b6b5b, scmn_irsz5b6b5b_line, scmn_irsz5b6b5b_full},
-    {"8b8b8b8b", 29, 4, 4, 1, scmn_irsz8b8b8b8b, scmn_irsz8b8b8b8b_line, scmn_irsz8b8b8b8b_full},
-};
+using rig::irsz_kinds;
+using kind = rig::irsz_kind;
 
 // n positions over an extent of N samples.
 struct axis {
@@ -171,7 +157,7 @@ rig::job job_of(const kind &k, const rig::size &from, const rig::size &to,
 }
 
 TEST(irsz, kernels_of_whole_pictures) {
-    for (const kind &k : kinds)
+    for (const kind &k : irsz_kinds)
         ASSERT_TRUE(
             rig::check_resize_jobs(k.name, {}, [&](const rig::size &from, const rig::size &to) {
                 const axis x(from.width, to.width), y(from.height, to.height);
@@ -185,7 +171,7 @@ TEST(irsz, kernels_of_whole_pictures) {
 TEST(irsz, kernels_of_rows) {
     // Any copy of the weights will do.
     static const std::vector<uint8_t> weights(tbl_rsz_weight, tbl_rsz_weight + 256);
-    for (const kind &k : kinds)
+    for (const kind &k : irsz_kinds)
         ASSERT_TRUE(
             rig::check_resize_jobs(k.name, {}, [&](const rig::size &from, const rig::size &to) {
                 const axis x(from.width, to.width), y(from.height, to.height);
@@ -202,7 +188,7 @@ TEST(irsz, kernels_of_rows) {
 }
 
 TEST(irsz, objects_for_whole_pictures) {
-    for (const kind &k : kinds)
+    for (const kind &k : irsz_kinds)
         ASSERT_TRUE(
             rig::check_resize_jobs(k.name, {}, [&](const rig::size &from, const rig::size &to) {
                 return job_of(k, from, to, [=, &k](const rig::picture &s, const rig::picture &d) {
@@ -223,7 +209,7 @@ TEST(irsz, objects_for_whole_pictures) {
 TEST(irsz, kernels_of_nothing) {
     const uint8_t *const none = nullptr;
     const void *const lines[] = {none, none};
-    for (const kind &k : kinds)
+    for (const kind &k : irsz_kinds)
         for (int size : {0, -1, INT32_MIN}) {
             k.full(none, 1, size, 1, 1, nullptr, 1 << 21, 1 << 21);
             k.full(none, 1, 1, size, 1, nullptr, 1 << 21, 1 << 21);
@@ -261,16 +247,16 @@ TEST(irsz, small_results) {
     };
     using bytes = std::vector<uint8_t>;
     // Eighths of the way from 0 to 255, truncated.
-    EXPECT_EQ(resize(kinds[0], {0, 255}, {2, 1}, {8, 1}),
+    EXPECT_EQ(resize(irsz_kinds[0], {0, 255}, {2, 1}, {8, 1}),
               (bytes{0, 31, 63, 95, 127, 159, 191, 223}));
     // White and red as words; halfway between them 127 of 255 are left of green and blue.
-    EXPECT_EQ(resize(kinds[2], {255, 255, 255, 255, 0, 0}, {2, 1}, {2, 1}),
+    EXPECT_EQ(resize(irsz_kinds[2], {255, 255, 255, 255, 0, 0}, {2, 1}, {2, 1}),
               (bytes{0xFF, 0xFF, 0xEF, 0xFB}));
     // Halfway between red and blue: 15 of 31 parts of each, nothing carried over.
-    EXPECT_EQ(resize(kinds[3], {0x00, 0xF8, 0x1F, 0x00}, {2, 1}, {2, 1}),
+    EXPECT_EQ(resize(irsz_kinds[3], {0x00, 0xF8, 0x1F, 0x00}, {2, 1}, {2, 1}),
               (bytes{0x00, 0xF8, 0x0F, 0x78}));
     // Positions 0 and 2 of lines of 5 and of columns of 1.
-    EXPECT_EQ(resize(kinds[0], {1, 2, 3, 4, 5}, {1, 5}, {1, 2}), (bytes{1, 3}));
+    EXPECT_EQ(resize(irsz_kinds[0], {1, 2, 3, 4, 5}, {1, 5}, {1, 2}), (bytes{1, 3}));
 }
 
 // Bands
@@ -405,13 +391,13 @@ TEST(irsz, bands_of_any_size) {
             const auto [from_w, to_w] = lengths(i % 8 ? 90 : 300, random);
             const auto [from_h, to_h] = lengths(60, random);
             const int bands[] = {1, 2, 3, 5, 16, from_h};
-            for (const kind &k : kinds) {
+            for (const kind &k : irsz_kinds) {
                 check_bands(k, {{from_w, from_h}, {to_w, to_h}, bands[random.below(6)]}, random);
                 if (testing::Test::HasFatalFailure()) return;
             }
         }
         // Long lines.
-        for (const kind &k : kinds) {
+        for (const kind &k : irsz_kinds) {
             check_bands(k, {{1999, 7}, {4003, 12}, 2}, random);
             check_bands(k, {{4003, 40}, {1921, 13}, 9}, random);
             if (testing::Test::HasFatalFailure()) return;
@@ -422,7 +408,7 @@ TEST(irsz, bands_of_any_size) {
 // Bands far shorter than the way from a tap to the one below.
 TEST(irsz, strong_reductions_in_short_bands) {
     rig::rng random(rig::seed());
-    for (const kind &k : kinds)
+    for (const kind &k : irsz_kinds)
         for (int longest : {1, 2, 16})
             for (int to : {10, 62, 200, 333, 1000, 2001}) {
                 check_bands(k, {{9, 1000}, {5, to}, longest}, random);
@@ -455,7 +441,7 @@ TEST(irsz, two_resizers_at_once) {
 
 TEST(irsz, creation) {
     uint8_t pixel[4];
-    for (const kind &k : kinds)
+    for (const kind &k : irsz_kinds)
         for (int mode : {SCMN_IRSZ_FULL, SCMN_IRSZ_LINE}) {
             const scmn_irsz_param param{k.format, mode, 640, 100, 700, 16, 160, 201, 164, pixel};
             scmn_irsz_ctx *r;
@@ -592,7 +578,7 @@ TEST(irsz, refusals) {
 // Beyond the sweep: extents at the limit of the positions.
 TEST(irsz, the_largest_extents) {
     rig::rng random(rig::seed());
-    for (const kind &k : kinds) {
+    for (const kind &k : irsz_kinds) {
         check_bands(k, {{8192, 3}, {8191, 2}, 1}, random);
         check_bands(k, {{131072, 2}, {4000, 1}, 2}, random);
         check_bands(k, {{2, 131072}, {1, 4000}, 500}, random);

@@ -41,10 +41,17 @@ uint64_t number_from(const char *variable, uint64_t otherwise) {
 // What the drivers run now, for a program that ends at an inaccessible page.
 char running[512] = "";
 
-void report_fault(int number) {
+void say_what_runs() {
     const char *text[] = {"\nfault in: ", *running ? running : "no driver of the rig", "\n"};
     for (const char *t : text)
         if (write(STDERR_FILENO, t, strlen(t)) < 0) break;
+}
+
+#ifdef RIG_ASAN
+void watch_faults() {}  // AddressSanitizer does, see the end of this file
+#else
+void report_fault(int number) {
+    say_what_runs();
     signal(number, SIG_DFL);  // the instruction is tried again and ends the program
 }
 
@@ -58,6 +65,7 @@ void watch_faults() {
     }();
     (void)watching;
 }
+#endif
 
 constexpr size_t reach = 128;  // bytes that are watched on either side of a destination
 
@@ -80,11 +88,11 @@ bool quick() {
 void fill_bytes(uint8_t *p, size_t size, content what, rng &random) {
     static constexpr uint8_t corners[] = {0,   1,   15,  16,  17,  100, 127, 128,
                                           129, 156, 200, 235, 236, 240, 254, 255};
+    const bool by_chance = what == content::random || what == content::extremes ||
+                           what == content::corners || what == content::smooth;
+    uint8_t last = what == content::smooth ? uint8_t(random.next() >> 56) : 0;
     for (size_t i = 0; i < size; i++) {
-        const uint64_t r =
-            what == content::random || what == content::extremes || what == content::corners
-                ? random.next() >> 56
-                : 0;
+        const uint64_t r = by_chance ? random.next() >> 56 : 0;
         switch (what) {
             case content::random:
                 p[i] = uint8_t(r);
@@ -100,6 +108,9 @@ void fill_bytes(uint8_t *p, size_t size, content what, rng &random) {
                 break;
             case content::ones:
                 p[i] = 255;
+                break;
+            case content::smooth:
+                p[i] = last = uint8_t(std::clamp(last + int(r % 9) - 4, 0, 255));
                 break;
             default:
                 p[i] = 0;
@@ -297,6 +308,7 @@ picture::picture(const std::vector<plane_shape> &shapes, const std::vector<place
         widths[k] = there ? shapes[k].width : INT32_MIN;
         heights[k] = there ? shapes[k].height : INT32_MAX;
         strides[k] = there ? int32_t(parts[k].stride()) : INT32_MIN;
+        if (there && shapes[k].rounded) strides[k] += places[k].excess % shapes[k].stride_unit;
     }
 }
 
@@ -391,19 +403,19 @@ std::string text_of(const size &s) {
     return std::to_string(s.width) + " x " + std::to_string(s.height);
 }
 
-// `what_runs`: the operation and its sizes.
-bool check_job(const std::string &what_runs, flush where, const job &j, rng &random) {
-    const auto places = [&](size_t count) {
-        std::vector<placement> p(count);
-        for (placement &place : p) place = any_placement(where, random);
-        return p;
-    };
-    const auto dst_places = places(j.dst.size());
-    picture src(j.src, places(j.src.size())), expected(j.dst, dst_places), got(j.dst, dst_places);
-    const content what = content(random.below(int(content::count) + 2) % int(content::count));
-    src.fill(what, random);
+std::string complaint;
+
+}  // namespace
+
+void complain(const std::string &fault) { complaint = fault; }
+
+std::string fault_of(const std::string &what_runs, const job &j, const setting &how) {
+    watch_faults();
+    picture src(j.src, how.src), expected(j.dst, how.dst), got(j.dst, how.dst);
+    how.fill(src);
+    if (j.season) j.season(src);
     picture input(j.in_place ? j.dst : std::vector<plane_shape>());
-    input.fill(what, random);
+    how.fill(input);
     std::vector<std::vector<uint8_t>> before;
     for (const plane &p : src.parts)
         for (ptrdiff_t y = 0; y < p.shape().rows; y++)
@@ -414,23 +426,20 @@ bool check_job(const std::string &what_runs, flush where, const job &j, rng &ran
         dst.fill_pattern(salt);
         for (size_t k = 0; k < input.parts.size(); k++) dst.parts[k].copy_visible(input.parts[k]);
     };
-    const unsigned salt = unsigned(random.next());
     const bool by_reference = bool(j.reference);
     if (by_reference) {
-        prepare(expected, salt);
+        prepare(expected, how.salt);
         j.reference(src, expected);
     }
     for (const target_rows &t : all_targets()) {
         const bool defines = &t == &all_targets()[0] && !by_reference;
         picture &dst = defines ? expected : got;
-        snprintf(running, sizeof running,
-                 "%s, %s rows, planes flush at their %s, content %d, strides %s -> %s, "
-                 "SIMGP_TEST_SEED=%llu",
-                 what_runs.c_str(), t.name, where == flush::at_end ? "end" : "start", int(what),
-                 describe(src).c_str(), describe(dst).c_str(), (unsigned long long)seed());
-        prepare(dst, defines || j.holes ? salt : ~salt);
+        snprintf(running, sizeof running, "%s, %s rows, %s, strides %s -> %s", what_runs.c_str(),
+                 t.name, how.words.c_str(), describe(src).c_str(), describe(dst).c_str());
+        prepare(dst, defines || j.holes ? how.salt : ~how.salt);
         for (plane &p : src.parts) p.forbid_padding();
         for (size_t k = 0; k < input.parts.size(); k++) dst.parts[k].forbid_padding();
+        complaint.clear();
         {
             forced rows(t);
             j.run(src, dst);
@@ -444,14 +453,38 @@ bool check_job(const std::string &what_runs, flush where, const job &j, rng &ran
             for (ptrdiff_t y = 0; y < p.shape().rows; y++, i++)
                 if (!std::equal(before[i].begin(), before[i].end(), p.row(y)))
                     fault = "the source was written";
+        if (fault.empty()) fault = complaint;
         if (fault.empty() && !defines) fault = difference(expected, got);
         if (fault.empty()) continue;
-        ADD_FAILURE() << fault << "\n  in: " << running;
+        fault += "\n  in: " + std::string(running);
         *running = 0;
-        return false;
+        return fault;
     }
     *running = 0;
-    return true;
+    return "";
+}
+
+namespace {
+
+bool check_job(const std::string &what_runs, flush where, const job &j, rng &random,
+               const std::function<placement()> &place) {
+    const auto places = [&](size_t count) {
+        std::vector<placement> p(count);
+        for (placement &each : p) each = place();
+        return p;
+    };
+    setting how;
+    how.dst = places(j.dst.size());
+    how.src = places(j.src.size());
+    const content what = content(random.below(int(content::count) + 2) % int(content::count));
+    how.fill = [&](picture &p) { p.fill(what, random); };
+    how.salt = unsigned(random.next());
+    how.words = std::string("planes flush at their ") + (where == flush::at_end ? "end" : "start") +
+                ", content " + std::to_string(int(what)) +
+                ", SIMGP_TEST_SEED=" + std::to_string(seed());
+    const std::string fault = fault_of(what_runs, j, how);
+    if (!fault.empty()) ADD_FAILURE() << fault;
+    return fault.empty();
 }
 
 }  // namespace
@@ -475,24 +508,42 @@ bool for_sizes(const sweep &sizes, const F &check) {
 }
 
 bool check_both_ways(const std::string &what_runs, const job &j, rng &random) {
-    return check_job(what_runs, flush::at_end, j, random) &&
-           check_job(what_runs, flush::at_start, j, random);
+    const auto check = [&](flush where) {
+        return check_job(what_runs, where, j, random, [&] { return any_placement(where, random); });
+    };
+    return check(flush::at_end) && check(flush::at_start);
 }
 
 }  // namespace
 
 bool check_jobs(const std::string &name, const sweep &sizes,
                 const std::function<job(int width, int height)> &make) {
-    watch_faults();
     rng random(seed());
     return for_sizes(sizes, [&](int width, int height) {
         return check_both_ways(name + ", " + text_of({width, height}), make(width, height), random);
     });
 }
 
+bool check_every_size(const std::string &name, int widths, int heights, rng &random,
+                      const std::function<job(int width, int height)> &make) {
+    for (int height = 1; height <= heights; height++)
+        for (int width = 1; width <= widths; width++)
+            for (flush where : {flush::at_end, flush::at_start}) {
+                const auto place = [&] {
+                    placement p = any_placement(where, random);
+                    p.gap = random.below(2) ? size_t(random.below(64)) : 0;
+                    p.excess = random.below(4);
+                    return p;
+                };
+                if (!check_job(name + ", " + text_of({width, height}), where, make(width, height),
+                               random, place))
+                    return false;
+            }
+    return true;
+}
+
 bool check_resize_jobs(const std::string &name, const sweep &to,
                        const std::function<job(const size &from, const size &to)> &make) {
-    watch_faults();
     rng random(seed());
     int calls = 0;
     // A length to start from; `most` bounds those that are drawn at random.
@@ -549,3 +600,11 @@ bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sam
 }
 
 }  // namespace rig
+
+#ifdef RIG_ASAN
+// The sanitizers call these when they have found something.
+extern "C" void __asan_on_error();
+extern "C" void __ubsan_on_report();
+void __asan_on_error() { rig::say_what_runs(); }
+void __ubsan_on_report() { rig::say_what_runs(); }
+#endif

@@ -43,8 +43,8 @@ class rng {
 };
 
 // Inputs: random bytes; 0 and 255 at random; 0 and 255 in turn; values where formulas saturate or
-// change their sign; all 0; all 255.
-enum class content { random, extremes, alternating, corners, zeros, ones, count };
+// change their sign; all 0; all 255; steps of at most 4 from byte to byte.
+enum class content { random, extremes, alternating, corners, zeros, ones, smooth, count };
 void fill_bytes(uint8_t *p, size_t size, content what, rng &random);
 
 // Formats
@@ -118,6 +118,8 @@ struct plane_shape {
     int sample_bytes;
     ptrdiff_t row_bytes, rows;
     int stride_unit = 1;  // strides are multiples of this
+    // The descriptor may say up to stride_unit - 1 bytes more, which have to be rounded off.
+    bool rounded = false;
 };
 // width x height samples.
 plane_shape samples(int32_t width, int32_t height, int sample_bytes = 1);
@@ -132,6 +134,7 @@ struct placement {
     size_t gap = 0;
     ptrdiff_t padding = 0;
     bool bottom_up = false;
+    int excess = 0;  // what the descriptor says beyond the stride, modulo the unit of rounded ones
 };
 placement any_placement(flush where, rng &random);
 
@@ -239,12 +242,31 @@ struct job {
     std::vector<plane_shape> src, dst;
     std::function<void(const picture &src, const picture &dst)> run;
     // Writes what is right, independently of the library; null: the scalar rows are right.
-    std::function<void(const picture &src, const picture &dst)> reference;
+    std::function<void(const picture &src, const picture &dst)> reference = nullptr;
     bool holes = false;  // dst has bytes that nothing writes, such as the unused slots of tiles
     // Works in place: dst is filled like a source, with the same bytes for every target and for the
     // reference. src may be empty, or hold what is read besides.
     bool in_place = false;
+    // Puts into the sources what random bytes do not have.
+    std::function<void(const picture &src)> season = nullptr;
 };
+
+// One run of a job: where its planes lie, with what the sources (and what is worked on in place) are
+// filled, and the pattern around the results.
+struct setting {
+    std::vector<placement> src, dst;
+    std::function<void(picture &)> fill;
+    unsigned salt;
+    std::string words;  // for the report
+};
+
+// Runs a job with the rows of every target. Returns the first of these in words, with all that is
+// needed to tell what ran: a visible byte that differs from the reference or the scalar rows, a byte
+// written elsewhere, a source that changed; or "". `what_runs`: the operation and its sizes.
+std::string fault_of(const std::string &what_runs, const job &j, const setting &how);
+
+// Called by a job that sees a fault of its own, such as a result code: fault_of reports it.
+void complain(const std::string &fault);
 
 // The sizes to try: every width from 1 to two of the widest vectors and 1 more, in steps, with
 // small heights; then a few large pictures.
@@ -257,11 +279,15 @@ struct sweep {
 };
 
 // Runs the jobs of all sizes with the rows of every target, on the same inputs, with planes flush
-// at their end and at their start, packed and padded, top-down and bottom-up. Reports the first of
-// these: a visible byte that differs from the reference or the scalar rows, a byte written
-// elsewhere, a source that changed. False after a failure.
+// at their end and at their start, packed and padded, top-down and bottom-up. Reports the first
+// fault. False after a failure.
 bool check_jobs(const std::string &name, const sweep &sizes,
                 const std::function<job(int width, int height)> &make);
+
+// Runs the jobs of all widths with all heights, from 1 on, each once at either end of its memory,
+// flush or at any of 64 alignments.
+bool check_every_size(const std::string &name, int widths, int heights, rng &random,
+                      const std::function<job(int width, int height)> &make);
 
 // check_jobs for operations between any two sizes: `to` has the sizes of the destination, each of
 // which meets sources that are as large, half and double, a pixel more or less, one pixel, and of

@@ -177,14 +177,20 @@ TEST(rotate, odd_strides_of_16_bit_planes_are_the_next_lower_even_ones) {
 }
 
 TEST(rotate, empty_planes_are_left_alone) {
-    for (auto [w, h] :
-         {std::pair(0, 4), {4, 0}, {-4, 4}, {4, -4}, {0, INT32_MIN}, {INT32_MIN, 1}}) {
+    for (auto [w, h] : {std::pair(0, 4),
+                        {4, 0},
+                        {-4, 4},
+                        {4, -4},
+                        {0, INT32_MIN},
+                        {INT32_MIN, 1},
+                        {0, INT32_MAX}}) {
         for (int rot = 1; rot < 6; rot++)
             for (simgp_plane_fn *kernel : {simgp_tbl_fn_rot_8b[rot], simgp_tbl_fn_rot_16b[rot]}) {
                 uint8_t src[64] = {}, dst[64];
                 memset(dst, 7, sizeof dst);
                 kernel(src, w, h, 4, 4, dst);
                 kernel(nullptr, w, h, 16, 8, nullptr);
+                kernel(dst, w, h, INT32_MIN, INT32_MIN, dst);
                 EXPECT_EQ(std::count(dst, dst + 64, 7), 64) << w << " x " << h;
             }
         simgp_csc_1x2_to_1x1_rot_90l(nullptr, w, h, 8, 8, nullptr);
