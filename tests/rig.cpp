@@ -1,7 +1,5 @@
 #include "tests/rig.h"
 
-#include <signal.h>
-
 #include <algorithm>
 #include <cstring>
 
@@ -40,24 +38,6 @@ uint64_t number_from(const char *variable, uint64_t otherwise) {
 
 // What the drivers run now, for a program that ends at an inaccessible page.
 char running[512] = "";
-
-void report_fault(int number) {
-    const char *text[] = {"\nfault in: ", *running ? running : "no driver of the rig", "\n"};
-    for (const char *t : text)
-        if (write(STDERR_FILENO, t, strlen(t)) < 0) break;
-    signal(number, SIG_DFL);  // the instruction is tried again and ends the program
-}
-
-void watch_faults() {
-    static const bool watching = [] {
-        struct sigaction action = {};
-        action.sa_handler = report_fault;
-        sigaction(SIGSEGV, &action, nullptr);
-        sigaction(SIGBUS, &action, nullptr);
-        return true;
-    }();
-    (void)watching;
-}
 
 constexpr size_t reach = 128;  // bytes that are watched on either side of a destination
 
@@ -483,7 +463,7 @@ bool check_both_ways(const std::string &what_runs, const job &j, rng &random) {
 
 bool check_jobs(const std::string &name, const sweep &sizes,
                 const std::function<job(int width, int height)> &make) {
-    watch_faults();
+    report_faults(running);
     rng random(seed());
     return for_sizes(sizes, [&](int width, int height) {
         return check_both_ways(name + ", " + text_of({width, height}), make(width, height), random);
@@ -492,7 +472,7 @@ bool check_jobs(const std::string &name, const sweep &sizes,
 
 bool check_resize_jobs(const std::string &name, const sweep &to,
                        const std::function<job(const size &from, const size &to)> &make) {
-    watch_faults();
+    report_faults(running);
     rng random(seed());
     int calls = 0;
     // A length to start from; `most` bounds those that are drawn at random.
