@@ -6,7 +6,7 @@ install(TARGETS ${libraries} EXPORT simgp-targets
         LIBRARY COMPONENT runtime NAMELINK_COMPONENT dev
         RUNTIME COMPONENT runtime
         ARCHIVE COMPONENT dev)
-foreach(header IN LISTS SIMGP_PUBLIC_HEADERS)
+foreach(header IN LISTS SIMGP_PUBLIC_HEADERS SIMGP_PUBLIC_CXX_HEADERS)
   get_filename_component(folder ${header} DIRECTORY)
   install(FILES ${header} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/${folder} COMPONENT dev)
 endforeach()

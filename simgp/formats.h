@@ -3,6 +3,7 @@
 #define SIMGP_FORMATS_H
 
 #include "rows/formats.h"
+#include "simgp/describe.h"
 #include "simgp/img.h"
 
 namespace simgp {
@@ -18,6 +19,20 @@ inline constexpr coded_format coded_formats[] = {
     SIMGP_FORMATS(ENTRY)
 #undef ENTRY
 };
+
+// What programs compute with (describe.h) is what the table says.
+consteval bool described_as_listed() {
+    for (const coded_format &f : coded_formats) {
+        if (simgp_format_planes(f.code) != f.is->planes) return false;
+        for (int k = 0; k < 3; ++k)
+            if (simgp_plane_sample(f.code, k) != f.is->bytes[k] ||
+                simgp_plane_x_shift(f.code, k) != f.is->x_shift[k] ||
+                simgp_plane_y_shift(f.code, k) != f.is->y_shift[k])
+                return false;
+    }
+    return true;
+}
+static_assert(described_as_listed());
 
 constexpr const format *find_format(int32_t code) {
     for (const coded_format &f : coded_formats)

@@ -200,8 +200,66 @@ TEST_F(convert_test, y4m_of_every_layout_comes_from_files_and_pipes) {
                           video.substr(header + 6));
     good("tags.y4m -o kept.y4m");
     const std::string kept = read("kept.y4m");
-    EXPECT_EQ(kept.substr(0, kept.find('\n')), "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420jpeg");
+    EXPECT_EQ(kept.substr(0, kept.find('\n')),
+              "YUV4MPEG2 W33 H17 F30000:1001 Ip A4:3 C420mpeg2 XCOMMENT=none");
     EXPECT_EQ(kept.substr(kept.find('\n') + 1), video.substr(header));
+    write("tags.y4m",
+          "YUV4MPEG2 W33 H17 C420paldv XYSCSS=420PALDV XA=b\nFRAME\n" + video.substr(header + 6));
+    good("tags.y4m -o kept.y4m --to yuv444");
+    EXPECT_EQ(got.err,
+              "simgp-convert: note: yuv444 holds chroma as if it lay on the first pixel, not as "
+              "420paldv says\n");
+    EXPECT_EQ(read("kept.y4m").find("YUV4MPEG2 W33 H17 F25:1 Ip A1:1 C444 XA=b\nFRAME\n"), 0u);
+}
+
+TEST_F(convert_test, stills_come_one_by_one_or_numbered) {
+    good("testcard:40x30@3 -o n%02d.png");
+    good("testcard:40x30@3 -o whole.rgb888");
+    good("n%02d.png -o films.rgb888");
+    EXPECT_EQ(read("films.rgb888"), read("whole.rgb888"));
+    good("testcard:40x30 -o one.ppm");
+    good("one.ppm -o back.png");
+    EXPECT_EQ(difference(png("back.png"), png("n00.png")), 0);
+    shell("rm n00.png");
+    good("n%02d.png -o rest.rgb888");  // from number 1 on
+    EXPECT_EQ(read("rest.rgb888"), read("whole.rgb888").substr(40 * 30 * 3));
+    write("grey.pgm", "P5 # a comment\n2\t1\n255\n\x10\xEB");
+    good("grey.pgm -o grey.rgb888");
+    EXPECT_EQ(read("grey.rgb888"), "\x10\x10\x10\xEB\xEB\xEB");
+    shell("cp one.ppm n02.png");  // of the same size: kinds may be mixed
+    good("n%02d.png -o mixed.rgb888");
+    EXPECT_EQ(read("mixed.rgb888").size(), 2u * 40 * 30 * 3);
+}
+
+TEST_F(convert_test, what_a_format_cannot_hold_is_said_once) {
+    const struct {
+        const char *arguments, *note;
+    } cases[] = {
+        {"testcard:8x8 -o o.png", ""},
+        {"testcard:8x8 -o o.yuv420", ""},
+        {"testcard:8x8 -f yuv444 -o o.nv12",
+         "nv12 holds a quarter of the chroma samples, those of "
+         "every first pixel"},
+        {"testcard:8x8 -f yuv444 -o o.uyvy --chroma mean",
+         "uyvy holds half of the chroma samples, "
+         "averaged"},
+        {"testcard:8x8 -o o.yuv400", "yuv400 holds no colour"},
+        {"testcard:8x8 -o o.rgb565", "rgb565 holds 5 and 6 bits of each channel"},
+        {"testcard:8x8 -f rgba8888 -o o.rgb888", "rgb888 holds no alpha"},
+        {"testcard:8x8 -o o.nv21 --colour bt601-full", "nv21 holds nothing that says bt601-full"},
+    };
+    for (const auto &c : cases) {
+        good(c.arguments);
+        EXPECT_EQ(got.err, *c.note ? std::string("simgp-convert: note: ") + c.note + "\n" : "")
+            << c.arguments;
+        good(std::string(c.arguments) + " --quiet");
+        EXPECT_EQ(got.err, "");
+    }
+    // Grey is the same grey in every RGB format.
+    good("testcard:64x48 -f yuv400 -o grey.y4m");
+    good("grey.y4m -o a.png --to rgb565");
+    good("grey.y4m -o b.png --to rgb888");
+    EXPECT_LT(difference(png("a.png"), png("b.png")), 8);
 }
 
 TEST_F(convert_test, several_frames_become_numbered_files_or_a_sheet) {
@@ -505,6 +563,9 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
     write("huge.png", png.substr(0, 16) + std::string("\x7f\xff\xff\xff", 4) + png.substr(20));
     write("empty", "");
     write("text", "This is no picture at all.");
+    write("photo.jpg", "\xFF\xD8\xFF\xE0 JFIF");
+    write("odd0.png", "P6 2 1 255 " + std::string(6, 'x'));
+    write("odd1.png", "P6 4 1 255 " + std::string(12, 'x'));
     const size_t second = y4m.find("FRAME", y4m.find("FRAME") + 5);
     write("lost.y4m", y4m.substr(0, second) + "x" + y4m.substr(second));
     auto header = [&](const std::string &name, const std::string &tags) {
@@ -535,7 +596,14 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"huge.png -o o.ppm", "huge.png: ", 1},
         {"empty -o o.png", "empty: byte 0: the input is empty", 1},
         {"- -o o.png </dev/null", "standard input: byte 0: the input is empty", 1},
-        {"text -o o.png", "text: neither Y4M nor PNG", 1},
+        {"text -o o.png", "text: neither Y4M nor PNG nor PPM", 1},
+        {"photo.jpg -o o.png", "photo.jpg: a JPEG file; ffmpeg reads it: ffmpeg -i 'photo.jpg' ",
+         1},
+        {"good.y4m -o o.mp4", "o.mp4: this program does not write .mp4; ffmpeg does", 1},
+        {"good.y4m -o o.JPG", "o.JPG: this program does not write .jpg; ffmpeg does", 1},
+        {"good.nv21 -f nv2l -s 64x48 -o o.png", "unknown format 'nv2l'; did you mean 'nv21'?", 1},
+        {"odd%d.png -o o.y4m", "odd1.png: rgb888 4x1 among pictures of rgb888 2x1", 1},
+        {"odd%d.ppm -o o.y4m", "odd1.ppm: No such file", 1},
         {"lost.y4m -o o.raw", "lost.y4m: frame 1, byte 4655: no FRAME line", 1},
         {"deep.y4m -o o.png", "deep.y4m: byte 16: colour space C420p10 has more than 8 bits", 1},
         {"tag.y4m -o o.png", "tag.y4m: byte 16: unknown tag 'Z7'", 1},
@@ -555,7 +623,7 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
          "--size: impossible size 4294967297x4294967297", 1},
         {"good.nv21 -s 64by48 -o o.png", "--size: '64by48' is not a size", 1},
         {"text -s 64x48 -o o.png", "text: raw frames need --format", 1},
-        {"good.nv21 -f nv22 -s 64x48 -o o.png", "unknown format 'nv22'", 1},
+        {"good.nv21 -f i999999 -s 64x48 -o o.png", "unknown format 'i999999'; there are yuv400", 1},
         {"good.y4m -f nv12 -o o.png", "good.y4m: holds yuv420, not nv12", 1},
         {"good.png -t nv12 -o o.png", "png files hold RGB pictures, not nv12", 1},
         {"good.png -t nv12 -o o.y4m", "Y4M files hold", 1},
@@ -577,7 +645,7 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.y4m -o o.y4m --rotate 45", "--rotate: 45 not in {90l,90r,180,hori,vert}", 2},
         {"good.y4m -o o.y4m --rotate 90l --thumbnail", "--rotate excludes --thumbnail", 2},
         {"testcard:64x48@0 -o o.png", "testcard:64x48@0: '0' is not a number of frames", 1},
-        {"good.y4m -o o.png --frames 0", "--frames", 2},
+        {"good.y4m -o o.png --frames 0", "0 is not a number of frames from 1 on; leave it out", 2},
         {"good.y4m", "--output is required", 2},
         {"--nonsense", "--nonsense", 2},
     };
@@ -604,6 +672,17 @@ TEST_F(convert_test, a_failure_keeps_what_was_there) {
     EXPECT_NE(got.err.find("(2 complete pictures stay)"), std::string::npos) << got.err;
     EXPECT_EQ(files(),
               (std::set<std::string>{"cut.y4m", "good.y4m", "old.raw", "p0.png", "p1.png"}));
+    EXPECT_EQ(run("good.y4m -o old.raw --no-clobber"), 1);
+    EXPECT_NE(got.err.find("old.raw: File exists"), std::string::npos) << got.err;
+    EXPECT_EQ(read("old.raw"), "precious");
+    good("good.y4m -o new.raw --no-clobber");
+    // A file that is replaced leaves its mode, and a link stays one.
+    shell("chmod 640 old.raw; mkdir there; mv old.raw there; ln -s there/old.raw link.raw");
+    good("good.y4m -o link.raw");
+    EXPECT_TRUE(fs::is_symlink(at("link.raw")));
+    EXPECT_EQ(read("there/old.raw"), read("new.raw"));
+    EXPECT_EQ(fs::status(at("there/old.raw")).permissions(), fs::perms(0640));
+    EXPECT_EQ(files("there"), std::set<std::string>{"old.raw"});
     // A file may be converted onto itself.
     good("good.y4m -o good.y4m --to yuv422n");
     EXPECT_EQ(read("good.y4m").find("C422\n") != std::string::npos, true);

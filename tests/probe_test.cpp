@@ -200,6 +200,34 @@ TEST_F(probe_test, text_and_summary) {
     EXPECT_EQ(ask("--fourcc xvid " + path)[0]["recognised_by"], "FourCC");
 }
 
+// Headers as encoders write them.
+TEST_F(probe_test, sizes_and_profiles_come_from_the_headers) {
+    using namespace std::string_literals;
+    const struct {
+        std::string bytes, text;
+    } cases[] = {
+        {"\0\0\1\xB0\1\0\0\1\xB5\x89\x13\0\0\1\0\0\0\1\x20\0\xC4\x8D\x88\0\xCD\x0B\4\x24\x14\x43"
+         "\0\0\1\xB6\x10\x60\xB1\x82"s,
+         "352x288, Simple, level 1; 1 picture"},
+        {"\0\0\x80\2\x1C\xE8\x21\0\x10\x8C\x62\x64\x80\x22\0\xCC\x40\x40"s, "200x152; 1 picture"},
+        {"\0\0\x80\2\x0C\x12\x34\x56"s, "352x288; 1 picture"},
+        // Cropped by a column and three lines of chroma.
+        {"\0\0\0\1\x67\xF4\0\x0D\x91\x9B\x28\x2C\x10\xF7\x3E\2\x20\0\0\3\0\x20\0\0\6\x41\xE2\x85"
+         "\x32\xC0\0\0\1\x68\xEB\xE3\xC4\x48\x44\0\0\1\x65\x88\x84\0\x10"s,
+         "350x250, High 4:4:4 Predictive, level 1.3; 1 picture"},
+        {sequence_set(false) + picture_set + slice(true, 0, 0, {{0, 1}}),
+         "176x288, Main, level 3; 1 picture"},
+    };
+    for (const auto &c : cases) {
+        const program::outcome got =
+            program::run(place, probe + " --summary " + place.write("stream", c.bytes));
+        EXPECT_NE(got.out.find("  " + c.text), std::string::npos) << c.text << "\n" << got.out;
+    }
+    EXPECT_EQ(
+        ask("--summary " + place.write("stream", cases[0].bytes))[0]["summary"]["size"]["width"],
+        352);
+}
+
 TEST_F(probe_test, tags) {
     const struct {
         const char *tag;
@@ -221,6 +249,7 @@ TEST_F(probe_test, bad_input) {
                              "\0\0\0\x18"
                              "ftypisom"s),
                  "MP4");
+    expect_fault(place.write("asf", "\x30\x26\xB2\x75 and more"), "has no elementary streams");
     expect_fault(place.write("ps", "\0\0\1\xBA\x44"s), "MPEG program stream");
     expect_fault(place.write("lengths", "\0\0\0\2\x67\1\0\0\0\3\x65\1\2"s),
                  "lengths in place of start codes");

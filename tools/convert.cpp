@@ -9,8 +9,9 @@
 namespace {
 
 constexpr const char *examples = R"(
-Inputs: Y4M video (mono, 4:2:0, 4:2:2, 4:4:4 of 8 bits), PNG, raw frames with --format and --size,
-a moving test card testcard:[WIDTHxHEIGHT][@FRAMES], and "-" for the standard input.
+Inputs: Y4M video (mono, 4:2:0, 4:2:2, 4:4:4 of 8 bits), PNG, PPM, numbered files such as
+in-%04d.png (from 0 or 1 on), raw frames with --format and --size, a moving test card
+testcard:[WIDTHxHEIGHT][@FRAMES], and "-" for the standard input.
 Outputs by their ending: .png, .ppm, .y4m, anything else raw frames; "-" is the standard output.
 
 Between YUV and RGB, colours are what --colour says; without it, what the Y4M header says in its tags
@@ -52,8 +53,16 @@ int main(int argc, char **argv) {
                    "destination format; without it, what suits the output best (see --list)");
     app.add_option("-f,--format", job.source.format, "format of raw frames or of the test card");
     app.add_option("-s,--size", job.source.size, "size of raw frames, such as 640x480");
-    app.add_option("-n,--frames", job.frames, "stop after so many frames")
-        ->check(CLI::PositiveNumber);
+    app.add_option("-n,--frames", job.frames, "stop after so many frames; all without it")
+        ->check(CLI::Validator(
+            [](const std::string &text) -> std::string {
+                const bool number = !text.empty() && text.size() < 19 &&
+                                    text.find_first_not_of("0123456789") == std::string::npos;
+                if (number && std::stoll(text) > 0) return {};
+                return text + " is not a number of frames from 1 on; leave it out for all of them";
+            },
+            "", ""));
+    app.add_flag("!--no-clobber", job.may_replace, "leave files alone that are there already");
     app.add_option("--colour", job.source.colour,
                    "what Y, U and V mean, instead of what the input says of it (see below)")
         ->check(CLI::IsMember(tools::colour_names()));
@@ -84,6 +93,7 @@ int main(int argc, char **argv) {
         ->check(CLI::IsMember({"png", "ppm", "y4m", "raw"}));
     app.add_flag("-v,--verbose", job.verbose, "say which way the frames go, and who does what");
     app.add_flag("-q,--quiet", job.quiet, "no progress bar, no notes");
+    app.set_version_flag("--version", "simgp-convert " SIMGP_TOOLS_VERSION);
     app.add_flag("--list", list, "list all conversions");
     app.add_option("--demo", demo,
                    "write pictures that show what the library does into this folder");

@@ -16,7 +16,7 @@ namespace tools {
 namespace {
 
 void save(const std::string &path, const std::vector<tile> &tiles, int columns) {
-    output out(path);
+    output out(destination{path});
     write_png(out, lay_out(tiles, columns));
     out.commit();
 }

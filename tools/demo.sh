@@ -24,6 +24,16 @@ command -v ffmpeg >/dev/null || {
 }
 # Says what is wrong with the file, if something is.
 ffmpeg -v error -nostdin -i "$file" -frames:v 1 -an -f null - || exit 1
+# What the film says of its colours goes along: the range in the Y4M header, the matrix by --colour.
+said() { ffprobe -v error -select_streams v:0 -show_entries "stream=$1" -of default=nk=1:nw=1 "$file"; }
+colour=() layout=yuv420p
+[ "$(said color_range)" = pc ] && layout=yuvj420p
+case $(said color_space) in
+    bt709) colour=(--colour bt709) ;;
+    smpte170m | bt470bg | fcc) colour=(--colour bt601) ;;
+    bt2020*) colour=(--colour bt2020) ;;
+esac
+[ $layout = yuvj420p ] && [ ${#colour[@]} -gt 0 ] && colour[1]+=-full
 # The demonstration takes no more than 41 frames.
-ffmpeg -v error -nostdin -i "$file" -frames:v 41 -an -f yuv4mpegpipe -pix_fmt yuv420p - |
-    "$convert" --demo "$folder" -
+ffmpeg -v error -nostdin -i "$file" -frames:v 41 -an -f yuv4mpegpipe -pix_fmt $layout - |
+    "$convert" "${colour[@]}" --demo "$folder" -

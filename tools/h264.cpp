@@ -73,12 +73,12 @@ constexpr uint8_t profiles_with_chroma[] = {100, 110, 122, 244, 44,  83, 86,
 void h264::read_sequence(const uint8_t *nal, size_t size) {
     syntax s(nal, size);
     sequence_parameters p;
-    const uint32_t profile = s.u(8);
-    s.u(16);  // constraints, level
+    const uint32_t profile = s.u(8), constraints = s.u(8), level = s.u(8);
+    uint32_t chroma = 1;
     const uint32_t id = s.ue();
     if (std::find(std::begin(profiles_with_chroma), std::end(profiles_with_chroma), profile) !=
         std::end(profiles_with_chroma)) {
-        const uint32_t chroma = s.ue();
+        chroma = s.ue();
         if (chroma == 3) p.separate_planes = s.flag();
         s.ue();    // depth of luma
         s.ue();    // and chroma
@@ -100,11 +100,26 @@ void h264::read_sequence(const uint8_t *nal, size_t size) {
     }
     s.ue();    // reference frames
     s.flag();  // gaps
-    s.ue();    // width
-    s.ue();    // height
+    const uint64_t columns = uint64_t(s.ue()) + 1, rows = uint64_t(s.ue()) + 1;
     p.frames_only = s.flag();
+    const int fields = p.frames_only ? 1 : 2;
+    if (!p.frames_only) s.flag();  // blocks of fields
+    s.flag();                      // direct prediction
+    uint32_t crop[4] = {};         // left, right, top, bottom
+    if (s.flag())
+        for (uint32_t &c : crop) c = s.ue();
     s.fail_if(id > 31 || p.frame_num_bits > 16 || p.poc_lsb_bits > 16 || p.poc_type > 2);
-    if (!s.bad()) sequences_[id] = p;
+    if (s.bad()) return;
+    sequences_[id] = p;
+    // Cropping is in samples of chroma, and in lines of both fields.
+    const int across = chroma == 1 || chroma == 2 ? 2 : 1, down = (chroma == 1 ? 2 : 1) * fields;
+    const int64_t width = int64_t(16 * columns) - across * (int64_t{crop[0]} + crop[1]);
+    const int64_t height = int64_t(16 * rows) * fields - down * (int64_t{crop[2]} + crop[3]);
+    description about;
+    about.profile = h264_profile(profile, constraints, level);
+    if (width > 0 && height > 0 && width <= 65536 && height <= 65536)
+        about.width = int(width), about.height = int(height);
+    about_.add(about);
 }
 
 void h264::read_picture(const uint8_t *nal, size_t size) {

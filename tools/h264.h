@@ -7,6 +7,8 @@
 
 #include <optional>
 
+#include "tools/description.h"
+
 namespace tools {
 
 class h264 {
@@ -19,6 +21,9 @@ class h264 {
     };
     // `nal` begins with the byte behind the start code; what follows the unit may follow.
     role role_of(const uint8_t *nal, size_t size);
+
+    // What the first sequence parameter set says.
+    const description &about() const { return about_; }
 
   private:
     struct sequence_parameters {
@@ -43,6 +48,7 @@ class h264 {
     std::optional<sequence_parameters> sequences_[32];
     std::optional<picture_parameters> pictures_[256];
     std::optional<slice_header> last_;
+    description about_;
 };
 
 }  // namespace tools

@@ -1,5 +1,6 @@
 #include "tools/job.h"
 
+#include <ctype.h>
 #include <inttypes.h>
 #include <stdio.h>
 
@@ -35,8 +36,8 @@ const pixel_format &suitable(const job &j, const picture_shape &from, const std:
         if (!fits) continue;
         try {
             const road r(from, format, j.dither, j.edit, code);
-            const bool poorer = !from.format->is_rgb() && !format.is_rgb() &&
-                                (format.chroma() < from.format->chroma() || !r.loss().empty());
+            const bool poorer =
+                !format.is_rgb() && (format.chroma() < from.format->chroma() || !r.loss().empty());
             const int cost = r.cost() + (poorer ? 20 : 0);
             if (cost < best_cost) best = &format, best_cost = cost;
         } catch (const fault &) {
@@ -66,14 +67,65 @@ const pixel_format &target(const job &j, const picture_shape &from, const std::s
     return *named;
 }
 
+// Files that other programs make of what this one writes.
+void refuse_foreign_kinds(const job &j) {
+    if (!j.as.empty() || j.output == "-") return;
+    std::string ending = ending_of(j.output);
+    for (char &c : ending) c = char(tolower(c));
+    for (const char *film : {"mp4", "m4v", "mov", "mkv", "webm", "avi", "wmv", "flv", "mpg", "ts",
+                             "h264", "264", "h265", "hevc", "ogv", "gif"})
+        if (ending == film)
+            throw fault(j.output, ": this program does not write .", ending,
+                        "; ffmpeg does: simgp-convert ... -o - --as y4m | ffmpeg -i - '", j.output,
+                        "' (for raw frames of that name say --as raw)");
+    for (const char *still : {"jpg", "jpeg", "webp", "avif", "heic", "bmp", "tif", "tiff"})
+        if (ending == still)
+            throw fault(j.output, ": this program does not write .", ending,
+                        "; ffmpeg does: simgp-convert ... -o - --as png | ffmpeg -i - '", j.output,
+                        "' (for raw frames of that name say --as raw)");
+}
+
+// What the frames have and the files will not, in words; empty if nothing.
+std::string loss_note(const picture_shape &from, const picture_shape &to, const job &j,
+                      const video_traits &traits, const std::string &kind, const colour &c) {
+    const pixel_format &a = *from.format, &b = *to.format;
+    std::vector<std::string> notes;
+    if (b.chroma() == 0 && a.chroma() > 0) {
+        notes.emplace_back("no colour");
+    } else if (b.chroma() < a.chroma() && b.chroma() > 0) {
+        notes.push_back(std::string(b.chroma() == 1   ? "a quarter"
+                                    : a.chroma() == 4 ? "half"
+                                                      : "fewer") +
+                        " of the chroma samples" +
+                        (j.chroma_mean ? ", averaged" : ", those of every first pixel"));
+    }
+    if (b.is_rgb16() && !a.is_rgb16())
+        notes.push_back(std::string("5 and 6 bits of each channel") +
+                        (j.dither ? ", dithered" : ""));
+    const auto has_alpha = [](const pixel_format &f) {
+        return f.is_rgb() && f.planes[0].bytes == 4;
+    };
+    if (has_alpha(a) && (!has_alpha(b) || kind == "png" || kind == "ppm"))
+        notes.emplace_back("no alpha");
+    const bool sited = traits.space == "420mpeg2" || traits.space == "420paldv";
+    if (sited && &a != &b && b.chroma() > 0)
+        notes.push_back("chroma as if it lay on the first pixel, not as " + traits.space + " says");
+    if (kind == "raw" && !b.is_rgb() && a.is_rgb() == b.is_rgb() && c.full)
+        notes.push_back("nothing that says " + std::string(c.name));
+    std::string text;
+    for (const std::string &n : notes) text.append(text.empty() ? "" : "; ").append(n);
+    return text;
+}
+
 std::unique_ptr<sink> open_sink(const job &j, const std::string &kind, const video_traits &traits) {
+    const destination to{j.output, j.may_replace};
     const still_writer write = kind == "png" ? write_png : write_ppm;
     if (kind == "raw" || kind == "y4m") {
         if (j.sheet)
             throw fault(j.output, ": a contact sheet is a still picture; name a .png or .ppm file");
-        return kind == "raw" ? open_raw_sink(j.output) : open_y4m_sink(j.output, traits);
+        return kind == "raw" ? open_raw_sink(to) : open_y4m_sink(to, traits);
     }
-    return j.sheet ? open_sheet_sink(j.output, write, j.columns) : open_still_sink(j.output, write);
+    return j.sheet ? open_sheet_sink(to, write, j.columns) : open_still_sink(to, write);
 }
 
 // The colour of the frames.
@@ -122,6 +174,7 @@ video_traits edited_traits(video_traits traits, const picture_shape &from, const
 void run(const job &wish) {
     job j = wish;
     if (!j.resize.empty()) parse_size(j.resize, "--resize", j.edit.width, j.edit.height);
+    refuse_foreign_kinds(j);
     const std::unique_ptr<source> in = open_source(j.source);
     const std::string kind = output_kind(j);
     check_edits(in->shape(), j.edit);
@@ -157,6 +210,10 @@ void run(const job &wish) {
 
     video_traits traits = edited_traits(in->traits(), in->shape(), shape(), j.edit);
     traits.colour = note_of(j, c, traits.colour, shape());
+    const std::string lost = loss_note(in->shape(), shape(), j, in->traits(), kind, c);
+    if (!j.quiet && !lost.empty())
+        fprintf(stderr, "simgp-convert: note: %s holds %s\n",
+                std::string(shape().format->name).c_str(), lost.c_str());
     const std::unique_ptr<sink> out = open_sink(j, kind, traits);
     progress bar(!j.quiet);
     int64_t frames = 0;

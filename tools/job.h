@@ -21,6 +21,7 @@ struct job {
     edits edit;
     bool chroma_mean = false;  // of several pixels or samples, not that of the first
     std::string resize;        // "320x240", the size in `edit`; empty: none
+    bool may_replace = true;   // files that are there
     bool sheet = false;
     int columns = 0;
     bool verbose = false;

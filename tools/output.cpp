@@ -31,16 +31,24 @@ void tidy_on_signals() {
     for (int number : {SIGINT, SIGTERM, SIGHUP}) signal(number, remove_unfinished);
 }
 
-output::output(const std::string &path) : name_(path), path_(path) {
+output::output(const destination &to)
+    : name_(to.path), path_(to.path), may_replace_(to.may_replace) {
+    const std::string &path = path_;
     struct stat about;
     if (path == "-") {
         name_ = "standard output";
         if (isatty(STDOUT_FILENO))
             throw fault("standard output is a terminal; picture data is not written to it");
         file_ = stdout;
-    } else if (stat(path.c_str(), &about) == 0 && !S_ISREG(about.st_mode)) {
+    } else if (const bool there = stat(path.c_str(), &about) == 0;
+               there && !S_ISREG(about.st_mode)) {
         file_ = fopen(path.c_str(), "wb");
     } else {
+        if (there && !may_replace_) fail(EEXIST);
+        if (char *const real = there ? realpath(path.c_str(), nullptr) : nullptr) {
+            path_ = real;
+            free(real);
+        }
         const size_t slash = path.rfind('/') + 1;  // 0 where there is no slash
         temporary_ = path.substr(0, slash) + "." + path.substr(slash) + ".XXXXXX";
         const int descriptor = mkostemp(temporary_.data(), O_CLOEXEC);
@@ -49,10 +57,10 @@ output::output(const std::string &path) : name_(path), path_(path) {
         } else {
             if (temporary_.size() < sizeof unfinished)
                 memcpy(unfinished, temporary_.c_str(), temporary_.size() + 1);
-            // mkostemp makes private files; this one shall be as any other.
+            // mkostemp makes private files; this one shall be as any other, or as the one before.
             const mode_t mask = umask(0);
             umask(mask);
-            fchmod(descriptor, 0666 & ~mask);
+            fchmod(descriptor, there ? about.st_mode & 07777 : 0666 & ~mask);
             file_ = fdopen(descriptor, "wb");
         }
     }
@@ -87,7 +95,11 @@ void output::commit() {
     file_ = nullptr;
     if (fclose(file) != 0) fail(errno);
     if (temporary_.empty()) return;
-    if (rename(temporary_.c_str(), path_.c_str()) != 0) fail(errno);
+    // A link is refused where a name has come up meanwhile.
+    const bool named = may_replace_ ? rename(temporary_.c_str(), path_.c_str()) == 0
+                                    : link(temporary_.c_str(), path_.c_str()) == 0;
+    if (!named) fail(errno);
+    if (!may_replace_) unlink(temporary_.c_str());
     temporary_.clear();
     unfinished[0] = 0;
 }

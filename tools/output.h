@@ -8,12 +8,19 @@
 
 namespace tools {
 
+// Where a file goes. It may replace one that is there, unless the user said otherwise.
+struct destination {
+    std::string path;
+    bool may_replace = true;
+};
+
 class output {
   public:
-    // Regular files are written under a temporary name in the same folder; "-" is the standard
-    // output; what exists and is no regular file (a pipe, a device) is written directly. Fails
-    // with a fault, as every member does.
-    explicit output(const std::string &path);
+    // Regular files are written under a temporary name in the same folder, that of the file itself
+    // where `path` is a symbolic link; a file that is replaced leaves its mode to the new one. "-" is
+    // the standard output; what exists and is no regular file (a pipe, a device) is written
+    // directly. Fails with a fault, as every member does.
+    explicit output(const destination &to);
     // Removes what was not committed.
     ~output();
     output(const output &) = delete;
@@ -29,6 +36,7 @@ class output {
     [[noreturn]] void fail(int error) const;
 
     std::string name_, path_, temporary_;
+    bool may_replace_;
     FILE *file_ = nullptr;
     long long written_ = 0;
 };

@@ -6,6 +6,7 @@
 
 #include "simgp/formats.h"
 #include "tools/fault.h"
+#include "tools/nearest.h"
 
 namespace tools {
 
@@ -73,16 +74,22 @@ int pixel_format::chroma() const {
 std::span<const pixel_format> formats() { return table; }
 
 const pixel_format *find_format(std::string_view name) {
+    const int32_t code = simgp_format_of_name(std::string(name).c_str());
     for (const pixel_format &format : table)
-        if (format.name == name) return &format;
+        if (format.code == code) return &format;
     return nullptr;
 }
 
 const pixel_format &format_named(std::string_view name) {
     if (const pixel_format *format = find_format(name)) return *format;
     std::string known;
-    for (const pixel_format &format : table) known.append(" ").append(format.name);
-    throw fault("unknown format '", name, "'; there are", known);
+    std::vector<std::string_view> names;
+    for (const pixel_format &format : table) {
+        known.append(" ").append(format.name);
+        names.push_back(format.name);
+    }
+    const std::string meant = did_you_mean(name, names);
+    throw fault("unknown format '", name, "'", meant.empty() ? "; there are" + known : meant);
 }
 
 const pixel_format &format_coded(int32_t code) {

@@ -79,13 +79,4 @@ void write_png(output &out, const picture &p) {
     out.write(bytes.data(), size);
 }
 
-void write_ppm(output &out, const picture &p) {
-    out.write("P6\n" + std::to_string(p.width()) + " " + std::to_string(p.height()) + "\n255\n");
-    std::vector<uint8_t> line(size_t(p.width()) * 3);
-    for (int y = 0; y < p.height(); ++y) {
-        rgb_line(p, y, line.data());
-        out.write(line.data(), line.size());
-    }
-}
-
 }  // namespace tools

@@ -27,7 +27,7 @@ Examples:
   simgp-probe --fourcc avc1
   simgp-probe --fourcc 0x55
   simgp-probe --json clip.h263 | jq '.[0].pictures[] | select(.key) | .offset'
-  ffmpeg -i film.mp4 -c:v copy -an -bsf:v h264_mp4toannexb -f h264 - | simgp-probe -
+  ffmpeg -v error -i film.mp4 -map 0:v:0 -c copy -f h264 - | simgp-probe -
 )";
 
 struct options {
@@ -106,19 +106,30 @@ struct summary {
     double spacing() const { return double(last_key - first_key) / double(keys - 1); }
 };
 
-json to_json(const summary &s, uint64_t stream_bytes) {
-    json spacing;
+json to_json(const summary &s, const tools::description &about, uint64_t stream_bytes) {
+    json spacing, size, profile;
+    if (about.width) size = {{"width", about.width}, {"height", about.height}};
+    if (!about.profile.empty()) profile = about.profile;
     if (s.keys > 1)
         spacing = {{"shortest", s.shortest}, {"mean", s.spacing()}, {"longest", s.longest}};
-    return {{"pictures", s.pictures},       {"key_pictures", s.keys},
-            {"key_spacing", spacing},       {"picture_bytes", s.bytes},
-            {"largest_picture", s.largest}, {"stream_bytes", stream_bytes}};
+    return {{"size", size},
+            {"profile", profile},
+            {"pictures", s.pictures},
+            {"key_pictures", s.keys},
+            {"key_spacing", spacing},
+            {"picture_bytes", s.bytes},
+            {"largest_picture", s.largest},
+            {"stream_bytes", stream_bytes}};
 }
 
-std::string to_text(const summary &s, uint64_t stream_bytes) {
+std::string to_text(const summary &s, const tools::description &about, uint64_t stream_bytes) {
     const auto number = [](uint64_t n) { return std::to_string(n); };
-    std::string text = number(s.pictures) + (s.pictures == 1 ? " picture, " : " pictures, ") +
-                       number(s.keys) + " key";
+    std::string text;
+    if (about.width) text += format("%dx%d", about.width, about.height);
+    if (!about.profile.empty()) text += (text.empty() ? "" : ", ") + about.profile;
+    if (!text.empty()) text += "; ";
+    text += number(s.pictures) + (s.pictures == 1 ? " picture, " : " pictures, ") + number(s.keys) +
+            " key";
     if (s.keys > 1)
         text += format(", one every %.1f (%llu to %llu)", s.spacing(),
                        (unsigned long long)s.shortest, (unsigned long long)s.longest);
@@ -174,9 +185,10 @@ void list(const std::string &path, int32_t media_type, const options &o, listing
         const uint64_t stream_bytes = uint64_t(in.offset());
         if (o.as_json)
             out.write((open ? "],\n  " : ",") +
-                      ("\"summary\":" + dumped(to_json(total, stream_bytes))) + "}");
+                      ("\"summary\":" + dumped(to_json(total, stream.about(), stream_bytes))) +
+                      "}");
         else
-            out.write("  " + to_text(total, stream_bytes));
+            out.write("  " + to_text(total, stream.about(), stream_bytes));
         out.flush(&bar);
     } catch (const fault &f) {
         if (o.as_json) {
@@ -244,6 +256,7 @@ int main(int argc, char **argv) {
     app.add_flag("-j,--json", o.as_json, "write JSON, an array with an object for each file");
     app.add_flag("-s,--summary", o.summary_only, "leave the list of pictures out");
     app.add_flag("-q,--quiet", o.quiet, "no progress bar");
+    app.set_version_flag("--version", "simgp-probe " SIMGP_TOOLS_VERSION);
     const auto check = [&] {
         if (o.files.empty() && !o.fourcc) throw CLI::RequiredError("a file or --fourcc");
     };

@@ -43,7 +43,7 @@ class raw_source : public source {
 
 class raw_sink : public sink {
   public:
-    explicit raw_sink(const std::string &path) : output_(path) {}
+    explicit raw_sink(const destination &to) : output_(to) {}
     void put(const picture &p) override { write_frame(output_, p); }
     void finish() override { output_.commit(); }
 
@@ -57,8 +57,8 @@ std::unique_ptr<source> open_raw(std::unique_ptr<input> in, const picture_shape 
     return std::make_unique<raw_source>(std::move(in), shape);
 }
 
-std::unique_ptr<sink> open_raw_sink(const std::string &path) {
-    return std::make_unique<raw_sink>(path);
+std::unique_ptr<sink> open_raw_sink(const destination &to) {
+    return std::make_unique<raw_sink>(to);
 }
 
 }  // namespace tools

@@ -18,8 +18,8 @@ constexpr uint8_t paper = 48;
 
 class sheet_sink : public sink {
   public:
-    sheet_sink(const std::string &path, still_writer write, int columns)
-        : output_(path), write_(write), columns_(columns) {}
+    sheet_sink(const destination &to, still_writer write, int columns)
+        : output_(to), write_(write), columns_(columns) {}
 
     void put(const picture &p) override {
         if (frame_ % every_ == 0) {
@@ -106,8 +106,8 @@ picture lay_out(const std::vector<tile> &tiles, int columns) {
     return sheet;
 }
 
-std::unique_ptr<sink> open_sheet_sink(const std::string &path, still_writer write, int columns) {
-    return std::make_unique<sheet_sink>(path, write, columns);
+std::unique_ptr<sink> open_sheet_sink(const destination &to, still_writer write, int columns) {
+    return std::make_unique<sheet_sink>(to, write, columns);
 }
 
 }  // namespace tools

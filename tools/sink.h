@@ -24,8 +24,8 @@ class sink {
     virtual int64_t kept() const { return 0; }
 };
 
-std::unique_ptr<sink> open_raw_sink(const std::string &path);
-std::unique_ptr<sink> open_y4m_sink(const std::string &path, const video_traits &traits);
+std::unique_ptr<sink> open_raw_sink(const destination &to);
+std::unique_ptr<sink> open_y4m_sink(const destination &to, const video_traits &traits);
 
 // What the colour space tag of a Y4M stream says for this format; empty if Y4M cannot hold it.
 std::string_view y4m_tag(const pixel_format &format);
@@ -37,10 +37,10 @@ void write_ppm(output &out, const picture &p);
 
 // Still pictures. A path with a number in it ("out-%04d.png"; the first picture is number 0) gives
 // a file for each frame, any other path holds one frame and a second one is a fault.
-std::unique_ptr<sink> open_still_sink(const std::string &path, still_writer write);
+std::unique_ptr<sink> open_still_sink(const destination &to, still_writer write);
 // One still picture that shows the frames in a grid; `columns` 0 makes it about as wide as high.
 // Of more than 64 frames it shows every second, fourth, ...
-std::unique_ptr<sink> open_sheet_sink(const std::string &path, still_writer write, int columns);
+std::unique_ptr<sink> open_sheet_sink(const destination &to, still_writer write, int columns);
 
 }  // namespace tools
 

@@ -4,6 +4,7 @@
 
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "tools/colour.h"
 #include "tools/input.h"
@@ -15,6 +16,10 @@ namespace tools {
 struct video_traits {
     std::string rate = "25:1", interlacing = "p", aspect = "1:1";
     colour_note colour;
+    // The colour space tag that a Y4M header had, which says where chroma lies, and its X tags but
+    // for those of the colour.
+    std::string space;
+    std::vector<std::string> extensions;
 };
 
 class source {
@@ -43,12 +48,13 @@ struct source_options {
     std::string colour = {};  // empty: as the file says, or the usual one
 };
 
-// Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M or PNG. A colour
-// that they name takes the place of what a file says.
+// Opens whatever `options` name: a test card, raw frames (where a size is given), Y4M, PNG or PPM; a
+// name with a number in it, such as in-%04d.png, stands for files from number 0 or 1 on.
 std::unique_ptr<source> open_source(const source_options &options);
 
 std::unique_ptr<source> open_y4m(std::unique_ptr<input> in);
 std::unique_ptr<source> open_png(std::unique_ptr<input> in, const pixel_format &format);
+std::unique_ptr<source> open_ppm(std::unique_ptr<input> in);
 std::unique_ptr<source> open_raw(std::unique_ptr<input> in, const picture_shape &shape);
 // `drawn_in` is what it is drawn in; null: the usual one of its size.
 std::unique_ptr<source> open_testcard(const std::string &spec, const pixel_format &format,

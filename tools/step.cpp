@@ -19,6 +19,10 @@ bool v_first(const pixel_format &format) {
 int32_t call(method how, int code, const simgp_img &src, simgp_img dst) {
     switch (how) {
         case method::csc:
+            // Grey has one meaning, also in 16 bits, and so has the matrix: where simgp_csc has rules of
+            // its own (grey that is not expanded, a coarse matrix), the flag leads to the common one.
+            if (src.format == SIMGP_FMT_YUV400 || src.format == SIMGP_FMT_NV21)
+                code |= SIMGP_CHROMA_MEAN;
             return simgp_csc_any(&src, &dst, code);
         case method::dither:
             return simgp_csc_dither(&src, &dst);

@@ -24,9 +24,11 @@ const uint8_t *find_code(const uint8_t *from, const uint8_t *end, bool h263) {
     while (end - from >= 3) {
         const void *pair = memmem(from, size_t(end - from), "\0\0", 2);
         const uint8_t *code = static_cast<const uint8_t *>(pair);
-        if (!code || end - code < 3) return nullptr;
+        if (!code) return nullptr;
+        while (end - code >= 3 && code[2] == 0) ++code;  // to the last two of a run
+        if (end - code < 3) return nullptr;
         if ((code[2] & 0xFC) == 0x80) return code;
-        from = code + 1;
+        from = code + 2;
     }
     return nullptr;
 }
@@ -130,10 +132,17 @@ void coded_stream::reject_containers() const {
                             : at(0, "\0\0\1\xBA"sv)            ? "an MPEG program stream"
                             : at(0, "\x47") && at(188, "\x47") ? "an MPEG transport stream"
                                                                : nullptr;
-    if (container)
-        throw fault(input_.name(), ": ", container,
-                    " file, not an elementary stream; `ffmpeg -i FILE -c copy -an OUT.h264` (or "
-                    ".m4v, .h263) takes the video out");
+    if (!container) return;
+    if (at(0, "\x30\x26\xB2\x75"sv))
+        throw fault(
+            input_.name(),
+            ": an ASF (WMV) file; Windows Media video has no elementary streams that could be "
+            "listed (--fourcc WMV2 names a codec by its tag)");
+    const std::string file = input_.name() == "standard input" ? "FILE" : "'" + input_.name() + "'";
+    throw fault(
+        input_.name(), ": ", container,
+        " file, not an elementary stream; its video comes through a pipe: ffmpeg -v error -i ",
+        file, " -map 0:v:0 -c copy -f h264 - | simgp-probe - (MPEG-4: -f m4v, H.263: -f h263)");
 }
 
 // Says what the bytes look like instead.
@@ -150,8 +159,8 @@ void coded_stream::reject() const {
     if (units >= 2 && (place == window_.size() || units == 8))
         throw fault(
             input_.name(),
-            ": H.264 with lengths in place of start codes, as in MP4; needs ffmpeg's filter "
-            "h264_mp4toannexb");
+            ": H.264 with lengths in place of start codes, as in MP4; take it out of its file with "
+            "start codes: ffmpeg -i FILE.mp4 -c copy -an -f h264 OUT.h264");
     throw fault(input_.name(), ": no start codes of H.264, MPEG-4 or H.263 in the first ",
                 window_.size(), " bytes");
 }
@@ -193,9 +202,13 @@ bool coded_stream::find(unit &u) {
 }
 
 coded_stream::role coded_stream::role_of(const unit &u) {
-    if (media_type_ == SCMN_MT_H263) return role::picture;
+    if (media_type_ == SCMN_MT_H263) {
+        about_.add(h263_description(u.bytes, u.size));
+        return role::picture;
+    }
     if (media_type_ == SCMN_MT_H264) {
         const h264::role r = h264_.role_of(u.bytes + 3, u.size - 3);
+        about_.add(h264_.about());
         if (r == h264::role::header) return role::header;
         // Behind a header every slice is one of a new picture.
         const int type = u.bytes[3] & 31;
@@ -209,6 +222,7 @@ coded_stream::role coded_stream::role_of(const unit &u) {
         case 0xB7:
             return role::more;  // slice
         default:
+            about_.add(mpeg4_description(u.bytes, u.size));
             return role::header;
     }
 }

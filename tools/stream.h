@@ -27,6 +27,8 @@ class coded_stream {
     coded_stream(input &in, int32_t media_type);
 
     int32_t media_type() const { return media_type_; }
+    // As far as the headers up to now have said it.
+    const description &about() const { return about_; }
     // The next picture; false behind the last one.
     bool next(coded_picture &picture);
 
@@ -49,6 +51,7 @@ class coded_stream {
     input &input_;
     int32_t media_type_;
     h264 h264_;
+    description about_;
 
     std::vector<uint8_t> window_;
     uint64_t window_offset_ = 0;

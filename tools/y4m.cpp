@@ -80,6 +80,7 @@ class y4m_source : public source {
                         fail(begin, "colour space ", tag,
                              " has more than 8 bits a sample; only 8-bit video is supported");
                     shape_.format = format_of_tag(value);
+                    traits_.space = value;
                     if (!shape_.format)
                         fail(begin, "unknown colour space tag ", tag,
                              "; mono, 420, 422 and 444 are supported");
@@ -131,7 +132,10 @@ class y4m_source : public source {
     void extension(const std::string &text, int64_t at) {
         const size_t sign = text.find('=');
         const std::string key = text.substr(0, sign);
-        if (key != range_key && key != matrix_key) return;
+        if (key != range_key && key != matrix_key) {
+            traits_.extensions.push_back(text);
+            return;
+        }
         std::string value = sign == std::string::npos ? "" : text.substr(sign + 1);
         for (char &c : value) c = char(tolower(c));
         const auto &all = colours();
@@ -158,18 +162,21 @@ class y4m_source : public source {
 
 class y4m_sink : public sink {
   public:
-    y4m_sink(const std::string &path, const video_traits &traits)
-        : output_(path), traits_(traits) {}
+    y4m_sink(const destination &to, const video_traits &traits) : output_(to), traits_(traits) {}
 
     void put(const picture &p) override {
         if (frames_++ == 0) {
+            const bool same = format_of_tag(traits_.space) == &p.format();
             std::ostringstream header;
             header << "YUV4MPEG2 W" << p.width() << " H" << p.height() << " F" << traits_.rate
                    << " I" << traits_.interlacing << " A" << traits_.aspect << " C"
-                   << y4m_tag(p.format());
+                   << (same ? traits_.space : y4m_tag(p.format()));
             const colour_note &known = traits_.colour;
             if (!known.range.empty()) header << " X" << range_key << "=" << upper(known.range);
             if (!known.matrix.empty()) header << " X" << matrix_key << "=" << upper(known.matrix);
+            // FFmpeg writes the colour space a second time, as XYSCSS.
+            for (const std::string &x : traits_.extensions)
+                if (same || !x.starts_with("YSCSS=")) header << " X" << x;
             header << "\n";
             output_.write(header.str());
         }
@@ -196,8 +203,8 @@ std::unique_ptr<source> open_y4m(std::unique_ptr<input> in) {
     return std::make_unique<y4m_source>(std::move(in));
 }
 
-std::unique_ptr<sink> open_y4m_sink(const std::string &path, const video_traits &traits) {
-    return std::make_unique<y4m_sink>(path, traits);
+std::unique_ptr<sink> open_y4m_sink(const destination &to, const video_traits &traits) {
+    return std::make_unique<y4m_sink>(to, traits);
 }
 
 }  // namespace tools

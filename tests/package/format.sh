@@ -3,7 +3,7 @@
 
 command -v clang-format-14 >/dev/null || skip "clang-format-14 is missing."
 cd "$source_dir" || exit 1
-find simd simgp scmn tests tools bench examples fuzz \( -name '*.h' -o -name '*.cpp' -o -name '*.c' \) -print0 \
+find simd simgp scmn tests tools bench examples fuzz \( -name '*.h' -o -name '*.hpp' -o -name '*.cpp' -o -name '*.c' \) -print0 \
     2>/dev/null | xargs -0 clang-format-14 --dry-run -Werror 2>"$scratch/log" ||
     fault "Not formatted:" "$(grep -oE '^[^:]+:[0-9]+' "$scratch/log" | head -n 20)"
 finish
