@@ -4,6 +4,7 @@ include(CMakePackageConfigHelpers)
 
 install(TARGETS ${libraries} EXPORT simgp-targets
         LIBRARY COMPONENT runtime NAMELINK_COMPONENT dev
+        RUNTIME COMPONENT runtime
         ARCHIVE COMPONENT dev)
 foreach(header IN LISTS SIMGP_PUBLIC_HEADERS SIMGP_PUBLIC_CXX_HEADERS)
   get_filename_component(folder ${header} DIRECTORY)
@@ -35,6 +36,15 @@ else()
   set(pc_prefix "\${pcfiledir}/${up}")
   set(pc_libdir "\${prefix}/${CMAKE_INSTALL_LIBDIR}")
   set(pc_includedir "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}")
+endif()
+# On Windows the headers must know of a static library.
+set(pc_static "")
+if(WIN32)
+  if(TARGET simgp_shared)
+    set(pc_static "\nCflags.private: -DSIMGP_STATIC")
+  else()
+    set(pc_static " -DSIMGP_STATIC")
+  endif()
 endif()
 configure_file(cmake/simgp.pc.in ${PROJECT_BINARY_DIR}/simgp.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/simgp.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT dev)

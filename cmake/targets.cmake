@@ -22,12 +22,25 @@ elseif(SIMGP_VECTOR)
     message(STATUS "simgp: no vector rows for '${CMAKE_SYSTEM_PROCESSOR}', scalar rows only")
   endif()
 endif()
+include(CheckCXXCompilerFlag)
 set(sse41_flags -msse4.1)
 set(avx2_flags -mavx2)
 set(avx512_flags -mavx512f -mavx512bw -mavx512dq -mavx512vl -mavx512vbmi -mprefer-vector-width=512)
 # False warnings from the intrinsics header of GCC 12 and older.
 if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
   list(APPEND avx512_flags -Wno-uninitialized -Wno-maybe-uninitialized)
+endif()
+# Windows aligns stacks to 16 bytes, and GCC for it takes the slots where it keeps wide registers for aligned
+# (its bug 54412). The assembler then writes moves that do without. Some builds of GCC do so themselves.
+if(WIN32 AND CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND SIMGP_TARGETS)
+  set(unaligned_moves -Wa,-muse-unaligned-vector-move)
+  check_cxx_compiler_flag(${unaligned_moves} SIMGP_HAS_UNALIGNED_MOVES)
+  if(NOT SIMGP_HAS_UNALIGNED_MOVES)
+    message(FATAL_ERROR "simgp: the assembler is too old for AVX2 on Windows (binutils 2.38 has what it takes). "
+                        "Set SIMGP_VECTOR to OFF, or take another one.")
+  endif()
+  list(APPEND avx2_flags ${unaligned_moves})
+  list(APPEND avx512_flags ${unaligned_moves})
 endif()
 message(STATUS "simgp: vector rows for: ${SIMGP_TARGETS}")
 

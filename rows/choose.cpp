@@ -1,7 +1,12 @@
 // The choice of the instruction set: the one place that looks at the processor.
 #include "rows/choose.h"
 
+#if defined(_WIN32)
+#define WIN32_LEAN_AND_MEAN
+#include <windows.h>
+#else
 #include <sched.h>
+#endif
 
 #include <atomic>
 
@@ -125,6 +130,12 @@ void fill_tables() {
 #undef FILL
 #undef OFFER
 
+#if defined(_WIN32)
+void give_way() { SwitchToThread(); }
+#else
+void give_way() { sched_yield(); }
+#endif
+
 // As large as an int: some processors have no atomic exchange of less, and GCC calls a library.
 enum class progress : int { none, filling, done };
 std::atomic<progress> tables_are{progress::none};
@@ -137,7 +148,7 @@ void ensure_tables() {
         tables_are.store(now = progress::done, std::memory_order_release);
     }
     while (now != progress::done) {
-        sched_yield();
+        give_way();
         now = tables_are.load(std::memory_order_acquire);
     }
 }

@@ -3,8 +3,15 @@
 #define SIMGP_EXPORT_H
 
 /* The library is built with hidden visibility: a function leaves it only if its declaration carries
- * SIMGP_API and its name stands in the list that drives the linker (cmake/exports.txt). */
-#if defined(__GNUC__)
+ * SIMGP_API and its name stands in the list that drives the linker (cmake/exports.txt).
+ *
+ * On Windows, programs take the functions and tables from the DLL, and those that link to the
+ * static library define SIMGP_STATIC. The packages for CMake and pkg-config see to it. */
+#if defined(_WIN32) && defined(SIMGP_STATIC)
+#define SIMGP_API
+#elif defined(_WIN32)
+#define SIMGP_API __declspec(dllimport)
+#elif defined(__GNUC__)
 #define SIMGP_API __attribute__((visibility("default")))
 #else
 #define SIMGP_API

@@ -170,7 +170,8 @@ template <const format &From>
 class fused {
     static constexpr bool tiled = From.kind == format_kind::tiled;
     static constexpr int chroma_planes = From.u == From.v ? 1 : 2;
-    static constexpr ptrdiff_t memory_size = 10240;
+    // With the frames of rows, some of which keep ten vector registers for Windows, less than 16 KiB.
+    static constexpr ptrdiff_t memory_size = 10112;
     // Whose rows convert it.
     static constexpr const format &like = tiled ? formats::NV12 : From;
 

@@ -3,15 +3,10 @@
 #ifndef TESTS_GUARD_H
 #define TESTS_GUARD_H
 
-#include <stddef.h>
-#include <stdint.h>
-#include <sys/mman.h>
-#include <unistd.h>
-
-#include <cstdio>
-#include <cstdlib>
 #include <utility>
 #include <vector>
+
+#include "tests/pages.h"
 
 namespace rig {
 
@@ -65,8 +60,7 @@ class guarded {
 
     // Regions are kept: mapping two for every call would take most of a test's time.
     static region take(size_t size) {
-        const size_t page = size_t(sysconf(_SC_PAGESIZE));
-        size_t needed = 4 * page;
+        size_t needed = 4 * page_size();
         while (needed < size) needed *= 2;
         auto &regions = spare();
         for (size_t i = 0; i < regions.size(); i++) {
@@ -76,13 +70,7 @@ class guarded {
             regions.pop_back();
             return found;
         }
-        void *all = mmap(nullptr, needed + 2 * page, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-        uint8_t *begin = static_cast<uint8_t *>(all) + page;
-        if (all == MAP_FAILED || mprotect(begin, needed, PROT_READ | PROT_WRITE)) {
-            perror("guarded memory");
-            abort();
-        }
-        return {begin, needed};
+        return {pages_between_inaccessible_ones(needed), needed};
     }
 
     region memory_;

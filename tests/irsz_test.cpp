@@ -1,6 +1,5 @@
 // The line-based resizer: kernels, whole pictures and bands of any size against the filter in plain
 // integers.
-#include <malloc.h>
 #include <string.h>
 
 #include <algorithm>
@@ -485,7 +484,7 @@ TEST(irsz, creation) {
             EXPECT_EQ(r->dst, pixel);
             EXPECT_EQ(r->line_buf != nullptr, mode == SCMN_IRSZ_LINE);
             EXPECT_TRUE(!r->line_buf ||
-                        malloc_usable_size(r->line_buf) >= size_t(640 * k.src_bytes));
+                        rig::size_of_block(r->line_buf) >= size_t(640 * k.src_bytes));
             scmn_irsz_delete(r);
             EXPECT_TRUE(watched.live.empty());
         }

@@ -1,7 +1,6 @@
 #include "scmn/mem.h"
 
 #include <gtest/gtest.h>
-#include <malloc.h>
 #include <string.h>
 
 #include <algorithm>
@@ -24,7 +23,7 @@ TEST(mem, aligned_blocks) {
                 memcpy(&raw, p - sizeof raw, sizeof raw);
                 EXPECT_GE(p - raw, ptrdiff_t(sizeof raw));
                 EXPECT_LE(p - raw, ptrdiff_t(31 + sizeof raw));
-                EXPECT_GE(malloc_usable_size(raw), size + 32 + sizeof raw);
+                EXPECT_GE(rig::size_of_block(raw), size + 32 + sizeof raw);
                 memset(p, 1, size);
                 give(p);
             }

@@ -1,7 +1,5 @@
 #include "tests/rig.h"
 
-#include <signal.h>
-
 #include <algorithm>
 #include <cstring>
 
@@ -40,32 +38,6 @@ uint64_t number_from(const char *variable, uint64_t otherwise) {
 
 // What the drivers run now, for a program that ends at an inaccessible page.
 char running[512] = "";
-
-void say_what_runs() {
-    const char *text[] = {"\nfault in: ", *running ? running : "no driver of the rig", "\n"};
-    for (const char *t : text)
-        if (write(STDERR_FILENO, t, strlen(t)) < 0) break;
-}
-
-#ifdef RIG_ASAN
-void watch_faults() {}  // AddressSanitizer does, see the end of this file
-#else
-void report_fault(int number) {
-    say_what_runs();
-    signal(number, SIG_DFL);  // the instruction is tried again and ends the program
-}
-
-void watch_faults() {
-    static const bool watching = [] {
-        struct sigaction action = {};
-        action.sa_handler = report_fault;
-        sigaction(SIGSEGV, &action, nullptr);
-        sigaction(SIGBUS, &action, nullptr);
-        return true;
-    }();
-    (void)watching;
-}
-#endif
 
 constexpr size_t reach = 128;  // bytes that are watched on either side of a destination
 
@@ -410,7 +382,7 @@ std::string complaint;
 void complain(const std::string &fault) { complaint = fault; }
 
 std::string fault_of(const std::string &what_runs, const job &j, const setting &how) {
-    watch_faults();
+    report_faults(running);
     picture src(j.src, how.src), expected(j.dst, how.dst), got(j.dst, how.dst);
     how.fill(src);
     if (j.season) j.season(src);
@@ -600,11 +572,3 @@ bool check_plane_fn(const std::string &name, simgp_plane_fn *kernel, int src_sam
 }
 
 }  // namespace rig
-
-#ifdef RIG_ASAN
-// The sanitizers call these when they have found something.
-extern "C" void __asan_on_error();
-extern "C" void __ubsan_on_report();
-void __asan_on_error() { rig::say_what_runs(); }
-void __ubsan_on_report() { rig::say_what_runs(); }
-#endif

@@ -21,7 +21,11 @@ backward=$(grep -rIlF -e "$source_dir" -e "$build_dir" "$prefix")
 # Each component has what its name says, and together they are everything.
 files() { (cd "$scratch/$1" && find . ! -type d | sort); }
 for component in runtime dev tools; do install_to $component --component $component; done
-expected='libsimgp\.so\.[0-9.]*$'
+expected='libsimgp\.so\.[0-9.]*$' suffix=
+if [ "$library_kind" = PE ]; then
+    expected='bin/libsimgp-1\.dll$' suffix=.exe
+    export WINEPATH=Z:$prefix/bin # where programs find the DLL
+fi
 [ -n "$(files runtime)" ] && ! files runtime | grep -vqE "/$expected" || fault "Component runtime has:" "$(files runtime)"
 ! files dev | grep -qE "/bin/|/$expected" || fault "Component dev has:" "$(files dev)"
 [ "$(files tools | xargs -rn 1 basename | xargs)" = "$(xargs <<<"$tools ${tools:+simgp.py}")" ] ||
@@ -52,17 +56,18 @@ configure_user user && "$cmake" --build "$scratch/user" >>"$scratch/log" 2>&1 ||
 }
 for program in user_shared user_static road; do
     # shellcheck disable=SC2086
-    $emulator "$scratch/user/$program" >/dev/null || fault "$program, built with find_package, failed."
+    $emulator "$scratch/user/$program$suffix" >/dev/null || fault "$program, built with find_package, failed."
 done
 configure_user refused -DCOMPONENTS=nonsense && fault "The package has a component 'nonsense'."
 
 if command -v pkg-config >/dev/null; then
     PKG_CONFIG_PATH=$(dirname "$(find "$prefix" -name simgp.pc)")
     export PKG_CONFIG_PATH PKG_CONFIG_LIBDIR=$PKG_CONFIG_PATH
+    [ "$library_kind" = PE ] && rpath= || rpath=-Wl,-rpath,
     libdir=$(pkg-config --variable=libdir simgp)
     # shellcheck disable=SC2046,SC2086
-    "$cc" $c_flags -std=c11 "$user/user.c" -o "$scratch/user_pkg" $(pkg-config --cflags --libs simgp) \
-        -Wl,-rpath,"$libdir" && $emulator "$scratch/user_pkg" ||
+    "$cc" $c_flags -std=c11 "$user/user.c" -o "$scratch/user_pkg$suffix" $(pkg-config --cflags --libs simgp) \
+        ${rpath:+"$rpath$libdir"} && $emulator "$scratch/user_pkg$suffix" ||
         fault "The program built with pkg-config failed."
 else
     fault "pkg-config is missing."

@@ -7,7 +7,7 @@ limit=16384
 frames() {
     local object
     for object in "$@"; do
-        local usage=${object%.o}.su
+        local usage=${object%.*}.su
         [ -f "$usage" ] || usage=${object}.su
         [ -f "$usage" ] || { echo "0 missing ${object#"$build_dir"/}"; continue; }
         awk -F '\t' '{ print $2, $3, $1 }' "$usage"
