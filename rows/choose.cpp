@@ -30,12 +30,26 @@ namespace avx512 { SIMGP_AREAS(DECLARE) }
 #undef DECLARE
 // clang-format on
 
-namespace {
+#if defined(__x86_64__) || defined(__i386__)
 
-struct cpu {
-    bool neon = false, sse41 = false, avx2 = false, avx512 = false;
-    bool fast_strings = false;  // x86: ERMS
-};
+cpu features_of(const cpuid_words &w) {
+    const uint32_t saved = w.leaf1_ecx & bit_OSXSAVE ? w.saved_states : 0;
+    const bool saves_ymm = (saved & 0x06) == 0x06;  // SSE and AVX state
+    const bool saves_zmm = (saved & 0xE6) == 0xE6;  // and opmask, upper halves, upper registers
+    // The byte permutes (VBMI) came with the second generation, which no longer slows down for wide
+    // integer code: the first generation is better served by AVX2.
+    const uint32_t needed = bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL;
+    cpu has;
+    has.sse41 = w.leaf1_ecx & bit_SSE4_1;
+    has.avx2 = saves_ymm && (w.leaf7_ebx & bit_AVX2);
+    has.avx512 = saves_zmm && (w.leaf7_ebx & needed) == needed && (w.leaf7_ecx & bit_AVX512VBMI);
+    has.fast_strings = w.leaf7_ebx & 1u << 9;
+    return has;
+}
+
+#endif
+
+namespace {
 
 #if defined(__x86_64__) || defined(__i386__)
 
@@ -48,21 +62,12 @@ uint32_t saved_states() {
 }
 
 cpu detect() {
-    cpu has;
+    cpuid_words w;
     uint32_t a, b, c, d;
-    if (!__get_cpuid(1, &a, &b, &c, &d)) return has;
-    has.sse41 = c & bit_SSE4_1;
-    const uint32_t saved = c & bit_OSXSAVE ? saved_states() : 0;
-    const bool saves_ymm = (saved & 0x06) == 0x06;  // SSE and AVX state
-    const bool saves_zmm = (saved & 0xE6) == 0xE6;  // and opmask, upper halves, upper registers
-    if (!__get_cpuid_count(7, 0, &a, &b, &c, &d)) return has;
-    has.fast_strings = b & 1u << 9;
-    has.avx2 = saves_ymm && (b & bit_AVX2);
-    // The byte permutes (VBMI) came with the second generation, which no longer slows down for wide
-    // integer code: the first generation is better served by AVX2.
-    const uint32_t needed = bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL;
-    has.avx512 = saves_zmm && (b & needed) == needed && (c & bit_AVX512VBMI);
-    return has;
+    if (__get_cpuid(1, &a, &b, &c, &d)) w.leaf1_ecx = c;
+    if (w.leaf1_ecx & bit_OSXSAVE) w.saved_states = saved_states();
+    if (__get_cpuid_count(7, 0, &a, &b, &c, &d)) w.leaf7_ebx = b, w.leaf7_ecx = c;
+    return features_of(w);
 }
 
 #elif defined(__arm__)

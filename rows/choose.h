@@ -11,6 +11,18 @@ enum class target : uint8_t { scalar, neon, sse41, avx2, avx512, count };
 
 const char *target_name(target t);
 
+// What a processor offers, with its operating system.
+struct cpu {
+    bool neon = false, sse41 = false, avx2 = false, avx512 = false;
+    bool fast_strings = false;  // x86: ERMS
+};
+
+// x86: what the instruction CPUID says, and the register states that the operating system saves (XCR0).
+struct cpuid_words {
+    uint32_t leaf1_ecx = 0, leaf7_ebx = 0, leaf7_ecx = 0, saved_states = 0;
+};
+cpu features_of(const cpuid_words &words);
+
 // Compiled into this build, and offered by the processor and the operating system.
 bool target_available(target t);
 

@@ -96,7 +96,7 @@ class writer {
 
     int32_t write(uint32_t value, int n) {
         if (cur >= bytes.size()) return -1;
-        for (int i = n - 1; i >= 0; i--) {
+        for (int i = std::min(n, 32) - 1; i >= 0; i--) {
             if (cur >= bytes.size()) return -1;
             bytes[cur] = uint8_t(2 * bytes[cur] + (value >> i & 1));
             if (--free_bits == 0) {
@@ -222,7 +222,8 @@ std::string compare_writer(const std::vector<uint8_t> &before, Pick pick, int op
             trace << " write1(" << value << ")";
             expected = model.write(value & 1, 1), got = scmn_bsw_write1(&ctx, value);
         } else {
-            const int n = int(pick(0, 33)) - 1;
+            int n = int(pick(0, 34)) - 1;
+            if (n > 32) n = int(pick(33, 0x7FFFFFFF));
             trace << " write(" << value << ", " << n << ")";
             expected = model.write(value, n), got = scmn_bsw_write(&ctx, value, n);
         }

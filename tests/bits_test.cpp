@@ -134,11 +134,90 @@ TEST(bits, refills) {
     }
 }
 
+// Whatever a refill returns, other than 0, is the end; what it left in the context is lost.
+TEST(bits, refills_fail_with_any_value) {
+    for (const int32_t result : {1, -1, 2, INT32_MAX, INT32_MIN}) {
+        static int32_t answer;
+        answer = result;
+        const auto failing = [](scmn_bsr_ctx *ctx, int32_t) {
+            ctx->cache = 0, ctx->bits = 0;
+            return answer;
+        };
+        const auto after_4_bits = [&](uint32_t cache) {
+            scmn_bsr_ctx ctx;
+            scmn_bsr_init(&ctx, nullptr, 0, failing);
+            ctx.cache = cache, ctx.bits = 4;
+            return ctx;
+        };
+        scmn_bsr_ctx ctx = after_4_bits(0xA0000000);
+        EXPECT_EQ(scmn_bsr_read(&ctx, 5), 0xFFFFFFFFu);
+        ctx.bits = 0;
+        EXPECT_EQ(scmn_bsr_read1(&ctx), 0xFFFFFFFFu);
+        ctx = after_4_bits(0xA0000000);
+        scmn_bsr_skip(&ctx, 5);
+        EXPECT_EQ(ctx.bits, 0);
+        ctx = after_4_bits(0xA0000000);
+        EXPECT_EQ(scmn_bsr_skip_peek(&ctx, 5, 3), 0u);
+        EXPECT_EQ(ctx.bits, 0);
+        ctx = after_4_bits(0xA0000000);
+        EXPECT_EQ(scmn_bsr_peek(&ctx, 8), 0xA0u);
+        EXPECT_EQ(ctx.bits, 4);
+        ctx = after_4_bits(0xA);
+        EXPECT_EQ(scmn_bsr_le_read(&ctx, 5), 0xFFFFFFFFu);
+        EXPECT_EQ(ctx.bits, 0);
+    }
+}
+
+// Counts that make no sense do no harm: nothing is touched outside the buffer.
+TEST(bits, impossible_counts_are_harmless) {
+    const int32_t counts[] = {INT32_MIN, INT32_MIN + 1, -33, -32, -1, 33, 40, 64, INT32_MAX};
+    const rig::guarded buffer(7);
+    std::fill(buffer.data(), buffer.end(), uint8_t(0x5A));
+    for (int32_t n : counts)
+        for (int32_t before = 0; before <= 56; before += 7)
+            for (int operation = 0; operation < 7; operation++) {
+                const bool msb = operation < 5;
+                scmn_bsr_ctx ctx;
+                scmn_bsr_init(&ctx, buffer.data(), 7, msb ? nullptr : scmn_bsr_le_flush);
+                for (int i = 0; i < before; i += 7)
+                    msb ? scmn_bsr_read(&ctx, 7) : scmn_bsr_le_read(&ctx, 7);
+                for (int again = 0; again < 3; again++) switch (operation) {
+                        case 0:
+                            scmn_bsr_read(&ctx, n);
+                            break;
+                        case 1:
+                            scmn_bsr_skip(&ctx, n);
+                            break;
+                        case 2:
+                            scmn_bsr_peek(&ctx, n);
+                            break;
+                        case 3:
+                            scmn_bsr_skip_peek(&ctx, n, 8);
+                            break;
+                        case 4:
+                            scmn_bsr_skip_peek(&ctx, 8, n);
+                            break;
+                        case 5:
+                            scmn_bsr_le_read(&ctx, n);
+                            break;
+                        default:
+                            scmn_bsr_le_skip(&ctx, n);
+                    }
+                EXPECT_GE(ctx.cur, buffer.data());
+                EXPECT_LE(ctx.cur, buffer.end());
+                // What was lost is not found again, and initialising heals.
+                msb ? scmn_bsr_skip_to_align8(&ctx) : scmn_bsr_le_skip_to_align8(&ctx);
+                scmn_bsr_init(&ctx, buffer.data(), 7, nullptr);
+                EXPECT_EQ(scmn_bsr_read(&ctx, 8), 0x5Au);
+            }
+}
+
 // A refill of the caller may go on in another buffer: a chain of buffers reads like one.
 struct chained : scmn_bsr_ctx {
     std::vector<std::vector<uint8_t>> links;
     size_t next = 0;
     int asked_too_much = 0;
+    order bit_order = order::msb_first;
 };
 
 int32_t chain_refill(scmn_bsr_ctx *ctx, int32_t nbytes) {
@@ -157,7 +236,8 @@ int32_t chain_refill(scmn_bsr_ctx *ctx, int32_t nbytes) {
     }
     scmn_bsr_ctx copy;
     scmn_bsr_init(&copy, bytes, count, nullptr);
-    const int32_t result = scmn_bsr_flush(&copy, nbytes);
+    const int32_t result =
+        (chain->bit_order == order::msb_first ? scmn_bsr_flush : scmn_bsr_le_flush)(&copy, nbytes);
     ctx->cache = copy.cache;
     ctx->bits = copy.bits;
     return result;
@@ -168,6 +248,8 @@ TEST(bits, a_refill_may_chain_buffers) {
         rig::rng random(rig::seed() + uint64_t(round) * 1000);
         const random_pick pick{random};
         chained ctx;
+        const bool msb = round % 2;
+        ctx.bit_order = msb ? order::msb_first : order::lsb_first;
         std::vector<uint8_t> all;
         for (uint32_t i = pick(1, 9); i > 0; i--) {
             std::vector<uint8_t> link(pick(1, 7));
@@ -175,14 +257,14 @@ TEST(bits, a_refill_may_chain_buffers) {
             ctx.links.push_back(link);
         }
         scmn_bsr_init(&ctx, ctx.links[0].data(), 0, chain_refill);
-        bit_model::reader model(all.data(), int64_t(all.size()), order::msb_first);
+        bit_model::reader model(all.data(), int64_t(all.size()), ctx.bit_order);
         // Peeks borrow from the byte at cur only, so at the seam of two links they see less.
         while (model.bits() > 0 || model.loaded() < int64_t(all.size())) {
             const int n = int(pick(0, 32));
-            if (pick(0, 1)) {
+            if (msb && pick(0, 1)) {
                 model.skip(n), scmn_bsr_skip(&ctx, n);
             } else {
-                ASSERT_EQ(scmn_bsr_read(&ctx, n), model.read(n))
+                ASSERT_EQ((msb ? scmn_bsr_read : scmn_bsr_le_read)(&ctx, n), model.read(n))
                     << "round " << round << " of seed " << rig::seed();
             }
             ASSERT_EQ(ctx.bits, model.bits()) << "round " << round << " of seed " << rig::seed();

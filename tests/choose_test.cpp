@@ -1,8 +1,12 @@
 // The choice of the instruction set.
 #include "rows/choose.h"
 
+#include <sys/auxv.h>
+
 #include <atomic>
 #include <cstdlib>
+#include <fstream>
+#include <sstream>
 #include <thread>
 
 #include "tests/rig.h"
@@ -35,18 +39,96 @@ TEST(choice, threads_that_race_for_the_first_call_agree) {
     }
 }
 
+// What the kernel says of the processor, which it finds out in its own way. An emulated processor is
+// not the one in /proc/cpuinfo.
+target best_of_the_kernel() {
+    const auto flagged = [](const char *flag) {
+        std::ifstream info("/proc/cpuinfo");
+        std::string word, line;
+        while (std::getline(info, line))
+            if (line.rfind("flags", 0) == 0) {
+                std::istringstream words(line);
+                while (words >> word)
+                    if (word == flag) return true;
+                return false;
+            }
+        return false;
+    };
+    (void)flagged;
+#ifdef SIMGP_HAVE_avx512
+    bool all = true;
+    for (const char *flag : {"avx512f", "avx512bw", "avx512dq", "avx512vl", "avx512vbmi"})
+        all = all && flagged(flag);
+    if (all) return target::avx512;
+#endif
+#ifdef SIMGP_HAVE_avx2
+    if (flagged("avx2")) return target::avx2;
+#endif
+#ifdef SIMGP_HAVE_sse41
+    if (flagged("sse4_1")) return target::sse41;
+#endif
+#ifdef SIMGP_HAVE_neon
+    if (sizeof(void *) == 8 || (getauxval(AT_HWCAP) & 1u << 12)) return target::neon;
+#endif
+    return target::scalar;
+}
+
 TEST(choice, is_the_best_that_the_processor_has) {
     EXPECT_TRUE(simgp::target_available(target::scalar));
     EXPECT_EQ(simgp::live_target(), best_available());
-    printf("live rows: %s\n", simgp::target_name(simgp::live_target()));
-}
-
-TEST(choice, is_the_expected_one) {
-    const char *expected = getenv("SIMGP_TEST_EXPECT_TARGET");
+    const char *const live = simgp::target_name(simgp::live_target());
+    printf("live rows: %s\n", live);
+    const char *const expected = getenv("SIMGP_TEST_EXPECT_TARGET");
+    const char *const emulator = getenv("SIMGP_EMULATE");
     if (expected && *expected) {
-        EXPECT_STREQ(simgp::target_name(simgp::live_target()), expected);
+        EXPECT_STREQ(live, expected);
+    } else if (!emulator || !*emulator) {
+        EXPECT_STREQ(live, simgp::target_name(best_of_the_kernel()));
     }
 }
+
+// Each bit that a target needs is looked at: without it the processor has the next lower one.
+#if defined(__x86_64__) || defined(__i386__)
+TEST(choice, follows_the_words_of_the_processor) {
+    constexpr uint32_t sse41 = 1u << 19, osxsave = 1u << 27;                         // leaf 1, ECX
+    constexpr uint32_t avx2 = 1u << 5, erms = 1u << 9, f = 1u << 16, dq = 1u << 17;  // leaf 7, EBX
+    constexpr uint32_t bw = 1u << 30, vl = 1u << 31, vbmi = 1u << 1;                 // and ECX
+    constexpr uint32_t all7 = avx2 | erms | f | dq | bw | vl;
+    const struct {
+        simgp::cpuid_words words;
+        const char *has;
+    } cases[] = {
+        {{0, 0, 0, 0}, ""},
+        {{~sse41, ~0u, ~0u, ~0u}, "avx2 avx512 erms "},
+        {{sse41, 0, 0, 0}, "sse41 "},
+        {{sse41, erms, 0, 0}, "sse41 erms "},
+        {{sse41, ~0u, ~0u, ~0u}, "sse41 erms "},  // without OSXSAVE no word of saved states
+        {{sse41 | osxsave, avx2, 0, 6}, "sse41 avx2 "},
+        {{sse41 | osxsave, avx2, 0, 2}, "sse41 "},
+        {{sse41 | osxsave, avx2, 0, 4}, "sse41 "},
+        {{sse41 | osxsave, ~avx2, 0, 6}, "sse41 erms "},
+        {{sse41 | osxsave, all7, vbmi, 0xE6}, "sse41 avx2 avx512 erms "},
+        {{sse41 | osxsave, all7, vbmi, 0xE7}, "sse41 avx2 avx512 erms "},
+        {{sse41 | osxsave, all7, vbmi, 0x66}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7, vbmi, 0xA6}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7, vbmi, 0xC6}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7, vbmi, 0xE2}, "sse41 erms "},
+        {{sse41 | osxsave, all7, ~vbmi, 0xE6}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7 & ~f, vbmi, 0xE6}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7 & ~dq, vbmi, 0xE6}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7 & ~bw, vbmi, 0xE6}, "sse41 avx2 erms "},
+        {{sse41 | osxsave, all7 & ~vl, vbmi, 0xE6}, "sse41 avx2 erms "},
+    };
+    for (const auto &c : cases) {
+        const simgp::cpu has = simgp::features_of(c.words);
+        EXPECT_FALSE(has.neon);
+        EXPECT_EQ(std::string(has.sse41 ? "sse41 " : "") + (has.avx2 ? "avx2 " : "") +
+                      (has.avx512 ? "avx512 " : "") + (has.fast_strings ? "erms " : ""),
+                  c.has)
+            << &c - cases;
+    }
+}
+#endif
 
 TEST(choice, can_be_forced_and_given_back) {
     for (const rig::target_rows &t : rig::all_targets()) {

@@ -138,6 +138,18 @@ TEST_F(convert_test, raw_files_of_every_yuv_format_keep_the_bars) {
     EXPECT_EQ(read("by_ending.YUY2"), read("own.yuyv"));
 }
 
+// What a raw file holds is what was drawn, pixel for pixel, at sizes that end in every part of a group,
+// a tile and a group of tiles.
+TEST_F(convert_test, raw_files_of_every_format_come_back_at_every_size) {
+    for (const pixel_format &format : tools::formats())
+        for (const std::string size : {"1x1", "3x33", "300x70"}) {
+            const std::string name(format.name), card = "testcard:" + size + " -q -f " + name;
+            good(card + " -o card." + name + " && $C card." + name + " -q -o read.ppm -s " + size +
+                 " && $C " + card + " -o drawn.ppm");
+            EXPECT_EQ(read("read.ppm"), read("drawn.ppm")) << name << size;
+        }
+}
+
 TEST_F(convert_test, every_rgb_format_has_the_bars_and_widens_to_full_white) {
     for (const pixel_format *format : formats(true)) {
         const std::string name(format->name);
@@ -216,6 +228,14 @@ TEST_F(convert_test, y4m_of_every_layout_comes_from_files_and_pipes) {
               "simgp-convert: note: yuv444 holds chroma as if it lay on the first pixel, not as "
               "420paldv says\n");
     EXPECT_EQ(read("kept.y4m").find("YUV4MPEG2 W33 H17 F25:1 Ip A1:1 C444 XA=b\nFRAME\n"), 0u);
+    // Without a colour space it is 4:2:0, of whatever siting; headers may be long.
+    for (const std::string tags : {"", " C420", " C420paldv", " C420jpeg", " "})
+        for (const size_t longer : {0, 900}) {
+            write("tags.y4m", "YUV4MPEG2 H17 W33" + tags + " X" + std::string(longer, 'x') + "\n" +
+                                  video.substr(header));
+            good("tags.y4m -o plain.yuv420 && $C yuv420.y4m -o expected.yuv420");
+            EXPECT_EQ(read("plain.yuv420"), read("expected.yuv420")) << tags;
+        }
 }
 
 TEST_F(convert_test, stills_come_one_by_one_or_numbered) {
@@ -268,6 +288,21 @@ TEST_F(convert_test, what_a_format_cannot_hold_is_said_once) {
     EXPECT_LT(difference(png("a.png"), png("b.png")), 8);
 }
 
+// 16-bit samples are rounded to 8 bits; alpha is read where it is asked for.
+TEST_F(convert_test, png_of_16_bits) {
+    const uint8_t deep[] = {0x89, 0x50, 0x4e, 0x47, 0x0d, 0x0a, 0x1a, 0x0a, 0x00, 0x00, 0x00, 0x0d,
+                            0x49, 0x48, 0x44, 0x52, 0x00, 0x00, 0x00, 0x02, 0x00, 0x00, 0x00, 0x01,
+                            0x10, 0x02, 0x00, 0x00, 0x00, 0x2b, 0xd0, 0x34, 0x9e, 0x00, 0x00, 0x00,
+                            0x15, 0x49, 0x44, 0x41, 0x54, 0x78, 0xda, 0x63, 0x60, 0x60, 0xf8, 0xff,
+                            0xbf, 0xa1, 0x9e, 0x91, 0xa9, 0xfe, 0xff, 0x3f, 0x06, 0x00, 0x21, 0x78,
+                            0x05, 0x7d, 0xf8, 0xf8, 0x1e, 0x43, 0x00, 0x00, 0x00, 0x00, 0x49, 0x45,
+                            0x4e, 0x44, 0xae, 0x42, 0x60, 0x82};  // 0000 FFFF 807F, 0102 7FFF FE00
+    write("deep.png", std::string(reinterpret_cast<const char *>(deep), sizeof deep));
+    good("deep.png -o flat.rgb888 && $C deep.png -f rgba8888 -o flat.rgba8888");
+    EXPECT_EQ(read("flat.rgb888"), std::string("\x00\xff\x80\x01\x7f\xfd", 6));
+    EXPECT_EQ(read("flat.rgba8888"), std::string("\x00\xff\x80\xff\x01\x7f\xfd\xff", 8));
+}
+
 TEST_F(convert_test, several_frames_become_numbered_files_or_a_sheet) {
     good("testcard:64x48@12 -o a%%-%03d.png");
     std::set<std::string> expected;
@@ -285,8 +320,36 @@ TEST_F(convert_test, several_frames_become_numbered_files_or_a_sheet) {
     for (int y = 0; y < 48; ++y)
         ASSERT_EQ(memcmp(sheet.sample(0, 8, top + y), first.line(0, y), 64 * 3), 0) << "line " << y;
 
-    good("testcard:64x48@200 -o long.ppm --sheet");
-    EXPECT_LT(read("long.ppm").size(), 64 * (64 + 8) * (48 + 19) * 3u + 50000);
+    // Of more than 64 frames every second is shown, of more than 128 every fourth.
+    for (const int count : {64, 65, 128, 129}) {
+        const int every = (count + 63) / 64 == 3 ? 4 : (count + 63) / 64;
+        good("testcard:64x48@" + std::to_string(count) + " -o long.png --sheet --columns 64");
+        const picture strip = png("long.png");
+        const int shown = (count + every - 1) / every;
+        ASSERT_EQ(strip.width(), shown * (64 + 8) + 8) << count;
+        good("testcard:64x48@" + std::to_string(count) + " -o b%d.png");
+        for (int k : {0, 1, shown - 1}) {
+            const picture frame = png("b" + std::to_string(k * every) + ".png");
+            for (int y = 0; y < 48; ++y)
+                ASSERT_EQ(memcmp(strip.sample(0, 8 + k * (64 + 8), strip.height() - 8 - 48 + y),
+                                 frame.line(0, y), 64 * 3),
+                          0)
+                    << count << ", picture " << k;
+        }
+    }
+    // Large pictures are reduced to the means of squares, the last of which may be smaller.
+    good("testcard:650x100 -o large.png && $C testcard:650x100 -o reduced.png --sheet");
+    const picture large = png("large.png"), reduced = png("reduced.png");
+    ASSERT_EQ(reduced.width(), 650 / 3 + 16);
+    int wrong = 0;
+    for (int y = 0; y < 33; ++y)
+        for (int x = 0; x < 216; ++x)
+            for (int c = 0; c < 3; ++c) {
+                int sum = 0;
+                for (int k = 0; k < 9; ++k) sum += *large.sample(c, 3 * x + k % 3, 3 * y + k / 3);
+                wrong += *reduced.sample(c, 8 + x, reduced.height() - 8 - 33 + y) != (sum + 4) / 9;
+            }
+    EXPECT_EQ(wrong, 0);
 }
 
 // Where pixel (x, y) of a picture of w x h goes (simgp/rotate.h).
@@ -586,6 +649,13 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
     header("zero.y4m", "W0 H4");
     header("negative.y4m", "W4 H-4");
     header("nowidth.y4m", "H4");
+    header("number.y4m", "W4x H4");
+    header("nonumber.y4m", "W H4");
+    header("mono.y4m", "W4 H4 Cmono16");
+    header("range.y4m", "W4 H4 XCOLORRANGE=HALF");
+    write("magic.y4m", "YUV4MPEG2x W4 H4\nFRAME\n");
+    write("framex.y4m", "YUV4MPEG2 W4 H4 Cmono\nFRAMEx\n" + std::string(16, 'x'));
+    write("long.y4m", "YUV4MPEG2 W4 H4 X" + std::string(3000, 'x') + "\nFRAME\n");
     write("none.y4m", "YUV4MPEG2 W4 H4\n");
     write("endless.y4m", "YUV4MPEG2 W4 H4 X" + std::string(5000, 'x'));
     const std::set<std::string> before = files();
@@ -618,6 +688,14 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"big.y4m -o o.png", "big.y4m: byte 0: Y4M header: impossible size 65535x65535", 1},
         {"zero.y4m -o o.png", "impossible size 0x4", 1},
         {"negative.y4m -o o.png", "impossible size 4x-4", 1},
+        {"number.y4m -o o.png", "number.y4m: byte 10: '4x' is not a number", 1},
+        {"nonumber.y4m -o o.png", "nonumber.y4m: byte 10: '' is not a number", 1},
+        {"mono.y4m -o o.png", "mono.y4m: byte 16: colour space Cmono16 has more than 8 bits", 1},
+        {"range.y4m -o o.png", "range.y4m: byte 16: unknown colour in tag XCOLORRANGE=HALF", 1},
+        {"magic.y4m -o o.png", "magic.y4m: ", 1},
+        {"framex.y4m -o o.png", "framex.y4m: frame 0, byte 22: no FRAME line", 1},
+        {"long.y4m -o o.png", "long.y4m: byte 0: the Y4M header has no end", 1},
+        {"good.png -f yuv420 -o o.raw", "good.png: a PNG picture comes as rgb888 or rgba8888", 1},
         {"nowidth.y4m -o o.png", "nowidth.y4m: byte 0: the Y4M header lacks W", 1},
         {"none.y4m -o o.png", "none.y4m: holds no frame", 1},
         {"none.y4m -o o.png --sheet", "none.y4m: holds no frame", 1},
@@ -698,14 +776,52 @@ TEST_F(convert_test, broken_pipes_full_disks_and_interruptions_end_cleanly) {
     EXPECT_EQ(shell("$C testcard:320x240@100 -o - | head -c 10 >/dev/null; exit ${PIPESTATUS[0]}"),
               1);
     EXPECT_NE(got.err.find("standard output: Broken pipe"), std::string::npos) << got.err;
-    if (fs::exists("/dev/full")) {
-        EXPECT_EQ(run("testcard:320x240@2 -o /dev/full"), 1);
-        EXPECT_NE(got.err.find("/dev/full: No space left"), std::string::npos) << got.err;
+    if (fs::exists("/dev/full"))
+        for (const std::string size : {"4x4", "320x240"}) {  // at the end, and on the way
+            EXPECT_EQ(run("testcard:" + size + " -o /dev/full"), 1);
+            EXPECT_NE(got.err.find("/dev/full: No space left"), std::string::npos) << got.err;
+            EXPECT_EQ(run("testcard:" + size + " -o - >/dev/full"), 1);
+            EXPECT_NE(got.err.find("standard output: No space left"), std::string::npos) << got.err;
+        }
+    // The unfinished file lies beside the one that it will be, and goes with the program.
+    fs::create_directory(at("sub"));
+    for (const auto &[name, number] : {std::pair("INT", 2), {"TERM", 15}, {"HUP", 1}}) {
+        EXPECT_EQ(shell("$C testcard:640x480@1000000 -q -o sub/long.raw & for i in {1..500}; do "
+                        "ls -A sub | grep . && break; sleep 0.02; done; kill -" +
+                        std::string(name) + " $!; wait $!"),
+                  128 + number);
+        EXPECT_EQ(got.out.rfind(".long.raw.", 0), 0u) << "it was over too soon";
+        EXPECT_EQ(files("sub"), std::set<std::string>{});
+        EXPECT_EQ(files(), std::set<std::string>{"sub"});
     }
-    EXPECT_NE(shell("$C testcard:640x480@1000000 -o long.raw & sleep 0.3; ls -A; kill %1; wait %1"),
-              0);
-    EXPECT_NE(got.out.find(".long.raw."), std::string::npos) << "it was over too soon";
-    EXPECT_EQ(files(), std::set<std::string>{});
+}
+
+// Whatever goes wrong with the file, the old one stays or the new one is complete.
+TEST_F(convert_test, files_appear_when_they_are_complete) {
+    for (const auto &[mask, mode] : {std::pair("0", 0666), {"022", 0644}, {"077", 0600}}) {
+        ASSERT_EQ(shell("umask " + std::string(mask) + "; $C testcard:4x4 -o m.raw"), 0);
+        EXPECT_EQ(int(fs::status(at("m.raw")).permissions()), mode);
+    }
+    // Writes the first frame of two, waits until the output has been begun, and does something.
+    const auto meanwhile = [&](const std::string &deed) {
+        return shell(
+            "rm -rf in late; mkfifo in; { printf 0123456789abcdef; for i in {1..500}; do "
+            "[ -n \"$(ls -A | grep ^.late.)\" ] && break; sleep 0.02; done; " +
+            deed + "; printf fedcba9876543210; } >in & $C in -f yuv400 -s 4x4 -o late");
+    };
+    EXPECT_EQ(meanwhile("echo old >late; ls -A | grep -c ^.late. >count"), 0) << got.err;
+    EXPECT_EQ(read("count"), "1\n");
+    EXPECT_EQ(read("late"), "0123456789abcdeffedcba9876543210");
+    EXPECT_EQ(meanwhile("mkdir late"), 1);
+    EXPECT_NE(got.err.find("late: Is a directory"), std::string::npos) << got.err;
+    EXPECT_EQ(files(), (std::set<std::string>{"count", "in", "late", "m.raw"}));
+    // A file that can grow no longer.
+    EXPECT_EQ(shell("rm -r in late count; echo old >full; (ulimit -f 1; trap '' XFSZ; $C "
+                    "testcard:64x48 -o full)"),
+              1);
+    EXPECT_NE(got.err.find("full: File too large"), std::string::npos) << got.err;
+    EXPECT_EQ(read("full"), "old\n");
+    EXPECT_EQ(files(), (std::set<std::string>{"full", "m.raw"}));
 }
 
 TEST_F(convert_test, the_demonstration_leaves_its_pictures) {

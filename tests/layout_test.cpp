@@ -44,6 +44,44 @@ TEST(layout, every_kernel_at_every_size_on_every_target) {
     }
 }
 
+// Chroma has the sizes that the source names, whatever they are: each plane its own, two that are
+// packed those of plane 1.
+TEST(layout, sizes_of_chroma_are_those_of_the_source) {
+    rig::rng random(rig::seed());
+    for (const conversion &k : rig::conversions_of(rig::family::layout)) {
+        const rig::format &from = rig::format_of(k.from), &to = rig::format_of(k.to);
+        const bool apart = !from.is_semi_planar(), packs = to.is_semi_planar();
+        const int above = from.at(channel::u).down, below = to.at(channel::u).down;
+        std::vector<rig::plane_shape> in = {rig::samples(9, 4), rig::samples(7, 6, apart ? 1 : 2)};
+        if (apart) in.push_back(packs ? rig::samples(7, 6) : rig::samples(3, 8));
+        const auto made_of = [&](channel c) -> const rig::plane_shape & {
+            return in[size_t(from.at(c).plane)];
+        };
+        std::vector<rig::plane_shape> out = {rig::samples(9, 4)};
+        for (size_t p = 1; p < rig::shapes_of(k.to, 2, 2).size(); p++) {
+            const auto &shape =
+                made_of(to.at(channel::u).plane == int(p) ? channel::u : channel::v);
+            out.push_back(rig::samples(shape.width, shape.height * above / below, packs ? 2 : 1));
+        }
+        rig::picture src(in), dst(out), expected(out);
+        src.fill(rig::content::random, random);
+        dst.fill_pattern(4);
+        for (int y = 0; y < 4; y++) std::copy_n(src.row(0, y), 9, expected.row(0, y));
+        for (channel c : {channel::u, channel::v}) {
+            const rig::channel_place &a = from.at(c), &b = to.at(c);
+            const rig::plane_shape &shape = out[size_t(b.plane)];
+            for (int y = 0; y < shape.height; y++)
+                for (int x = 0; x < shape.width; x++)
+                    expected.row(b.plane, y)[b.first + x * b.step] =
+                        src.row(a.plane, y * below / above)[a.first + x * a.step];
+        }
+        if (packs) src.widths[2] = src.heights[2] = INT32_MAX;
+        rig::call(k.run, src, dst);
+        EXPECT_EQ(rig::difference(expected, dst), "") << k.name;
+        EXPECT_EQ(dst.stray_write(), "") << k.name;
+    }
+}
+
 // Planes
 // -----------------------------------------------------------------------------------------
 

@@ -8,7 +8,32 @@
 
 #include "tests/rig.h"
 
+extern "C" {
+void *__real_malloc(size_t size);
+void *__wrap_malloc(size_t size);
+}
+static bool refusing = false;
+static size_t refused = 0;
+void *__wrap_malloc(size_t size) {
+    if (!refusing) return __real_malloc(size);
+    refused = size;
+    return nullptr;
+}
+
 namespace {
+
+// What is asked for covers the block, the pointer and the alignment; beyond 32 bits nothing is.
+TEST(mem, the_largest_aligned_blocks) {
+    constexpr uint32_t more = 32 + sizeof(void *), largest = UINT32_MAX - more;
+    for (uint32_t size : {0u, 1u, largest - 1, largest, largest + 1, UINT32_MAX - 31, UINT32_MAX}) {
+        refused = 0;
+        refusing = true;
+        void *const block = scmn_malloc_align32(size);
+        refusing = false;
+        EXPECT_EQ(block, nullptr) << size;
+        EXPECT_EQ(refused, size > largest ? 0 : size_t(size) + more) << size;
+    }
+}
 
 TEST(mem, aligned_blocks) {
     void *(*const takes[])(uint32_t) = {scmn_malloc_align32, scmn_malloc_fast_align32};

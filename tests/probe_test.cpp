@@ -60,30 +60,25 @@ std::string nal(uint8_t header, std::vector<bit_field> fields, bool long_code = 
     return unit;
 }
 
-// Pictures counted modulo 16, in frames or fields.
-std::string sequence_set(bool frames_only) {
-    return nal(0x67,
-               {{77, 8},
-                {0, 8},
-                {30, 8},
-                ue(0),
-                ue(0),
-                ue(2),
-                ue(1),
-                {0, 1},
-                ue(10),
-                ue(8),
-                {frames_only, 1},
-                {1, 1},
-                {0, 1},
-                {0, 1}},
-               true);
+// Pictures counted modulo 16, in frames or fields; with a count of 8 bits for their order, or none.
+std::string sequence_set(bool frames_only, bool ordered = false) {
+    std::vector<bit_field> fields = {{77, 8}, {0, 8}, {30, 8}, ue(0), ue(0)};
+    if (ordered)
+        fields.insert(fields.end(), {ue(0), ue(4)});
+    else
+        fields.push_back(ue(2));
+    const std::vector<bit_field> rest = {ue(1),  {0, 1}, ue(10), ue(8), {frames_only, 1},
+                                         {1, 1}, {0, 1}, {0, 1}};
+    fields.insert(fields.end(), rest.begin(), rest.end());
+    return nal(0x67, fields, true);
 }
 const std::string picture_set = nal(0x68, {ue(0), ue(0), {0, 1}, {0, 1}, ue(0)}, true);
-std::string slice(bool idr, uint32_t block, uint32_t frame, std::vector<bit_field> field = {}) {
+std::string slice(bool idr, uint32_t block, uint32_t frame, std::vector<bit_field> field = {},
+                  uint32_t idr_id = 3, std::vector<bit_field> order = {}) {
     std::vector<bit_field> fields = {ue(block), ue(7), ue(0), {frame % 16, 4}};
     fields.insert(fields.end(), field.begin(), field.end());
-    if (idr) fields.push_back(ue(3));
+    if (idr) fields.push_back(ue(idr_id));
+    fields.insert(fields.end(), order.begin(), order.end());
     fields.push_back({0x155555, 24});
     return nal(idr ? 0x65 : 0x41, fields);
 }
@@ -141,6 +136,59 @@ TEST_F(probe_test, h264_pictures_of_several_slices) {
     expect_pictures(fields, "H.264");
 }
 
+// Each element of a slice's header that tells pictures apart, without a delimiter: the slices are
+// otherwise the same.
+TEST_F(probe_test, h264_slices_of_different_pictures) {
+    const std::string sets = sequence_set(true) + picture_set;
+    stream ids;
+    ids.add(sets + slice(true, 0, 0, {}, 1) + slice(true, 0, 0, {}, 1), true, 0);
+    ids.add(slice(true, 0, 0, {}, 2) + slice(true, 9, 0, {}, 2), true, 0);
+    ids.add(slice(true, 0, 0, {}, 0x7FFF) + slice(true, 9, 0, {}, 0x7FFF), true, 0);
+    ids.add(slice(true, 0, 0, {}, 0x7FFE), true, 0);
+    ids.add(slice(false, 0, 0), false, 0);  // no longer IDR
+    expect_pictures(ids, "H.264");
+
+    stream orders;
+    const auto ordered = [](uint32_t block, uint32_t order) {
+        return slice(false, block, 1, {}, 0, {{order, 8}});
+    };
+    orders.add(sequence_set(true, true) + picture_set + slice(true, 0, 0, {}, 0, {{0, 8}}), true,
+               0);
+    orders.add(ordered(0, 2) + ordered(0, 2) + ordered(0x7FFF, 2), false, 0);
+    orders.add(ordered(0, 3) + ordered(0, 3), false, 0);
+    orders.add(ordered(0, 0x83), false, 0);
+    expect_pictures(orders, "H.264");
+
+    // Long numbers of small values, before the last byte of which a 3 stands against start codes.
+    stream zeros;
+    const auto wide = [](uint32_t order) {
+        return nal(0x41, {ue(0), ue(7), ue(0), {0, 16}, {order, 16}, {0x155555, 24}});
+    };
+    ASSERT_NE(wide(4).find(std::string("\0\0\3\2", 4)), std::string::npos);
+    zeros.add(nal(0x67,
+                  {{77, 8},
+                   {0, 8},
+                   {30, 8},
+                   ue(0),
+                   ue(12),
+                   ue(0),
+                   ue(12),
+                   ue(1),
+                   {0, 1},
+                   ue(10),
+                   ue(8),
+                   {1, 1},
+                   {1, 1},
+                   {0, 1},
+                   {0, 1}},
+                  true) +
+                  picture_set +
+                  nal(0x65, {ue(0), ue(7), ue(0), {0, 16}, ue(0), {0, 16}, {0x155555, 24}}),
+              true, 0);
+    for (uint32_t order : {0, 1, 2, 4, 7, 5}) zeros.add(wide(order) + wide(order), false, 0);
+    expect_pictures(zeros, "H.264");
+}
+
 TEST_F(probe_test, mpeg4_and_h263) {
     const std::string headers("\0\0\1\xB0\1\0\0\1\xB5\x09\0\0\1\0\0\0\1\x20\x08\x84", 20);
     const auto vop = [](int type) { return std::string("\0\0\1\xB6", 4) + char(type << 6 | 0x10); };
@@ -171,6 +219,22 @@ TEST_F(probe_test, long_streams) {
               near ? i % 3 : std::min<size_t>(seam - s.bytes.size() - 300, 70000));
     }
     expect_pictures(s, "H.264");
+}
+
+// A parameter set that lies across the end of what is read at a time counts all the same: fields,
+// where frames were before.
+TEST_F(probe_test, parameter_sets_across_a_seam) {
+    for (size_t before = 0; before < 24; before++) {
+        stream s;
+        s.add(sequence_set(true) + picture_set + slice(true, 0, 0), true, 0);
+        s.bytes.append((1 << 20) - before - s.bytes.size(), '\x55');
+        s.pictures.back().size = s.bytes.size();
+        s.add(sequence_set(false) + picture_set + slice(true, 0, 0, {{1, 1}, {0, 1}}), true, 0);
+        s.add(slice(false, 0, 0, {{1, 1}, {1, 1}}), false, 0);
+        s.add(slice(false, 0, 1, {{0, 1}}), false, 10);
+        const std::string path = place.write("stream", s.bytes);
+        EXPECT_EQ(listed(ask(path)[0]), s.pictures) << before;
+    }
 }
 
 TEST_F(probe_test, text_and_summary) {

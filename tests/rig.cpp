@@ -277,7 +277,7 @@ picture::picture(const std::vector<plane_shape> &shapes, const std::vector<place
     for (size_t k = 0; k < 4; k++) {
         const bool there = k < shapes.size();
         planes[k] = there ? parts[k].row(0) : reinterpret_cast<uint8_t *>(uintptr_t(16));
-        widths[k] = there ? shapes[k].width : INT32_MIN;
+        widths[k] = there ? shapes[k].width : INT32_MAX;
         heights[k] = there ? shapes[k].height : INT32_MAX;
         strides[k] = there ? int32_t(parts[k].stride()) : INT32_MIN;
         if (there && shapes[k].rounded) strides[k] += places[k].excess % shapes[k].stride_unit;

@@ -76,6 +76,7 @@ struct format {
     const channel_place &at(channel c) const { return yuv[int(c)]; }
     bool is_rgb() const { return pixel_bytes > 0; }
     bool has_chroma() const { return yuv[1].step > 0; }
+    bool is_semi_planar() const { return yuv[1].step == 2 && !is_packed(); }
     bool is_packed() const { return has_chroma() && yuv[0].plane == yuv[1].plane; }
 };
 const std::vector<format> &formats();
