@@ -208,7 +208,7 @@ class player {
         picture all({&format_coded(SIMGP_FMT_RGB888), window_->width(), window_->height()});
         paste(all, to_rgb888(*picture_), place_.x, place_.y);
         if (overlay_on_) paste(all, box_, 0, 0);
-        output out(options_.screenshot);
+        output out(destination{options_.screenshot});
         write_png(out, all);
         out.commit();
         printf("%s: frame at %.3f s\n", options_.screenshot.c_str(), frame_.time);
