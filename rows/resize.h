@@ -55,7 +55,8 @@ using resize_measure_row = void(resize_strip &s);
 // Makes the plan.
 using resize_plan_row = void(resize_strip &s);
 
-// A line of the destination between two rows; below is above where the phase, 0 ... 7, is 0.
+// A line of the destination between two rows. Where the phase, 0 ... 7, is 0, the one below counts for
+// nothing and is any row that may be read: the one above, or the next line's.
 struct resize_line {
     const uint8_t *above, *below;
     int32_t phase;

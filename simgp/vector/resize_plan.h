@@ -90,9 +90,9 @@ inline constexpr int plan_parts = 32 / sizeof(plan_vector);
     memcpy(to + h * int(sizeof pairs), &pairs, sizeof pairs);
 }
 
-// What a strip is made of: pixels of `bytes_of` bytes, and weights that are multiplied by `scale`.
+// What a strip is made of: pixels of `size` bytes, and weights that are multiplied by `scale`.
 struct plan_kind {
-    int32_t bytes_of, scale;
+    int32_t size, scale;
 };
 
 // Pixel and channel of the lanes that follow one of channel k of its pixel, of C bytes.
@@ -220,7 +220,7 @@ static void plan_windows(resize_strip &s, plan_kind kind) {
     step_plan<W> *const plan = reinterpret_cast<step_plan<W> *>(s.plan);
     const int32_t limit = s.row_bytes > 16 ? s.row_bytes - 16 : 0;
     const bool shared = s.shared;
-    lanes_in_turn lanes(s, kind.bytes_of);
+    lanes_in_turn lanes(s, kind.size);
     s.direct_from = s.direct_to = 0;
     for (int32_t t = 0; t < s.steps; t++) {
         step_plan<W> &p = plan[t];
@@ -248,7 +248,7 @@ static void plan_windows(resize_strip &s, plan_kind kind) {
 
 static void plan_far(resize_strip &s, plan_kind kind) {
     far_plan *const plan = reinterpret_cast<far_plan *>(s.plan);
-    lanes_in_turn lanes(s, kind.bytes_of);
+    lanes_in_turn lanes(s, kind.size);
     s.direct_from = s.direct_to = 0;
     for (int32_t t = 0; t < s.steps; t++) {
         lanes.begin(begin_of_step(s, t));
@@ -270,7 +270,7 @@ static void plan_far(resize_strip &s, plan_kind kind) {
 }
 
 [[gnu::noinline]] static void make_plan_of(resize_strip &s, plan_kind kind) {
-    s.lanes = s.columns * kind.bytes_of;
+    s.lanes = s.columns * kind.size;
     s.steps = (s.lanes + bytes - 1) / bytes;
     s.last = s.lanes < bytes ? 0 : s.lanes - bytes;
     switch (s.windows) {
