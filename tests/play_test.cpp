@@ -319,6 +319,14 @@ TEST_F(play_test, dithering_and_deblocking) {
     expect_same(shoot_after("b").p, converted("clip.y4m", c709, 1), "f b");
 }
 
+// Deblocking comes before the tiles, in the planes that were coded.
+TEST_F(play_test, tiles_of_what_was_deblocked) {
+    encode("clip.mp4", "-c:v libx264 -pix_fmt yuv420p -crf 40");
+    shell("$C clip.y4m -q -n 1 --deblock 4 -o smooth.t64x32");
+    play("clip.mp4 --tiled --deblock --rgb565");
+    expect_same(shoot().p, converted("smooth.t64x32 --size 160x120", "--to rgb565"), "tiled");
+}
+
 // The stream's matrix and range, and the layouts that decoders give; the overlay says which.
 TEST_F(play_test, colours_of_the_stream) {
     const struct {
