@@ -1,7 +1,9 @@
 // simgp-check: a checksum of what each exported function does, to hold against those of other
 // processors and compilers.
 #include <stdio.h>
+#if __has_include(<sys/utsname.h>)
 #include <sys/utsname.h>
+#endif
 
 #include <fstream>
 #include <iterator>
@@ -73,24 +75,33 @@ std::string processor() {
     return "unknown";
 }
 
-void describe_machine() {
+// Name and release of the system, and what it calls the machine.
+std::string system_name() {
+#if __has_include(<sys/utsname.h>)
     utsname system{};
     uname(&system);
+    return std::string(system.sysname) + " " + system.release + ", " + system.machine;
+#else
+    return "Windows";
+#endif
+}
+
+void describe_machine() {
+#ifdef __clang__
+    const char *const compiler = __VERSION__;
+#else
+    const char *const compiler = "GCC " __VERSION__;
+#endif
     printf(
         "\nPlease send in the lines above and these, with the options of the compiler and the "
         "flags of\n"
         "/proc/cpuinfo:\n"
-        "  system     %s %s, %s, %d bits, %s-endian\n"
+        "  system     %s, %d bits, %s-endian\n"
         "  processor  %s\n"
         "  compiler   %s\n",
-        system.sysname, system.release, system.machine, int(8 * sizeof(void *)),
+        system_name().c_str(), int(8 * sizeof(void *)),
         __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__ ? "little" : "big", processor().c_str(),
-#ifdef __clang__
-        __VERSION__
-#else
-        "GCC " __VERSION__
-#endif
-    );
+        compiler);
 }
 
 std::vector<tools::function> chosen(const options &o) {

@@ -1,4 +1,6 @@
 // Trials of the functions simgp_*.
+#include <string.h>
+
 #include "rows/conversions.h"  // the lists of kernels, by their names
 #include "tools/trial.h"
 
@@ -284,16 +286,51 @@ void weights(trial &t, const function &) {
     t.result(simgp_tbl_rsz_weight, sizeof simgp_tbl_rsz_weight);
 }
 
-template <simgp_plane_fn *const (&table)[6], int32_t bytes, int32_t rows>
-void plane_table(trial &t, const function &) {
-    const int32_t rot = t.index % 6;
-    run_plane_kernel(t, table[rot], bytes, rot, rows);
+// Each entry in turn.
+#define PLANE_TABLE(table, bytes, rows)                                    \
+    [](trial &t, const function &) {                                       \
+        run_plane_kernel(t, table[t.index % 6], bytes, t.index % 6, rows); \
+    }
+#define RESIZE_TABLE(table, bytes) \
+    [](trial &t, const function &) { run_resize(t, table[t.index % 6], bytes, t.index % 6); }
+
+// Names and versions: every text; of the version, which grows, that it is not older than the header.
+void result_of(trial &t, const char *text) {
+    t.result(text != nullptr);
+    if (text) t.result(text, strlen(text) + 1);
 }
 
-template <simgp_rsz_fn *const (&table)[6], int32_t bytes>
-void resize_table(trial &t, const function &) {
-    const int32_t rot = t.index % 6;
-    run_resize(t, table[rot], bytes, rot);
+void result_text(trial &t, const function &) {
+    for (int32_t result = -12; result < 12; result++) result_of(t, simgp_result_text(result));
+    result_of(t, simgp_result_text(int32_t(t.word())));
+}
+
+void format_name(trial &t, const function &) {
+    for (int32_t format = -2; format < 700; format++) result_of(t, simgp_format_name(format));
+    result_of(t, simgp_format_name(int32_t(t.word())));
+}
+
+// Known names, and those with one other character, the case of some letters among them.
+void format_of_name(trial &t, const function &) {
+    static constexpr const char *known[] = {
+        "yuv400", "gray",  "grey",   "y800",     "yuv420",   "i420",     "iyuv",   "yuv420p",
+        "yv12",   "yv16",  "nv12",   "nv21",     "yuv422n",  "i422",     "yuv422", "yuv422p",
+        "yuv444", "i444",  "uyvy",   "yuyv",     "yuv422w",  "yuv440p",  "yuy2",   "uyvy422",
+        "rgb565", "rgb24", "bgr565", "rgb565le", "rgba8888", "argb8888", "bgra",   "t64x32"};
+    std::string name = t.one_of(known);
+    t.result(uint32_t(simgp_format_of_name(name.c_str())));
+    for (char &c : name)
+        if (c >= 'a' && t.one_in(2)) c = char(c - 'a' + 'A');
+    t.result(uint32_t(simgp_format_of_name(name.c_str())));
+    const size_t at = size_t(t.pick(0, int32_t(name.size()) - 1));
+    name[at] = char(t.pick(' ', 'z'));
+    t.result(uint32_t(simgp_format_of_name(name.c_str())));
+    t.result(uint32_t(simgp_format_of_name(name.substr(0, at).c_str())));
+    t.result(uint32_t(simgp_format_of_name(nullptr)));
+}
+
+void version(trial &t, const function &) {
+    t.result(simgp_version() >> 16 == SIMGP_VERSION_MAJOR && simgp_version() >= SIMGP_VERSION);
 }
 
 }  // namespace
@@ -384,13 +421,17 @@ void add_pixel_functions(std::vector<function> &all) {
     add_plain("simgp_rsz_8b_rot_90r_quarter", usual, quarter);
     add_plain("simgp_get_tile_offset", 4 * usual, tile_offset);
     add_plain("simgp_rsz_get_step", 20 * usual, get_step);
+    add_plain("simgp_version", 1, version);
+    add_plain("simgp_result_text", few, result_text);
+    add_plain("simgp_format_name", few, format_name);
+    add_plain("simgp_format_of_name", 4 * usual, format_of_name);
     add_plain("simgp_tbl_rsz_weight", 1, weights);
     add_plain("simgp_tbl_fn_csc_1x2_to_1x1_rot", few,
-              plane_table<simgp_tbl_fn_csc_1x2_to_1x1_rot, 1, 1>);
-    add_plain("simgp_tbl_fn_rot_8b", few, plane_table<simgp_tbl_fn_rot_8b, 1, 2>);
-    add_plain("simgp_tbl_fn_rot_16b", few, plane_table<simgp_tbl_fn_rot_16b, 2, 2>);
-    add_plain("simgp_tbl_fn_rsz_8b_rot", few, resize_table<simgp_tbl_fn_rsz_8b_rot, 1>);
-    add_plain("simgp_tbl_fn_rsz_8b8b_rot", few, resize_table<simgp_tbl_fn_rsz_8b8b_rot, 2>);
+              PLANE_TABLE(simgp_tbl_fn_csc_1x2_to_1x1_rot, 1, 1));
+    add_plain("simgp_tbl_fn_rot_8b", few, PLANE_TABLE(simgp_tbl_fn_rot_8b, 1, 2));
+    add_plain("simgp_tbl_fn_rot_16b", few, PLANE_TABLE(simgp_tbl_fn_rot_16b, 2, 2));
+    add_plain("simgp_tbl_fn_rsz_8b_rot", few, RESIZE_TABLE(simgp_tbl_fn_rsz_8b_rot, 1));
+    add_plain("simgp_tbl_fn_rsz_8b8b_rot", few, RESIZE_TABLE(simgp_tbl_fn_rsz_8b8b_rot, 2));
 }
 
 }  // namespace tools

@@ -2,7 +2,11 @@
 /* clang-format off */
 #ifndef SIMGP_EXPORT_H
 #define SIMGP_EXPORT_H 
-#if defined(__GNUC__)
+#if defined(_WIN32) && defined(SIMGP_STATIC)
+#define SIMGP_API 
+#elif defined(_WIN32)
+#define SIMGP_API __declspec(dllimport)
+#elif defined(__GNUC__)
 #define SIMGP_API __attribute__((visibility("default")))
 #else
 #define SIMGP_API 
@@ -378,6 +382,290 @@ SIMGP_API void simgp_dbf8x8_h263_ver(uint8_t *plane, int16_t strength, int32_t s
 SIMGP_API int32_t simgp_dbf8x8_yuv(const simgp_img *img, int16_t strength);
 SIMGP_END_DECLS
 #endif
+#ifndef SIMGP_DESCRIBE_H
+#define SIMGP_DESCRIBE_H 
+#include <stddef.h>
+#include <stdint.h>
+#ifdef __cplusplus
+#define SIMGP_INLINE inline
+#define SIMGP_CONSTEXPR constexpr
+#else
+#define SIMGP_INLINE static inline
+#define SIMGP_CONSTEXPR static inline
+#endif
+SIMGP_BEGIN_DECLS
+SIMGP_CONSTEXPR int32_t simgp_format_planes(int32_t format) {
+    switch (format) {
+        case SIMGP_FMT_YUV420:
+        case SIMGP_FMT_YUV422N:
+        case SIMGP_FMT_YUV444:
+        case SIMGP_FMT_YV12:
+        case SIMGP_FMT_YV16:
+        case SIMGP_FMT_YUV422W:
+            return 3;
+        case SIMGP_FMT_NV12:
+        case SIMGP_FMT_NV21:
+        case SIMGP_FMT_T64X32:
+            return 2;
+        case SIMGP_FMT_YUV400:
+        case SIMGP_FMT_UYVY:
+        case SIMGP_FMT_YUYV:
+        case SIMGP_FMT_RGB565:
+        case SIMGP_FMT_BGR565:
+        case SIMGP_FMT_RGB888:
+        case SIMGP_FMT_BGR888:
+        case SIMGP_FMT_RGBA8888:
+        case SIMGP_FMT_BGRA8888:
+        case SIMGP_FMT_ARGB8888:
+            return 1;
+        default:
+            return 0;
+    }
+}
+SIMGP_CONSTEXPR int32_t simgp_plane_sample(int32_t format, int32_t plane) {
+    const int32_t planes = simgp_format_planes(format);
+    if (plane < 0 || plane >= planes) return 0;
+    if (planes > 1) return planes == 2 && plane == 1 ? 2 : 1;
+    switch (format) {
+        case SIMGP_FMT_YUV400:
+            return 1;
+        case SIMGP_FMT_RGB888:
+        case SIMGP_FMT_BGR888:
+            return 3;
+        case SIMGP_FMT_RGBA8888:
+        case SIMGP_FMT_BGRA8888:
+        case SIMGP_FMT_ARGB8888:
+            return 4;
+        default:
+            return 2;
+    }
+}
+SIMGP_CONSTEXPR int32_t simgp_plane_x_shift(int32_t format, int32_t plane) {
+    if (simgp_plane_sample(format, plane) == 0 || plane == 0) return 0;
+    return format != SIMGP_FMT_YUV444 && format != SIMGP_FMT_YUV422W;
+}
+SIMGP_CONSTEXPR int32_t simgp_plane_y_shift(int32_t format, int32_t plane) {
+    if (simgp_plane_sample(format, plane) == 0 || plane == 0) return 0;
+    return format != SIMGP_FMT_YUV444 && format != SIMGP_FMT_YUV422N && format != SIMGP_FMT_YV16;
+}
+SIMGP_CONSTEXPR int32_t simgp_plane_width(int32_t format, int32_t plane, int32_t width) {
+    if (width < 1 || simgp_plane_sample(format, plane) == 0) return 0;
+    return simgp_plane_x_shift(format, plane) ? width / 2 + width % 2 : width;
+}
+SIMGP_CONSTEXPR int32_t simgp_plane_height(int32_t format, int32_t plane, int32_t height) {
+    if (height < 1 || simgp_plane_sample(format, plane) == 0) return 0;
+    if (!simgp_plane_y_shift(format, plane)) return height;
+    return format == SIMGP_FMT_T64X32 ? height / 2 : height / 2 + height % 2;
+}
+SIMGP_CONSTEXPR int64_t simgp_line_bytes(int32_t format, int32_t plane, int32_t width) {
+    return (int64_t)simgp_plane_width(format, plane, width) * simgp_plane_sample(format, plane);
+}
+SIMGP_CONSTEXPR int64_t simgp_plane_bytes(int32_t format, int32_t plane, int32_t width,
+                                          int32_t height, int32_t stride) {
+    const int64_t lines = simgp_plane_height(format, plane, height);
+    if (format == SIMGP_FMT_T64X32) {
+        const int64_t wide = width < 1 ? 0 : width, tile_rows = (lines + 31) / 32;
+        return 8192 * ((wide + 127) / 128 * (tile_rows / 2) + (wide + 255) / 256 * (tile_rows % 2));
+    }
+    return lines * (stride < 0 ? -(int64_t)stride : stride);
+}
+typedef struct simgp_layout {
+    size_t bytes;
+    size_t offset[4];
+    int32_t stride[4];
+    int32_t planes;
+} simgp_layout;
+SIMGP_INLINE int32_t simgp_refuse_(const char **why, const char *text) {
+    if (why) *why = text;
+    return SIMGP_ERR_PARAM;
+}
+SIMGP_INLINE int32_t simgp_refuse_plane_(const char **why, int32_t plane, const char *text0,
+                                         const char *text1, const char *text2) {
+    return simgp_refuse_(why, plane == 0 ? text0 : plane == 1 ? text1 : text2);
+}
+SIMGP_INLINE int32_t simgp_lay_out(simgp_layout *layout, int32_t format, int32_t width,
+                                   int32_t height, int32_t alignment, const char **why) {
+    const int32_t planes = simgp_format_planes(format);
+    simgp_layout made = {0, {0, 0, 0, 0}, {0, 0, 0, 0}, 0};
+    int64_t bytes = 0;
+    int32_t k;
+    if (planes == 0) return simgp_refuse_(why, "unknown format");
+    if (width < 1) return simgp_refuse_(why, "width below 1");
+    if (height < 1) return simgp_refuse_(why, "height below 1");
+    if (alignment < 1 || alignment > 4096 || (alignment & (alignment - 1)) != 0)
+        return simgp_refuse_(why, "alignment is no power of two from 1 to 4096");
+    for (k = 0; k < planes; k++) {
+        const int64_t mask = alignment - 1;
+        const int64_t stride = (simgp_line_bytes(format, k, width) + mask) & ~mask;
+        int64_t size;
+        if (format != SIMGP_FMT_T64X32) {
+            if (stride > INT32_MAX) return simgp_refuse_(why, "lines are too long");
+            made.stride[k] = (int32_t)stride;
+        }
+        bytes = (bytes + mask) & ~mask;
+        size = simgp_plane_bytes(format, k, width, height, made.stride[k]);
+        if (size > (int64_t)PTRDIFF_MAX - 4096 - bytes)
+            return simgp_refuse_(why, "the picture is larger than memory can be");
+        made.offset[k] = (size_t)bytes;
+        bytes += size;
+    }
+    made.bytes = (size_t)bytes;
+    made.planes = planes;
+    *layout = made;
+    return SIMGP_OK;
+}
+SIMGP_INLINE int32_t simgp_check(const simgp_img *img, const char **why) {
+    int32_t planes, k;
+    if (!img) return simgp_refuse_(why, "no descriptor");
+    planes = simgp_format_planes(img->format);
+    if (planes == 0) return simgp_refuse_(why, "unknown format");
+    if (img->width[0] < 1) return simgp_refuse_(why, "width below 1");
+    if (img->height[0] < 1) return simgp_refuse_(why, "height below 1");
+    for (k = 0; k < planes; k++) {
+        const int32_t tiled = img->format == SIMGP_FMT_T64X32;
+        const int32_t lines = simgp_plane_height(img->format, k, img->height[0]);
+        const int64_t stride = img->stride[k];
+        if (lines == 0) continue;
+        if (!tiled && (img->width[k] != simgp_plane_width(img->format, k, img->width[0]) ||
+                       img->height[k] != lines))
+            return simgp_refuse_plane_(why, k, "plane 0 has not the size that its format gives it",
+                                       "plane 1 has not the size that its format gives it",
+                                       "plane 2 has not the size that its format gives it");
+        if (!img->plane[k])
+            return simgp_refuse_plane_(why, k, "plane 0 is NULL", "plane 1 is NULL",
+                                       "plane 2 is NULL");
+        if (!tiled && lines > 1 &&
+            (stride < 0 ? -stride : stride) < simgp_line_bytes(img->format, k, img->width[0]))
+            return simgp_refuse_plane_(why, k, "stride of plane 0 is shorter than a line",
+                                       "stride of plane 1 is shorter than a line",
+                                       "stride of plane 2 is shorter than a line");
+    }
+    return SIMGP_OK;
+}
+SIMGP_INLINE int32_t simgp_check_memory(const simgp_img *img, const void *memory, size_t bytes,
+                                        const char **why) {
+    int32_t k;
+    const int32_t checked = simgp_check(img, why);
+    if (checked != SIMGP_OK) return checked;
+    for (k = 0; k < simgp_format_planes(img->format); k++) {
+        const int32_t width = img->width[0];
+        const int32_t lines = simgp_plane_height(img->format, k, img->height[0]);
+        const int64_t to_last =
+            img->format == SIMGP_FMT_T64X32 ? 0 : (int64_t)(lines - 1) * img->stride[k];
+        const int64_t last = img->format == SIMGP_FMT_T64X32
+                                 ? simgp_plane_bytes(img->format, k, width, img->height[0], 0)
+                                 : simgp_line_bytes(img->format, k, width);
+        const uint64_t before = to_last < 0 ? (uint64_t)-to_last : 0;
+        const uint64_t after = (uint64_t)(to_last < 0 ? 0 : to_last) + (uint64_t)last;
+        const uint64_t at = (uintptr_t)((uintptr_t)img->plane[k] - (uintptr_t)memory);
+        if (lines == 0) continue;
+        if (at > bytes || before > at || after > bytes - at)
+            return simgp_refuse_plane_(why, k, "memory is too small for plane 0",
+                                       "memory is too small for plane 1",
+                                       "memory is too small for plane 2");
+    }
+    return SIMGP_OK;
+}
+SIMGP_INLINE uint8_t *simgp_pointer_(const void *p) {
+#ifdef __cplusplus
+    return const_cast<uint8_t *>(static_cast<const uint8_t *>(p));
+#else
+    return (uint8_t *)(uintptr_t)p;
+#endif
+}
+SIMGP_INLINE int32_t simgp_describe_planes(simgp_img *img, int32_t format, int32_t width,
+                                           int32_t height, const void *plane0, int32_t stride0,
+                                           const void *plane1, int32_t stride1, const void *plane2,
+                                           int32_t stride2, const char **why) {
+    const void *const planes[3] = {plane0, plane1, plane2};
+    const int32_t strides[3] = {stride0, stride1, stride2};
+    simgp_img made = {
+        {0, 0, 0, 0}, {0, 0, 0, 0}, {0, 0, 0, 0}, {0, 0, 0, 0}, {0, 0, 0, 0}, {0, 0, 0, 0}, 0};
+    int32_t k, checked;
+    made.format = format;
+    made.width[0] = width;
+    made.height[0] = height;
+    for (k = 0; k < simgp_format_planes(format); k++) {
+        if (k > 0) made.width[k] = simgp_plane_width(format, k, width);
+        if (k > 0) made.height[k] = simgp_plane_height(format, k, height);
+        made.stride[k] = strides[k];
+        made.plane[k] = simgp_pointer_(planes[k]);
+    }
+    checked = simgp_check(&made, why);
+    if (checked == SIMGP_OK) *img = made;
+    return checked;
+}
+SIMGP_INLINE int32_t simgp_describe(simgp_img *img, int32_t format, int32_t width, int32_t height,
+                                    int32_t alignment, const void *memory, size_t bytes,
+                                    const char **why) {
+    simgp_layout layout;
+    const uint8_t *const first = (const uint8_t *)memory;
+    const int32_t laid_out = simgp_lay_out(&layout, format, width, height, alignment, why);
+    if (laid_out != SIMGP_OK) return laid_out;
+    if (!memory) return simgp_refuse_(why, "memory is NULL");
+    if (bytes < layout.bytes) return simgp_refuse_(why, "memory is too small for the picture");
+    return simgp_describe_planes(img, format, width, height, first, layout.stride[0],
+                                 first + layout.offset[1], layout.stride[1],
+                                 first + layout.offset[2], layout.stride[2], why);
+}
+SIMGP_INLINE int32_t simgp_describe_yuv_420_888(simgp_img *img, int32_t width, int32_t height,
+                                                const void *y, int32_t stride_y, const void *u,
+                                                int32_t stride_u, const void *v, int32_t stride_v,
+                                                int32_t pixel_stride, const char **why) {
+    const uintptr_t at_u = (uintptr_t)u, at_v = (uintptr_t)v;
+    if (pixel_stride == 1)
+        return simgp_describe_planes(img, SIMGP_FMT_YUV420, width, height, y, stride_y, u, stride_u,
+                                     v, stride_v, why);
+    if (pixel_stride != 2) return simgp_refuse_(why, "pixel stride of chroma is neither 1 nor 2");
+    if (!u) return simgp_refuse_(why, "plane 1 is NULL");
+    if (!v) return simgp_refuse_(why, "plane 2 is NULL");
+    if (stride_u != stride_v) return simgp_refuse_(why, "strides of U and V differ");
+    if (at_u + 1 != at_v && at_v + 1 != at_u)
+        return simgp_refuse_(why, "U and V do not lie one byte apart");
+    return simgp_describe_planes(img, at_u < at_v ? SIMGP_FMT_NV12 : SIMGP_FMT_NV21, width, height,
+                                 y, stride_y, at_u < at_v ? u : v, stride_u, NULL, 0, why);
+}
+SIMGP_CONSTEXPR int32_t simgp_band_step(int32_t format) {
+    const int32_t planes = simgp_format_planes(format);
+    if (format == SIMGP_FMT_T64X32) return 128;
+    return planes == 0 ? 0 : 1 << simgp_plane_y_shift(format, planes - 1);
+}
+SIMGP_INLINE int32_t simgp_band(const simgp_img *img, int32_t first, int32_t rows, simgp_img *band,
+                                const char **why) {
+    simgp_img made;
+    int32_t step, k;
+    const int32_t checked = simgp_check(img, why);
+    if (checked != SIMGP_OK) return checked;
+    made = *img;
+    step = simgp_band_step(img->format);
+    if (first < 0 || rows < 1 || rows > img->height[0] || first > img->height[0] - rows)
+        return simgp_refuse_(why, "the picture has no such rows");
+    if (first % step != 0 || (rows % step != 0 && first + rows != img->height[0]))
+        return simgp_refuse_(why, "rows of a band are multiples of simgp_band_step");
+    if (img->format == SIMGP_FMT_T64X32 && rows == 1 && first > 0)
+        return simgp_refuse_(why, "a last row of tiles alone is no band");
+    for (k = 0; k < simgp_format_planes(img->format); k++) {
+        const int32_t line = first >> simgp_plane_y_shift(img->format, k);
+        made.height[k] = simgp_plane_height(img->format, k, rows);
+        if (img->format == SIMGP_FMT_T64X32)
+            made.plane[k] += simgp_plane_bytes(img->format, k, img->width[0], first, 0);
+        else
+            made.plane[k] += (ptrdiff_t)line * img->stride[k];
+    }
+    *band = made;
+    return SIMGP_OK;
+}
+SIMGP_INLINE void simgp_share_rows(int32_t height, int32_t step, int32_t parts, int32_t part,
+                                   int32_t *first, int32_t *rows) {
+    const int32_t rest = height % step, whole = height / step;
+    const int32_t steps = whole + (rest > 1 || (rest == 1 && (step != 128 || whole == 0)));
+    const int32_t from = (int32_t)((int64_t)steps * part / parts);
+    const int32_t to = (int32_t)((int64_t)steps * (part + 1) / parts);
+    *first = from * step;
+    *rows = from == to ? 0 : to == steps ? height - from * step : (to - from) * step;
+}
+SIMGP_END_DECLS
+#endif
 #ifndef SIMGP_DITHER_H
 #define SIMGP_DITHER_H 
 SIMGP_BEGIN_DECLS
@@ -417,6 +705,19 @@ SIMGP_API void simgp_csc_8b8b_pck(const uint8_t *src_a, const uint8_t *src_b, in
 SIMGP_API void simgp_csc_8b8b_unpck(const uint8_t *src, int32_t width, int32_t height,
                                     int32_t src_stride, int32_t stride_a, int32_t stride_b,
                                     uint8_t *dst_a, uint8_t *dst_b);
+SIMGP_END_DECLS
+#endif
+#ifndef SIMGP_NAMES_H
+#define SIMGP_NAMES_H 
+SIMGP_BEGIN_DECLS
+#define SIMGP_VERSION_MAJOR 1
+#define SIMGP_VERSION_MINOR 0
+#define SIMGP_VERSION_PATCH 0
+#define SIMGP_VERSION (SIMGP_VERSION_MAJOR << 16 | SIMGP_VERSION_MINOR << 8 | SIMGP_VERSION_PATCH)
+SIMGP_API int32_t simgp_version(void);
+SIMGP_API const char *simgp_result_text(int32_t result);
+SIMGP_API const char *simgp_format_name(int32_t format);
+SIMGP_API int32_t simgp_format_of_name(const char *name);
 SIMGP_END_DECLS
 #endif
 #ifndef SIMGP_PACKED2RGB_H
