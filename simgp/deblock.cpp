@@ -66,7 +66,7 @@ enum class edges { horizontal, vertical, both };
 // pass makes of them, and what happens to them is not seen by the rest of it. Vertical edges lie in
 // single lines, so those of these eight may follow at once, while the lines are in the cache.
 void deblock(const deblock_args &a, edges which) {
-    if (a.width < 1 || a.height < 1 || a.strength < deblock_least_strength) return;
+    if (a.width < 1 || a.strength < deblock_least_strength) return;
     const int strength = a.strength < deblock_full_strength ? a.strength : deblock_full_strength;
     const deblock_rows &live = live_rows().deblock;
 

@@ -1,4 +1,7 @@
 // Layout conversions: every kernel at every size on every target, against where the samples belong.
+#include <sys/mman.h>
+#include <unistd.h>
+
 #include <algorithm>
 #include <cstring>
 
@@ -79,6 +82,62 @@ TEST(layout, sizes_of_chroma_are_those_of_the_source) {
         rig::call(k.run, src, dst);
         EXPECT_EQ(rig::difference(expected, dst), "") << k.name;
         EXPECT_EQ(dst.stray_write(), "") << k.name;
+    }
+}
+
+// More than 2 GiB that take 2 MiB of memory: all pieces but the last are the same.
+class large_plane {
+  public:
+    static constexpr size_t piece = 1 << 20, pieces = 2049;
+
+    large_plane() : memory_(mmap(nullptr, piece * pieces, PROT_NONE, flags, -1, 0)) {
+        const int file = memfd_create("plane", 0);
+        is_there_ = memory_ != MAP_FAILED && file >= 0 && ftruncate(file, 2 * piece) == 0;
+        for (size_t k = 0; k < pieces && is_there_; k++)
+            is_there_ =
+                mmap(data() + k * piece, piece, PROT_READ | PROT_WRITE, MAP_SHARED | MAP_FIXED,
+                     file, k + 1 < pieces ? 0 : piece) != MAP_FAILED;
+        if (file >= 0) close(file);
+    }
+    ~large_plane() {
+        if (memory_ != MAP_FAILED) munmap(memory_, piece * pieces);
+    }
+    large_plane(const large_plane &) = delete;
+
+    bool is_there() const { return is_there_; }
+    uint8_t *data() const { return static_cast<uint8_t *>(memory_); }
+    uint8_t *last() const { return data() + (pieces - 1) * piece; }
+
+  private:
+    static constexpr int flags = MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE;
+    void *memory_;
+    bool is_there_;
+};
+
+// Lines without gaps are one, of more bytes than an int can count.
+TEST(layout, planes_of_more_than_2_gib) {
+    if (sizeof(void *) < 8) GTEST_SKIP() << "there are no such planes";
+    if (rig::quick()) GTEST_SKIP() << "too much for an emulator";
+    const large_plane src, dst;
+    if (!src.is_there() || !dst.is_there()) GTEST_SKIP() << "the system gives no room";
+    constexpr size_t piece = large_plane::piece;
+    constexpr int32_t width = 1 << 16, height = int32_t(large_plane::pieces * piece / width);
+    rig::rng random(rig::seed());
+    rig::fill_bytes(src.data(), piece, rig::content::random, random);
+    rig::fill_bytes(src.last(), piece, rig::content::random, random);
+    simgp_cpy_8b(src.data(), width, height, width, width, dst.data());
+    EXPECT_EQ(memcmp(dst.data(), src.data(), piece), 0);
+    EXPECT_EQ(memcmp(dst.last(), src.last(), piece), 0);
+
+    simgp_tbl_fn_rot_8b[SIMGP_ROT_180](src.data(), width, height, width, width, dst.data());
+    for (size_t i = 0; i < piece; i++) ASSERT_EQ(dst.last()[i], src.data()[piece - 1 - i]) << i;
+
+    simgp_csc_8b8b_pck(src.data(), src.data() + 1, width / 2, height, width / 2, width / 2, width,
+                       dst.data());
+    const uint8_t *const end = src.data() + (large_plane::pieces * piece) / 2;
+    for (size_t i = 0; i < piece / 2; i++) {
+        ASSERT_EQ(dst.last()[2 * i], end[i - piece / 2]) << i;
+        ASSERT_EQ(dst.last()[2 * i + 1], end[i + 1 - piece / 2]) << i;
     }
 }
 

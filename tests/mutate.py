@@ -213,7 +213,7 @@ def show(fault):
     return "\n".join(difflib.unified_diff(lines, faulty, name, name, n=2, lineterm=""))
 
 
-def run_fault(copy, fault, baseline, limit):
+def run_fault(copy, fault, baseline, limits):
     """"nothing" if it does not compile, "same" if the code is the same, the test that saw it, or None."""
     name, tests = fault["file"], tests_of(fault["file"])
     original = copy.fewer_targets(name, (SOURCE / name).read_bytes())
@@ -234,7 +234,7 @@ def run_fault(copy, fault, baseline, limit):
         for test in tests:
             if not copy.make([test]):
                 return "nothing"
-            if copy.fails(test, limit):
+            if copy.fails(test, limits[test]):
                 return test
         return None
     finally:
@@ -267,7 +267,7 @@ def main():
     parser.add_argument("--seed", type=int, default=1)
     parser.add_argument("--only", action="append", help="files, as shell patterns")
     parser.add_argument("--again", action="store_true", help="run once more what was not seen")
-    parser.add_argument("--limit", type=float, default=60, help="seconds for each test program (60)")
+    parser.add_argument("--limit", type=float, default=60, help="seconds for each test program, beyond three times what it takes (60)")
     parser.add_argument("--jobs", type=int, default=os.cpu_count())
     parser.add_argument("--folder", type=pathlib.Path, default=SOURCE / "build" / "mutate")
     arguments = parser.parse_args()
@@ -283,16 +283,18 @@ def main():
     print("Building and running the tests as they are:", *all_tests, flush=True)
     if not copy.make(all_tests):
         sys.exit("The tests do not build.")
+    limits = {}
     for test in all_tests:
         start = time.time()
         if copy.fails(test, 10 * arguments.limit):
             sys.exit(f"{test}_test fails without a fault.")
+        limits[test] = arguments.limit + 3 * (time.time() - start)
         print(f"  {test}: {time.time() - start:.1f} s", flush=True)
     baseline = copy.objects()
 
     def settle(key, fault):
         start = time.time()
-        fault["seen"] = run_fault(copy, fault, baseline, arguments.limit)
+        fault["seen"] = run_fault(copy, fault, baseline, limits)
         if fault["seen"] in ("nothing", "same"):
             return False
         done[key] = fault
