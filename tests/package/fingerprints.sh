@@ -7,6 +7,7 @@ compare() { # FILE TEXT: the same names as in exports.txt
     lines=$(comm -3 "$scratch/exports" "$1")
     [ -z "$lines" ] || fault "$2, which differ from exports.txt:" "$lines"
 }
+export WINEPATH=Z:$build_dir # where Windows programs find the DLL
 # shellcheck disable=SC2086
 $emulator "$check" --list | tr -d '\r' | sort >"$scratch/listed"
 compare "$scratch/listed" "Functions that simgp-check lists"
@@ -25,7 +26,7 @@ compare "$scratch/known" "Lines of docs/fingerprints.txt"
 # The comparison finds one function that differs, and says which, and one that is missing.
 sed 's/^scmn_ceil_log2 .*/scmn_ceil_log2 12345678/; /^scmn_floor_log2/d' "$table" >"$scratch/altered"
 # shellcheck disable=SC2086
-said=$($emulator "$check" --compare "$scratch/altered" --function scmn_ceil_log2 --function scmn_floor_log2 \
+said=$($emulator "$check" "--compare=$scratch/altered" --function scmn_ceil_log2 --function scmn_floor_log2 \
     --function scmn_bsr_clz_in_code)
 status=$?
 [ $status -eq 1 ] && grep -q '^scmn_ceil_log2 .*should be 12345678' <<<"$said" && grep -q '^scmn_floor_log2 ' <<<"$said" &&

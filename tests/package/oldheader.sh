@@ -5,12 +5,13 @@
 stored=$source_dir/tests/package/abi
 header=$stored/simgp-1.0.h
 libdir=$(dirname "$shared_library")
-[ "$library_kind" = ELF ] || cp "$shared_library" "$scratch" # found beside the program
+suffix=
+[ "$library_kind" = ELF ] || { suffix=.exe && cp "$shared_library" "$scratch"; } # found beside the program
 build() { # PROGRAM SOURCE [ARG ...]: in C, against the stored header and nothing else of this library
     # shellcheck disable=SC2086
-    "$cc" $c_flags -std=c11 -Wall -Wextra -Werror -I"$stored" -o "$scratch/$1" "$2" "${@:3}"
+    "$cc" $c_flags -std=c11 -Wall -Wextra -Werror -I"$stored" -o "$scratch/$1$suffix" "$2" "${@:3}"
 }
-run() { $emulator "$scratch/$1"; }
+run() { $emulator "$scratch/$1$suffix"; }
 
 # shellcheck disable=SC2086
 build user "$stored/user.c" "$shared_library" -Wl,-rpath,"$libdir" || fault "user.c does not build."
@@ -41,7 +42,7 @@ print_constants() { # INCLUDE ...
 print_constants simgp-1.0.h >"$scratch/old.c"
 print_constants simgp/simgp.h scmn/scmn.h >"$scratch/new.c"
 # shellcheck disable=SC2086
-build old "$scratch/old.c" && "$cc" $c_flags -std=c11 -I"$source_dir" -o "$scratch/new" "$scratch/new.c" || {
+build old "$scratch/old.c" && "$cc" $c_flags -std=c11 -I"$source_dir" -o "$scratch/new$suffix" "$scratch/new.c" || {
     fault "A constant of the stored header is gone."
     finish
 }
