@@ -799,7 +799,8 @@ TEST_F(convert_test, broken_pipes_full_disks_and_interruptions_end_cleanly) {
 // Whatever goes wrong with the file, the old one stays or the new one is complete.
 TEST_F(convert_test, files_appear_when_they_are_complete) {
     for (const auto &[mask, mode] : {std::pair("0", 0666), {"022", 0644}, {"077", 0600}}) {
-        ASSERT_EQ(shell("umask " + std::string(mask) + "; $C testcard:4x4 -o m.raw"), 0);
+        ASSERT_EQ(shell("umask " + std::string(mask) + "; rm -f m.raw; $C testcard:4x4 -o m.raw"),
+                  0);
         EXPECT_EQ(int(fs::status(at("m.raw")).permissions()), mode);
     }
     // Writes the first frame of two, waits until the output has been begun, and does something.

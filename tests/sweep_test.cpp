@@ -16,6 +16,8 @@ const char *const without_rows[] = {
     "scmn_irsz_create",   "scmn_irsz_delete",       // tests of the resizer's functions use both
     "scmn_version",       "simgp_get_tile_offset",  // no loop
     "simgp_rsz_get_step",                           // no loop
+    "simgp_version",      "simgp_result_text",      // constants
+    "simgp_format_",                                // names of formats
     "simgp_tbl_",         "tbl_rsz_weight",  // data; the tables of kernels list what is swept
 };
 
