@@ -28,8 +28,11 @@ if [ "$library_kind" = PE ]; then
 fi
 [ -n "$(files runtime)" ] && ! files runtime | grep -vqE "/$expected" || fault "Component runtime has:" "$(files runtime)"
 ! files dev | grep -qE "/bin/|/$expected" || fault "Component dev has:" "$(files dev)"
-[ "$(files tools | xargs -rn 1 basename | xargs)" = "$(xargs <<<"$tools ${tools:+simgp.py}")" ] ||
-    fault "Component tools has:" "$(files tools)"
+expected=$(for tool in $tools; do
+    printf './%s\n' "bin/$tool" "share/man/man1/$tool.1" "share/bash-completion/completions/$tool"
+done
+[ -z "$tools" ] || echo ./share/simgp/python/simgp.py)
+[ "$(files tools | sort)" = "$(sort <<<"$expected")" ] || fault "Component tools has:" "$(files tools)"
 rest=$(comm -3 <(files prefix) <({ files runtime && files dev && files tools; } | sort))
 [ -z "$rest" ] || fault "In no component, or in two:" "$rest"
 
