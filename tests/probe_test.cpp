@@ -288,6 +288,7 @@ TEST_F(probe_test, bad_input) {
     expect_fault(place.write("ps", "\0\0\1\xBA\x44"s), "MPEG program stream");
     expect_fault(place.write("lengths", "\0\0\0\2\x67\1\0\0\0\3\x65\1\2"s),
                  "lengths in place of start codes");
+    expect_fault(place.write("zeros", std::string(64, 0)), "no start codes");
     const std::string sets = place.write("sets", sequence_set(true) + picture_set);
     expect_fault(sets, "no H.264 picture");
     expect_fault("--fourcc WMV1 " + sets, "no start codes");
