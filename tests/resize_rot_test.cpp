@@ -83,8 +83,9 @@ TEST(resize_rot, large_planes) {
     const kernels &k = all_kernels[1];
     for (int rot : {int(SIMGP_ROT_90L), int(SIMGP_ROT_90R)})
         rig::check_jobs(std::string(k.name) + kinds[rot],
-                        {.max_width = 0, .rounds = 1, .large = {{530, 498}}},
-                        [&](int w, int h) { return make_job(k, rot, {w / 2, h / 3}, {w, h}); });
+                        {.max_width = 0, .rounds = 1, .large = {{530, 498}}}, [&](int w, int h) {
+                            return make_job(k, rot, {w / 2, h / 3}, {w, h});
+                        });
 }
 
 // Every decimation across with every one down.
