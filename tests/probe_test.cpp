@@ -195,7 +195,7 @@ TEST_F(probe_test, h264_profiles_with_chroma) {
     const auto sequence = [](uint32_t profile, uint32_t chroma) {
         std::vector<bit_field> fields = {{profile, 8}, {0, 8}, {30, 8}, ue(0), ue(chroma)};
         if (chroma == 3) fields.push_back({1, 1});  // planes apart
-        fields.insert(fields.end(), {ue(0), ue(0), {0, 1}, {1, 1}, {1, 1}, ue(16), {1, 1}});
+        fields.insert(fields.end(), {ue(6), ue(6), {0, 1}, {1, 1}, {1, 1}, ue(16), {1, 1}});
         fields.insert(fields.end(), 16, ue(0));  // a list of its own, behind a default
         fields.insert(fields.end(), {{0, 4}, {1, 1}, ue(16)});  // the first list of 64 is a default
         fields.insert(fields.end(), chroma == 3 ? 5 : 1, {0, 1});
