@@ -837,6 +837,12 @@ TEST_F(convert_test, the_demonstration_leaves_its_pictures) {
     }
 }
 
+// One frame is enough for it, in another colour too.
+TEST_F(convert_test, the_demonstration_of_a_still) {
+    good("--demo pictures testcard:64x48@1 --colour bt709");
+    EXPECT_EQ(files("pictures").size(), 6u);
+}
+
 TEST_F(convert_test, the_list_names_formats_colours_and_dithered_conversions) {
     good("--list");
     for (const char *text : {" yuv422w t64x32 uyvy yuyv rgb565 bgr565 ", "  yuv400    -> rgb565\n",

@@ -91,7 +91,7 @@ TEST(csc, an_empty_picture_is_converted_to_nothing) {
 class far_apart {
   public:
     static constexpr ptrdiff_t apart = 1 << 30, rows = 72;
-    static constexpr size_t size = size_t(apart * rows);
+    static constexpr size_t size = size_t(uint64_t(apart) * uint64_t(rows));
 
     far_apart()
         : memory_(mmap(nullptr, size, PROT_READ | PROT_WRITE,

@@ -160,6 +160,18 @@ TEST(mem, fills) {
     });
 }
 
+// By the string store of x86, whether or not this processor is one of those that call it fast.
+TEST(mem, fills_with_strings) {
+    for (const rig::target_rows &t : rig::all_targets()) {
+        simgp::row_table table = *t.rows;
+        if (!table.mem.fill_with_strings) continue;
+        table.mem.fill = table.mem.fill_with_strings;
+        rig::forced rows({t.name, &table});
+        for (int32_t count : {64, 2047, 2200, 4099, (1 << 20) + 77, (1 << 20) + 200})
+            for (size_t gap = 0; gap < 8; gap++) check_fill(fills[2], count, 0x11223344, gap);
+    }
+}
+
 TEST(mem, logarithms) {
     EXPECT_EQ(scmn_floor_log2(0), -1);
     EXPECT_EQ(scmn_ceil_log2(0), -1);

@@ -189,6 +189,38 @@ TEST_F(probe_test, h264_slices_of_different_pictures) {
     expect_pictures(zeros, "H.264");
 }
 
+// What profiles with a format of chroma say before the count of pictures: scaling lists that end early
+// and that do not, planes apart. Read wrongly, the two fields would not be two pictures.
+TEST_F(probe_test, h264_profiles_with_chroma) {
+    const auto sequence = [](uint32_t profile, uint32_t chroma) {
+        std::vector<bit_field> fields = {{profile, 8}, {0, 8}, {30, 8}, ue(0), ue(chroma)};
+        if (chroma == 3) fields.push_back({1, 1});  // planes apart
+        fields.insert(fields.end(), {ue(6), ue(6), {0, 1}, {1, 1}, {1, 1}, ue(16), {1, 1}});
+        fields.insert(fields.end(), 16, ue(0));  // a list of its own, behind a default
+        fields.insert(fields.end(), {{0, 4}, {1, 1}, ue(16)});  // the first list of 64 is a default
+        fields.insert(fields.end(), chroma == 3 ? 5 : 1, {0, 1});
+        fields.insert(
+            fields.end(),
+            {ue(0), ue(2), ue(1), {0, 1}, ue(10), ue(8), {0, 1}, {0, 1}, {1, 1}, {0, 1}, {0, 1}});
+        return nal(0x67, fields, true);
+    };
+    for (uint32_t profile : {100, 110, 122, 244, 44, 83, 86, 118, 128, 138, 139, 134, 135})
+        for (uint32_t chroma : {1, 3}) {
+            const auto field = [&](uint32_t bottom) {
+                std::vector<bit_field> fields = {ue(0), ue(7), ue(0)};
+                if (chroma == 3) fields.push_back({0, 2});
+                fields.insert(fields.end(), {{1, 4}, {1, 1}, {bottom, 1}, {0x155555, 24}});
+                return nal(0x41, fields);
+            };
+            stream s;
+            s.add(sequence(profile, chroma) + picture_set + field(0) + field(0), false, 0);
+            s.add(field(1) + field(1), false, 0);
+            s.add(field(0), false, 0);
+            const std::string path = place.write("stream", s.bytes);
+            EXPECT_EQ(listed(ask(path)[0]), s.pictures) << profile << " " << chroma;
+        }
+}
+
 TEST_F(probe_test, mpeg4_and_h263) {
     const std::string headers("\0\0\1\xB0\1\0\0\1\xB5\x09\0\0\1\0\0\0\1\x20\x08\x84", 20);
     const auto vop = [](int type) { return std::string("\0\0\1\xB6", 4) + char(type << 6 | 0x10); };
@@ -317,6 +349,7 @@ TEST_F(probe_test, bad_input) {
     expect_fault(place.write("ps", "\0\0\1\xBA\x44"s), "MPEG program stream");
     expect_fault(place.write("lengths", "\0\0\0\2\x67\1\0\0\0\3\x65\1\2"s),
                  "lengths in place of start codes");
+    expect_fault(place.write("zeros", std::string(64, 0)), "no start codes");
     const std::string sets = place.write("sets", sequence_set(true) + picture_set);
     expect_fault(sets, "no H.264 picture");
     expect_fault("--fourcc WMV1 " + sets, "no start codes");
