@@ -1,7 +1,9 @@
 // The choice of the instruction set.
 #include "rows/choose.h"
 
+#ifdef __linux__
 #include <sys/auxv.h>
+#endif
 
 #include <atomic>
 #include <cstdlib>
