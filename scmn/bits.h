@@ -17,6 +17,7 @@
 
 SIMGP_BEGIN_DECLS
 
+/* The records of a reader and of a writer; their members stand below. */
 typedef struct scmn_bsr_ctx scmn_bsr_ctx;
 typedef struct scmn_bsw_ctx scmn_bsw_ctx;
 
@@ -145,8 +146,8 @@ SIMGP_API void scmn_bsr_le_skip(scmn_bsr_ctx *ctx, int32_t n);
 /* Passes over the rest of the current byte; at the start of a byte does nothing. */
 SIMGP_API void scmn_bsr_le_skip_to_align8(scmn_bsr_ctx *ctx);
 
-/* Number of zero bits above the highest one: 32 for 0, 31 for 1, 0 for 0x80000000. On a peeked word
- * it is the run of zeros that opens a variable-length code. */
+/* Number of zero bits above the highest one of x: 32 for 0, 31 for 1, 0 for 0x80000000. On a peeked
+ * word it is the run of zeros that opens a variable-length code. */
 SIMGP_API int32_t scmn_bsr_clz_in_code(uint32_t x);
 
 /* Writing -----------------------------------------------------------------------------------------

@@ -38,6 +38,7 @@ enum {
     SCMN_IRSZ_8B8B8B8B = 29       /* 4 bytes */
 };
 
+/* Modes: what a call is given. */
 enum {
     SCMN_IRSZ_FULL = 10, /* whole pictures, any number, one in each call */
     SCMN_IRSZ_LINE = 11  /* one picture, in bands of lines */
@@ -45,12 +46,13 @@ enum {
 
 /* Result codes of scmn_irsz_create. */
 enum {
-    SCMN_IRSZ_OK = 0,
+    SCMN_IRSZ_OK = 0,          /* the object was made */
     SCMN_IRSZ_ERR_MODE = -2,   /* the mode is none of the two */
     SCMN_IRSZ_ERR_MEMORY = -3, /* no memory, or sizes that the arithmetic does not hold */
     SCMN_IRSZ_ERR_FORMAT = -4  /* the format is none of the five */
 };
 
+/* What a resizer is to do. */
 typedef struct scmn_irsz_param {
     int32_t format;      /* SCMN_IRSZ_8B ... */
     int32_t mode;        /* SCMN_IRSZ_FULL or SCMN_IRSZ_LINE */
@@ -67,21 +69,23 @@ typedef struct scmn_irsz_param {
 /* The object, to be looked at but not written. Positions have 18 fractional bits and count in units
  * of 1 << shift pixels (lines). Lengths are in bytes, for SCMN_IRSZ_5B6B5B in 16-bit words. */
 typedef struct scmn_irsz_ctx scmn_irsz_ctx;
+/* An entry function; the parameters are explained at scmn_irsz. */
 typedef int32_t scmn_irsz_fn(scmn_irsz_ctx *ctx, const void *src, int32_t first_line,
                              int32_t nlines);
+/* What scmn_irsz_create made of the parameters, and how far the picture has come. */
 struct scmn_irsz_ctx {
-    int32_t format;
-    int32_t mode;
-    int32_t inc_x;    /* from one destination pixel to the next, along a source line */
-    int32_t inc_y;    /* from one destination row to the next */
-    int32_t y_pos;    /* position of destination row `row` */
-    int32_t tap_dx;   /* source pixels from a tap to its right neighbour: 1 << shift_x */
-    int32_t src_line; /* length from one source line to the next */
-    int32_t dst_w;
-    int32_t dst_h;
-    int32_t dst_line; /* length from one destination row to the next */
-    int32_t shift_x;  /* decimation, 0 to 4 */
-    int32_t shift_y;
+    int32_t format;     /* of the parameters */
+    int32_t mode;       /* likewise */
+    int32_t inc_x;      /* from one destination pixel to the next, along a source line */
+    int32_t inc_y;      /* from one destination row to the next */
+    int32_t y_pos;      /* position of destination row `row` */
+    int32_t tap_dx;     /* source pixels from a tap to its right neighbour: 1 << shift_x */
+    int32_t src_line;   /* length from one source line to the next */
+    int32_t dst_w;      /* of the parameters */
+    int32_t dst_h;      /* likewise */
+    int32_t dst_line;   /* length from one destination row to the next */
+    int32_t shift_x;    /* decimation along the lines, 0 to 4 */
+    int32_t shift_y;    /* likewise, along the columns */
     int32_t tap_dy;     /* length from a source line to its lower neighbour: src_line << shift_y */
     int32_t carry_off;  /* from the next band's first line to the lower line of the waiting row */
     int32_t carry;      /* 1 while a destination row, row - 1, waits for its lower line */
@@ -92,7 +96,7 @@ struct scmn_irsz_ctx {
     int32_t reuse;      /* 1 while row `row` too takes the kept line for its upper one */
     scmn_irsz_fn *run;  /* the format's entry function */
     void *line_buf;     /* the kept line; bands only */
-    void *dst;
+    void *dst;          /* of the parameters */
 };
 
 /* The layout is part of the binary interface: pointers are native, every other word has 32 bits. */

@@ -22,7 +22,7 @@ SIMGP_BEGIN_DECLS
 SIMGP_API void *scmn_malloc_align32(uint32_t size);
 SIMGP_API void *scmn_malloc_fast_align32(uint32_t size);
 
-/* Releases a block of either function above; NULL is ignored. Nothing else may be passed. */
+/* Releases the block p of either function above; NULL is ignored. Nothing else may be passed. */
 SIMGP_API void scmn_mfree_align32(void *p);
 SIMGP_API void scmn_mfree_fast_align32(void *p);
 
@@ -63,8 +63,8 @@ SIMGP_API void scmn_mclr_x64(void *dst, int32_t count);
 
 /* Logarithms --------------------------------------------------------------------------------------
  *
- * Floor and ceiling of the base-2 logarithm: of 1 it is 0, of 5 it is 2 and 3, of 0xFFFFFFFF it is
- * 31 and 32. Both give -1 for 0. */
+ * Floor and ceiling of the base-2 logarithm of x: of 1 it is 0, of 5 it is 2 and 3, of 0xFFFFFFFF
+ * it is 31 and 32. Both give -1 for 0. */
 SIMGP_API int32_t scmn_floor_log2(uint32_t x);
 SIMGP_API int32_t scmn_ceil_log2(uint32_t x);
 

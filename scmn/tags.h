@@ -12,34 +12,34 @@ SIMGP_BEGIN_DECLS
 enum {
     SCMN_MT_NONE = 0, /* scmn_fcc2mt recognised nothing */
 
-    SCMN_MT_MPEG4 = 102, /* MPEG-4 part 2 */
-    SCMN_MT_H263 = 103,
-    SCMN_MT_H264 = 104,
-    SCMN_MT_WMV1 = 105, /* Windows Media Video 7 */
-    SCMN_MT_WMV2 = 106, /* Windows Media Video 8 */
-    SCMN_MT_WMV3 = 107, /* Windows Media Video 9 */
-    SCMN_MT_DIV3 = 110, /* MS-MPEG4 version 3 */
-    SCMN_MT_VID_UNKNOWN = 299,
+    SCMN_MT_MPEG4 = 102,       /* MPEG-4 part 2 */
+    SCMN_MT_H263 = 103,        /* ITU-T H.263 */
+    SCMN_MT_H264 = 104,        /* ITU-T H.264 */
+    SCMN_MT_WMV1 = 105,        /* Windows Media Video 7 */
+    SCMN_MT_WMV2 = 106,        /* Windows Media Video 8 */
+    SCMN_MT_WMV3 = 107,        /* Windows Media Video 9 */
+    SCMN_MT_DIV3 = 110,        /* MS-MPEG4 version 3 */
+    SCMN_MT_VID_UNKNOWN = 299, /* scmn_fcc2mt_vid recognised nothing */
 
-    SCMN_MT_PCM = 300,
-    SCMN_MT_ALAW = 301,
-    SCMN_MT_MULAW = 302,
-    SCMN_MT_MPEGAUDIO = 304, /* MPEG audio layers 1 and 2 */
-    SCMN_MT_MP3 = 305,       /* MPEG audio layer 3 */
-    SCMN_MT_AAC = 306,
-    SCMN_MT_AC3 = 307,
-    SCMN_MT_DTS = 308,
-    SCMN_MT_AMRNB = 309, /* AMR narrow-band */
-    SCMN_MT_AMRWB = 310, /* AMR wide-band */
-    SCMN_MT_QCELP = 311,
-    SCMN_MT_WMA = 312, /* Windows Media Audio 1 and 2 */
-    SCMN_MT_WMAPRO = 313,
-    SCMN_MT_WMALOSSLESS = 314,
-    SCMN_MT_EVRC = 321,
-    SCMN_MT_AUD_UNKNOWN = 499,
+    SCMN_MT_PCM = 300,         /* samples without a codec */
+    SCMN_MT_ALAW = 301,        /* ITU-T G.711, A-law */
+    SCMN_MT_MULAW = 302,       /* ITU-T G.711, mu-law */
+    SCMN_MT_MPEGAUDIO = 304,   /* MPEG audio layers 1 and 2 */
+    SCMN_MT_MP3 = 305,         /* MPEG audio layer 3 */
+    SCMN_MT_AAC = 306,         /* MPEG-4 AAC */
+    SCMN_MT_AC3 = 307,         /* AC-3 */
+    SCMN_MT_DTS = 308,         /* DTS */
+    SCMN_MT_AMRNB = 309,       /* AMR narrow-band */
+    SCMN_MT_AMRWB = 310,       /* AMR wide-band */
+    SCMN_MT_QCELP = 311,       /* QCELP speech */
+    SCMN_MT_WMA = 312,         /* Windows Media Audio 1 and 2 */
+    SCMN_MT_WMAPRO = 313,      /* Windows Media Audio, professional */
+    SCMN_MT_WMALOSSLESS = 314, /* Windows Media Audio, lossless */
+    SCMN_MT_EVRC = 321,        /* EVRC speech */
+    SCMN_MT_AUD_UNKNOWN = 499, /* scmn_fcc2mt_aud recognised nothing */
 
-    SCMN_MT_DRM = 1100, /* content under the scheme that the FourCC DIVX signals */
-    SCMN_MT_DRM_UNKNOWN = 1299
+    SCMN_MT_DRM = 1100,        /* content under the scheme that the FourCC DIVX signals */
+    SCMN_MT_DRM_UNKNOWN = 1299 /* scmn_fcc2mt_drm recognised nothing */
 };
 
 /* The FourCC of four characters, as it is read from a file by a little-endian machine: the first

@@ -237,7 +237,9 @@ SIMGP_INLINE int32_t simgp_check(const simgp_img *img, const char **why) {
 }
 
 /* simgp_check, and whether all visible samples lie in the `bytes` bytes at `memory`; of T64X32, the
- * tiles with their empty places. Padding behind the last line need not be there. */
+ * tiles with their empty places. Padding behind the last line need not be there.
+ *
+ * Refused is what simgp_check refuses, and memory that does not hold the samples. */
 SIMGP_INLINE int32_t simgp_check_memory(const simgp_img *img, const void *memory, size_t bytes,
                                         const char **why) {
     int32_t k;
@@ -285,6 +287,9 @@ SIMGP_INLINE uint8_t *simgp_pointer_(const void *p) {
  * img.h says; those of T64X32 are not used.
  *
  *     simgp_describe_planes(&img, SIMGP_FMT_NV12, 640, 480, y, 768, uv, 768, NULL, 0, &why)
+ *
+ *   plane0, plane1, plane2      the first byte of each plane
+ *   stride0, stride1, stride2   bytes from one line of it to the next
  *
  * Refused is what simgp_check refuses. */
 SIMGP_INLINE int32_t simgp_describe_planes(simgp_img *img, int32_t format, int32_t width,
@@ -336,7 +341,9 @@ SIMGP_INLINE int32_t simgp_describe(simgp_img *img, int32_t format, int32_t widt
  * YUV420. With 2, where U and V lie one byte apart, it is NV12 if U comes first, and NV21 if V
  * does; no sample is moved.
  *
- *   pixel_stride   bytes from one sample of U, or of V, to the next in a line
+ *   y, u, v                        the first sample of Y, U and V
+ *   stride_y, stride_u, stride_v   bytes from one line of it to the next
+ *   pixel_stride                   bytes from one sample of U, or of V, to the next in a line
  *
  * Refused is what simgp_check refuses, every other distance, and with 2 U and V that do not make
  * pairs or whose strides differ. */

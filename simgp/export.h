@@ -17,6 +17,7 @@
 #define SIMGP_API
 #endif
 
+/* What C and C++ write differently: functions of C, and checks when a program is compiled. */
 #ifdef __cplusplus
 #define SIMGP_BEGIN_DECLS extern "C" {
 #define SIMGP_END_DECLS }

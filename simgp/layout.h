@@ -64,14 +64,20 @@ SIMGP_API simgp_plane_fn simgp_csc_1x2_to_1x1;
 SIMGP_API simgp_plane_fn simgp_csc_1x1_to_1x2;
 
 /* Interleaves two planes of `width` x `height` bytes: byte 2x of destination row y is byte x of
- * that row of src_a, byte 2x + 1 that of src_b. */
+ * that row of src_a, byte 2x + 1 that of src_b.
+ *
+ *   stride_a, stride_b   of src_a and src_b
+ *   dst_stride           of dst, which takes 2 * width bytes in a row */
 SIMGP_API void simgp_csc_8b8b_pck(const uint8_t *src_a, const uint8_t *src_b, int32_t width,
                                   int32_t height, int32_t stride_a, int32_t stride_b,
                                   int32_t dst_stride, uint8_t *dst);
 
 /* Takes a plane of byte pairs apart: of each of the `height` rows, bytes 0, 2, 4, ... go to the
  * same row of dst_a and bytes 1, 3, 5, ... to that of dst_b. `width` counts source bytes, two for
- * each pair; the last one of an odd number goes to dst_a. */
+ * each pair; the last one of an odd number goes to dst_a.
+ *
+ *   src_stride           of src
+ *   stride_a, stride_b   of dst_a and dst_b */
 SIMGP_API void simgp_csc_8b8b_unpck(const uint8_t *src, int32_t width, int32_t height,
                                     int32_t src_stride, int32_t stride_a, int32_t stride_b,
                                     uint8_t *dst_a, uint8_t *dst_b);

@@ -32,7 +32,15 @@ SIMGP_BEGIN_DECLS
 SIMGP_API int32_t simgp_rsz_csc(const simgp_img *src, const simgp_img *dst);
 
 /* The arrays are those of the two descriptors, entry k for plane k; the entries that are read are
- * those named above. Sizes are not checked, and a destination of 0 x 0 pixels or less writes
+ * those named above.
+ *
+ *   src_planes, src_widths    plane[] and width[] of the source
+ *   src_heights               height[] of the source
+ *   src_strides               stride[] of the source
+ *   dst_widths, dst_heights   width[] and height[] of the destination
+ *   dst_strides, dst_planes   stride[] and plane[] of the destination
+ *
+ * Sizes are not checked, and a destination of 0 x 0 pixels or less writes
  * nothing. The destination's stride is rounded down to an even number. Planes need no alignment. */
 typedef void simgp_rsz_csc_fn(uint8_t *const *src_planes, const int32_t *src_widths,
                               const int32_t *src_heights, const int32_t *src_strides,

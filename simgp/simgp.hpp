@@ -39,9 +39,11 @@ inline namespace v1 {
 // A result code of C, and in words what it means. True is success.
 class [[nodiscard]] result {
   public:
+    // A text of its own must be a constant.
     constexpr result(int32_t code = SIMGP_OK, const char *text = nullptr)
         : text_(text), code_(code) {}
 
+    // Whether it is SIMGP_OK; the code; its text, of a few words of English.
     constexpr explicit operator bool() const { return code_ == SIMGP_OK; }
     constexpr int32_t code() const { return code_; }
     const char *text() const { return text_ ? text_ : simgp_result_text(code_); }
@@ -54,8 +56,8 @@ class [[nodiscard]] result {
 // A plane: its first byte, and the bytes from one line to the next.
 template <class Byte>
 struct basic_plane {
-    Byte *first;
-    int32_t stride;
+    Byte *first;     // of the line that is processed first
+    int32_t stride;  // in bytes; may be negative
 };
 
 // A picture in somebody else's memory. Byte is const uint8_t for sources, uint8_t for pictures
@@ -115,8 +117,8 @@ class basic_view {
     int32_t height() const { return img_.height[0]; }
     int planes() const { return why_ ? 0 : simgp_format_planes(img_.format); }
 
-    // Of plane k, 0 ... planes() - 1. The bytes of a line are the visible ones; tiled planes have
-    // no lines.
+    // Of plane k, 0 ... planes() - 1. The bytes of its line y are the visible ones; tiled planes
+    // have no lines.
     Byte *plane(int k) const { return img_.plane[k]; }
     int32_t stride(int k) const { return img_.stride[k]; }
     int32_t lines(int k) const { return simgp_plane_height(format(), k, height()); }
@@ -153,12 +155,14 @@ class basic_view {
     const char *why_ = "no picture";  // null: there is one
 };
 
+// Of pictures that may be written, and of those that are only read.
 using view = basic_view<uint8_t>;
 using const_view = basic_view<const uint8_t>;
 
 // How the memory of a picture goes.
 struct aligned_delete {
-    std::align_val_t at{16};
+    std::align_val_t at{16};  // how it was aligned
+    // Releases p.
     void operator()(uint8_t *p) const { ::operator delete(p, at); }
 };
 
@@ -166,7 +170,9 @@ struct aligned_delete {
 // defined. It is empty if the arguments are refused or there is no memory.
 class picture {
   public:
+    // No picture.
     picture() = default;
+    // As simgp_lay_out lays it out.
     picture(int32_t format, int32_t width, int32_t height, int32_t alignment = 64) {
         simgp_layout layout{};
         const char *why = "no memory";
@@ -182,6 +188,7 @@ class picture {
             all_ = view::none(why);
         }
     }
+    // Memory moves; what it came from is empty.
     picture(picture &&other) noexcept { swap(other); }
     picture &operator=(picture &&other) noexcept {
         picture old(std::move(*this));
@@ -189,13 +196,17 @@ class picture {
         return *this;
     }
 
+    // Whether there is a picture, and if not, why.
     explicit operator bool() const { return bool(all_); }
     result check() const { return all_.check(); }
+
+    // The whole of it.
     operator view() { return all_; }
     operator const_view() const { return all_; }
     view all() { return all_; }
     const_view all() const { return all_; }
 
+    // Sizes are those of the whole picture in pixels, and 0 of an empty one.
     int32_t format() const { return all_.format(); }
     int32_t width() const { return all_.width(); }
     int32_t height() const { return all_.height(); }
@@ -289,7 +300,7 @@ inline result csc_any(const const_view &src, const view &dst, int32_t colour = S
     return simgp_csc_any(&src.img(), &dst.img(), colour);
 }
 
-// Part `part` of `parts` of csc_any: with all of them done, in any order and on any threads, all of
+// Part `part` of `parts` of csc_any with that colour: with all of them done, in any order and on any threads, all of
 // it is done (describe.h says of what else that holds).
 inline result csc_any_part(const const_view &src, const view &dst, int32_t colour, int32_t parts,
                            int32_t part) {

@@ -44,9 +44,9 @@ SIMGP_API int32_t simgp_get_tile_offset(int32_t width, int32_t height, int32_t x
 SIMGP_API void simgp_csc_copy_tiles_to_linear(const uint8_t *src, int32_t width, int32_t height,
                                               int32_t dst_stride, uint8_t *dst);
 
-/* Takes a tiled plane of byte pairs, `width` bytes x `height` rows, apart: bytes 0, 2, 4, ... of a
- * row go to dst_u, whose rows lie stride_u apart, bytes 1, 3, 5, ... to dst_v, stride_v apart. An
- * odd width gives one U more than V. */
+/* Takes a tiled plane of byte pairs, `width` bytes x `height` rows, at src, apart: bytes 0, 2, 4,
+ * ... of a row go to dst_u, whose rows lie stride_u apart, bytes 1, 3, 5, ... to dst_v, stride_v
+ * apart. An odd width gives one U more than V. */
 SIMGP_API void simgp_csc_unpack_tiles_to_linear(const uint8_t *src, int32_t width, int32_t height,
                                                 int32_t stride_u, uint8_t *dst_u, int32_t stride_v,
                                                 uint8_t *dst_v);

@@ -19,7 +19,7 @@ namespace tools {
 namespace {
 
 std::string output_kind(const job &j) {
-    const std::string kind = j.as.empty() ? ending_of(j.output) : j.as;
+    std::string kind = j.as.empty() ? ending_of(j.output) : j.as;
     for (const char *known : {"png", "ppm", "y4m"})
         if (kind == known) return kind;
     return "raw";

@@ -86,7 +86,7 @@ plane trial::add(int32_t row_bytes, int32_t rows, int32_t unit) {
     const size_t margin = 64 + 4 * size_t(rows);
     const int32_t gap = one_in(4) ? 0 : pick(0, 70 / unit) * unit;
     const bool upward = one_in(4);
-    const size_t pitch = size_t(row_bytes + gap);
+    const size_t pitch = size_t(row_bytes) + size_t(gap);
     const size_t start = used_ + margin + size_t(pick(0, 63));
     used_ = start + pitch * size_t(rows) + margin;
     if (used_ > sizeof memory) abort();
