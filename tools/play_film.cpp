@@ -10,6 +10,8 @@
 #include <algorithm>
 #include <cmath>
 #include <deque>
+#include <new>
+#include <utility>
 #include <vector>
 
 #include "scmn/scmn.h"
@@ -28,6 +30,16 @@ extern "C" {
 namespace tools {
 
 namespace {
+
+struct freed {
+    void operator()(AVFormatContext *p) const { avformat_close_input(&p); }
+    void operator()(AVBSFContext *p) const { av_bsf_free(&p); }
+    void operator()(AVCodecContext *p) const { avcodec_free_context(&p); }
+    void operator()(AVFrame *p) const { av_frame_free(&p); }
+    void operator()(AVPacket *p) const { av_packet_free(&p); }
+};
+template <class T>
+using owned = std::unique_ptr<T, freed>;
 
 std::string words(int error) {
     char text[AV_ERROR_MAX_STRING_SIZE] = {};
@@ -76,27 +88,19 @@ class decoded_film : public film {
         if (stat(path.c_str(), &about) == 0 && S_ISDIR(about.st_mode)) fail(strerror(EISDIR));
         open_file();
         const AVStream *stream = file_->streams[track_];
-        const AVRational rate = av_guess_frame_rate(file_, file_->streams[track_], nullptr);
+        const AVRational rate = av_guess_frame_rate(file_.get(), file_->streams[track_], nullptr);
         if (rate.num > 0 && rate.den > 0) frame_time_ = av_q2d(av_inv_q(rate));
         const AVRational aspect =
-            av_guess_sample_aspect_ratio(file_, file_->streams[track_], nullptr);
+            av_guess_sample_aspect_ratio(file_.get(), file_->streams[track_], nullptr);
         if (aspect.num > 0 && aspect.den > 0) pixel_aspect_ = av_q2d(aspect);
         if (stream->start_time != AV_NOPTS_VALUE)
             start_ = double(stream->start_time) * av_q2d(stream->time_base);
         recognise(*stream->codecpar);
         open_decoder(*stream);
     }
-    ~decoded_film() override {
-        forget_ahead();
-        av_frame_free(&frame_);
-        avcodec_free_context(&decoder_);
-        av_bsf_free(&filter_);
-        avformat_close_input(&file_);
-    }
-
     bool next(film_frame &to) override {
         for (;;) {
-            const int result = avcodec_receive_frame(decoder_, frame_);
+            const int result = avcodec_receive_frame(decoder_.get(), frame_.get());
             if (result == AVERROR_EOF) {
                 if (!delivered_ && !any_)
                     fail("no picture can be decoded", error_ ? ": " + words(error_) : "");
@@ -144,13 +148,13 @@ class decoded_film : public film {
         if (!forward) return false;
         // Behind all that has been read so far.
         for (int64_t bytes = 0; bytes < most_ahead;) {
-            AVPacket *p = read();
+            owned<AVPacket> p = read();
             if (!p) break;
-            ahead_.push_back(p);
             bytes += p->size;
             const size_t number = size_t(p->pts);
+            ahead_.push_back(std::move(p));
             if (!packets_[number].key || position(number) <= here + near) continue;
-            while (ahead_.front() != p) drop_first_ahead();
+            ahead_.erase(ahead_.begin(), ahead_.end() - 1);
             begin_at(number);
             return true;
         }
@@ -175,17 +179,19 @@ class decoded_film : public film {
 
     // Opens the file, and what makes its packets such as the library expects them.
     void open_file() {
-        av_bsf_free(&filter_);
-        avformat_close_input(&file_);
+        filter_.reset();
+        file_.reset();
+        AVFormatContext *file = nullptr;
         // The name is that of a file, whatever colons it has.
-        int result = avformat_open_input(&file_, ("file:" + name_).c_str(), nullptr, nullptr);
+        int result = avformat_open_input(&file, ("file:" + name_).c_str(), nullptr, nullptr);
         if (result < 0) fail(words(result));
+        file_.reset(file);
 #if LIBAVFORMAT_VERSION_INT < AV_VERSION_INT(60, 16, 100)
         // What is known of the whole film comes with its first frame. Newer ones do so by themselves.
-        av_format_inject_global_side_data(file_);
+        av_format_inject_global_side_data(file_.get());
 #endif
-        check(avformat_find_stream_info(file_, nullptr), "cannot be read");
-        track_ = av_find_best_stream(file_, AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
+        check(avformat_find_stream_info(file_.get(), nullptr), "cannot be read");
+        track_ = av_find_best_stream(file_.get(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
         if (track_ < 0) fail("holds no video");
         for (unsigned k = 0; k < file_->nb_streams; ++k)
             if (int(k) != track_) file_->streams[k]->discard = AVDISCARD_ALL;
@@ -198,10 +204,12 @@ class decoded_film : public film {
         const char *filter = lengths                               ? "h264_mp4toannexb"
                              : codec.codec_id == AV_CODEC_ID_MPEG4 ? "mpeg4_unpack_bframes"
                                                                    : "null";
-        check(av_bsf_list_parse_str(filter, &filter_), filter);
+        AVBSFContext *made = nullptr;
+        check(av_bsf_list_parse_str(filter, &made), filter);
+        filter_.reset(made);
         check(avcodec_parameters_copy(filter_->par_in, &codec), filter);
         filter_->time_base_in = stream->time_base;
-        check(av_bsf_init(filter_), filter);
+        check(av_bsf_init(made), filter);
         at_ = 0;
     }
 
@@ -236,74 +244,66 @@ class decoded_film : public film {
         const AVCodecID id = stream.codecpar->codec_id;
         const AVCodec *codec = avcodec_find_decoder(id);
         if (!codec) fail("nothing decodes ", avcodec_get_name(id));
-        decoder_ = avcodec_alloc_context3(codec);
-        frame_ = av_frame_alloc();
+        decoder_.reset(avcodec_alloc_context3(codec));
+        frame_.reset(av_frame_alloc());
         if (!decoder_ || !frame_) fail("not enough memory");
-        check(avcodec_parameters_to_context(decoder_, filter_->par_out), avcodec_get_name(id));
-        check(avcodec_open2(decoder_, codec, nullptr), avcodec_get_name(id));
+        check(avcodec_parameters_to_context(decoder_.get(), filter_->par_out),
+              avcodec_get_name(id));
+        check(avcodec_open2(decoder_.get(), codec, nullptr), avcodec_get_name(id));
     }
 
     // The next packet of the track, filtered; null at the end.
-    AVPacket *receive() {
-        AVPacket *p = av_packet_alloc();
+    owned<AVPacket> receive() {
+        owned<AVPacket> p(av_packet_alloc());
+        if (!p) throw std::bad_alloc();
         for (;;) {
-            const int result = av_bsf_receive_packet(filter_, p);
+            const int result = av_bsf_receive_packet(filter_.get(), p.get());
             if (result == 0) return p;
             if (result == AVERROR(EAGAIN)) {
-                const int got = av_read_frame(file_, p);
+                const int got = av_read_frame(file_.get(), p.get());
                 if (got == AVERROR(EAGAIN)) continue;
                 if (got < 0) {
                     if (got != AVERROR_EOF) error_ = got;
-                    av_bsf_send_packet(filter_, nullptr);
-                } else if (p->stream_index != track_ || av_bsf_send_packet(filter_, p) < 0) {
-                    av_packet_unref(p);
+                    av_bsf_send_packet(filter_.get(), nullptr);
+                } else if (p->stream_index != track_ ||
+                           av_bsf_send_packet(filter_.get(), p.get()) < 0) {
+                    av_packet_unref(p.get());
                 }
                 continue;
             }
-            if (result == AVERROR_EOF) break;
+            if (result == AVERROR_EOF) return nullptr;
             error_ = result;  // a damaged packet is left out
         }
-        av_packet_free(&p);
-        return nullptr;
     }
 
     // The same, with its number in place of its time. What is met for the first time is noted down.
-    AVPacket *read() {
-        AVPacket *p = receive();
-        if (p) number(p);
+    owned<AVPacket> read() {
+        owned<AVPacket> p = receive();
+        if (p) number(*p);
         return p;
     }
-    void number(AVPacket *p) {
+    void number(AVPacket &p) {
         if (at_ == packets_.size()) {
             const bool key = media_type_ == SCMN_MT_NONE
-                                 ? (p->flags & AV_PKT_FLAG_KEY) != 0
-                                 : scmn_is_vkeyfrm(media_type_, p->data, p->size) != 0;
+                                 ? (p.flags & AV_PKT_FLAG_KEY) != 0
+                                 : scmn_is_vkeyfrm(media_type_, p.data, p.size) != 0;
             const double unit = av_q2d(file_->streams[track_]->time_base);
-            packets_.push_back({p->pts == AV_NOPTS_VALUE ? NAN : double(p->pts) * unit - start_,
-                                p->dts, p->pos, key});
+            packets_.push_back(
+                {p.pts == AV_NOPTS_VALUE ? NAN : double(p.pts) * unit - start_, p.dts, p.pos, key});
         }
-        p->pts = int64_t(at_++);
+        p.pts = int64_t(at_++);
     }
 
     void feed() {
-        AVPacket *p = nullptr;
+        owned<AVPacket> p;
         if (ahead_.empty()) {
             p = read();
         } else {
-            p = ahead_.front();
+            p = std::move(ahead_.front());
             ahead_.pop_front();
         }
-        const int result = avcodec_send_packet(decoder_, p);
+        const int result = avcodec_send_packet(decoder_.get(), p.get());
         if (result < 0 && result != AVERROR_EOF) error_ = result;
-        av_packet_free(&p);
-    }
-
-    void drop_first_ahead() {
-        av_packet_free(&ahead_.front());
-        ahead_.pop_front();
-    }
-    void forget_ahead() {
-        while (!ahead_.empty()) drop_first_ahead();
     }
 
     bool has_times() const { return !packets_.empty() && !std::isnan(packets_[0].time); }
@@ -315,39 +315,34 @@ class decoded_film : public film {
     }
 
     void begin_at(size_t number) {
-        avcodec_flush_buffers(decoder_);
+        avcodec_flush_buffers(decoder_.get());
         begun_ = shown_ = number;
         delivered_ = 0;
     }
 
     void go_to(size_t number) {
-        forget_ahead();
+        ahead_.clear();
         begin_at(number);
         if (jump(number)) return;
         // No times, or an index that leads astray: from the beginning.
         open_file();
-        while (at_ < number) {
-            AVPacket *p = read();
-            if (!p) break;
-            av_packet_free(&p);
+        while (at_ < number && read()) {
         }
     }
     // Finds the packet by its time; it is the first one ahead then.
     bool jump(size_t number_wanted) {
         const packet wanted = packets_[number_wanted];
         if (wanted.dts == AV_NOPTS_VALUE) return false;
-        if (av_seek_frame(file_, track_, wanted.dts, AVSEEK_FLAG_BACKWARD) < 0) return false;
-        av_bsf_flush(filter_);
-        while (AVPacket *p = receive()) {
+        if (av_seek_frame(file_.get(), track_, wanted.dts, AVSEEK_FLAG_BACKWARD) < 0) return false;
+        av_bsf_flush(filter_.get());
+        while (owned<AVPacket> p = receive()) {
             if (p->dts == wanted.dts && p->pos == wanted.offset) {
                 at_ = number_wanted;
-                number(p);
-                ahead_.push_back(p);
+                number(*p);
+                ahead_.push_back(std::move(p));
                 return true;
             }
-            const bool behind = p->dts != AV_NOPTS_VALUE && p->dts > wanted.dts;
-            av_packet_free(&p);
-            if (behind) break;
+            if (p->dts != AV_NOPTS_VALUE && p->dts > wanted.dts) break;
         }
         return false;
     }
@@ -415,20 +410,20 @@ class decoded_film : public film {
         to.colour = note_of(from, shape.format->is_rgb());
     }
 
-    AVFormatContext *file_ = nullptr;
-    AVBSFContext *filter_ = nullptr;
-    AVCodecContext *decoder_ = nullptr;
-    AVFrame *frame_ = nullptr;
+    owned<AVFormatContext> file_;
+    owned<AVBSFContext> filter_;
+    owned<AVCodecContext> decoder_;
+    owned<AVFrame> frame_;
     int track_ = -1;
     int32_t media_type_ = SCMN_MT_NONE;
     double start_ = 0;
     int error_ = 0;  // the last one that was passed over
 
-    std::vector<packet> packets_;   // all that have been read, in their order
-    size_t at_ = 0;                 // number of the next one from the file
-    std::deque<AVPacket *> ahead_;  // read, and not yet decoded
-    size_t begun_ = 0, shown_ = 0;  // where decoding has begun; the packet of the last frame
-    int64_t delivered_ = 0;         // frames since then
+    std::vector<packet> packets_;        // all that have been read, in their order
+    size_t at_ = 0;                      // number of the next one from the file
+    std::deque<owned<AVPacket>> ahead_;  // read, and not yet decoded
+    size_t begun_ = 0, shown_ = 0;       // where decoding has begun; the packet of the last frame
+    int64_t delivered_ = 0;              // frames since then
     bool any_ = false;
 };
 

@@ -13,6 +13,12 @@ namespace {
 
 [[noreturn]] void fail(const char *what) { throw fault(what, ": ", SDL_GetError()); }
 
+[[noreturn]] void quit_and_fail(const char *what) {
+    const std::string why = SDL_GetError();
+    SDL_Quit();
+    throw fault(what, ": ", why);
+}
+
 SDL_Surface *surface_of(SDL_Window *window) {
     SDL_Surface *s = SDL_GetWindowSurface(window);
     if (!s) fail("the window cannot be drawn into");
@@ -41,7 +47,7 @@ void draw(SDL_Surface *to, picture &p, int x, int y) {
 window::window(const std::string &title, int width, int height, bool fixed) {
     // A screen saver may come; desktop effects may stay.
     SDL_SetHint(SDL_HINT_VIDEO_X11_NET_WM_BYPASS_COMPOSITOR, "0");
-    if (SDL_Init(SDL_INIT_VIDEO) != 0) fail("no screen");
+    if (SDL_Init(SDL_INIT_VIDEO) != 0) quit_and_fail("no screen");
     SDL_Rect room;
     if (!fixed && SDL_GetDisplayUsableBounds(0, &room) == 0 && room.w > 0 && room.h > 0) {
         const double shrink = std::min({1., double(room.w) / width, double(room.h) / height});
@@ -50,11 +56,7 @@ window::window(const std::string &title, int width, int height, bool fixed) {
     }
     window_ = SDL_CreateWindow(title.c_str(), SDL_WINDOWPOS_UNDEFINED, SDL_WINDOWPOS_UNDEFINED,
                                width, height, SDL_WINDOW_RESIZABLE);
-    if (!window_) {
-        const std::string why = SDL_GetError();
-        SDL_Quit();
-        throw fault("no window: ", why);
-    }
+    if (!window_) quit_and_fail("no window");
 }
 
 window::~window() {
