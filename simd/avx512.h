@@ -446,49 +446,6 @@ inline rgb_v load_8888(const uint8_t *p) {
                               order_channels(order, p + 128), order_channels(order, p + 192));
 }
 
-// The pair of products fits 16 bits; the sum with the third wraps.
-template <int A, int B, int C>
-inline __m512i dot(__m512i ac, __m512i b) {
-    const __m512i pair =
-        _mm512_maddubs_epi16(ac, _mm512_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
-    return _mm512_add_epi16(pair, _mm512_mullo_epi16(b, _mm512_set1_epi16(B)));
-}
-template <int A, int B, int C, int D>
-inline u8v dot_high(rgb_v v) {
-    static_assert(limits::channel_weights<A, B, C>);
-    return _mm512_add_epi8(
-        join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
-}
-template <int A, int B, int C, int D>
-inline u16v even_dot(rgb_v v) {
-    static_assert(limits::channel_factors<A, B, C>);
-    return _mm512_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
-}
-
-// The same with factors that are known at run time.
-struct channel_factors {
-    __m512i ac, b;
-};
-inline channel_factors set_channel_factors(int a, int b, int c) {
-    return {set_pair(static_cast<uint8_t>(a), static_cast<uint8_t>(c)),
-            set_u16(static_cast<uint16_t>(b))};
-}
-inline __m512i dot(__m512i ac, __m512i b, const channel_factors &f) {
-    return _mm512_add_epi16(_mm512_maddubs_epi16(ac, f.ac), _mm512_mullo_epi16(b, f.b));
-}
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
-}
-inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
-
-struct channels_v {
-    u8v c[3];
-};
-inline channels_v channels_of(rgb_v v) {
-    return {join(even(v.ac_even), v.ac_odd), join(v.b_even, v.b_odd),
-            join_high(v.ac_even, v.ac_odd)};
-}
-
 // Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels
 // lose their low bits, 32 c0 + c1 and c2 are made from bytes, and 64 times the first plus the
 // second is 8 times the word.
@@ -609,61 +566,23 @@ inline void exchange_888(uint8_t *p, const uint8_t *q) {
     third(2);
 }
 
-struct quads_v {
-    __m512i v[4];
-};
-inline quads_v load_quads(const uint8_t *p) {
-    return {{load(p), load(p + bytes), load(p + 2 * bytes), load(p + 3 * bytes)}};
-}
-inline __m512i set_quad(bool skips_first, int a, int b, int c) {
-    const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
-    const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
-    return set_u32(skips_first ? all << 8 : all);
-}
-// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
-// the shift, as the weights' sum is even.
-struct quad_weights {
-    __m512i weights, offset;
-};
-inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
-    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
-}
-inline __m512i add_pairs(__m512i a, __m512i b) {
+// For x86.h.
+inline s16v add_pairs(s16v a, s16v b) {
     const __m512i one = _mm512_set1_epi16(1);
     return _mm512_packs_epi32(_mm512_madd_epi16(a, one), _mm512_madd_epi16(b, one));
 }
-// What two steps of packing leave: granule k of block j belongs to vector k.
-inline __m512i unpack_order(__m512i v) {
+inline u8v pack_bytes(s16v a, s16v b) { return _mm512_packs_epi16(a, b); }
+inline u8v even_dwords(u8v a, u8v b) {
+    return _mm512_castps_si512(
+        _mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), 0x88));
+}
+inline u8v unpack_order(u8v v) {
     return _mm512_permutexvar_epi32(
         _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15), v);
 }
-inline u8v dot_high(const quads_v &v, const quad_weights &w) {
-    const auto products = [&](__m512i x) {
-        return _mm512_maddubs_epi16(w.weights, _mm512_xor_si512(x, _mm512_set1_epi8(-128)));
-    };
-    const auto half = [&](__m512i x, __m512i y) {
-        return _mm512_srai_epi16(add_pairs(products(x), products(y)), 8);
-    };
-    return _mm512_add_epi8(
-        unpack_order(_mm512_packs_epi16(half(v.v[0], v.v[1]), half(v.v[2], v.v[3]))), w.offset);
-}
-using quad_factors = __m512i;
-inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
-    return set_quad(skips_first, a, b, c);
-}
-inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const auto even_pixels = [](__m512i x, __m512i y) {
-        return _mm512_castps_si512(
-            _mm512_shuffle_ps(_mm512_castsi512_ps(x), _mm512_castsi512_ps(y), 0x88));
-    };
-    const __m512i low = even_pixels(v.v[0], v.v[1]), high = even_pixels(v.v[2], v.v[3]);
-    const auto dot = [&](__m512i k) {
-        return _mm512_subs_epi16(
-            c, add_pairs(_mm512_maddubs_epi16(low, k), _mm512_maddubs_epi16(high, k)));
-    };
-    return unpack_order(join_high(dot(f), dot(g)));
-}
 
 }  // namespace simgp::avx512
+
+#include "simd/x86.h"
 
 #endif

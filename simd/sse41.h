@@ -366,49 +366,6 @@ inline rgb_v load_8888(const uint8_t *p) {
     return transpose_channels(four(0), four(16), four(32), four(48));
 }
 
-// The pair of products fits 16 bits; the sum with the third wraps.
-template <int A, int B, int C>
-inline __m128i dot(__m128i ac, __m128i b) {
-    const __m128i pair =
-        _mm_maddubs_epi16(ac, _mm_set1_epi16(static_cast<int16_t>(C * 256 + (A & 255))));
-    return _mm_add_epi16(pair, _mm_mullo_epi16(b, _mm_set1_epi16(B)));
-}
-template <int A, int B, int C, int D>
-inline u8v dot_high(rgb_v v) {
-    static_assert(limits::channel_weights<A, B, C>);
-    return _mm_add_epi8(
-        join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)), set_u8(D));
-}
-template <int A, int B, int C, int D>
-inline u16v even_dot(rgb_v v) {
-    static_assert(limits::channel_factors<A, B, C>);
-    return _mm_add_epi16(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
-}
-
-// The same with factors that are known at run time.
-struct channel_factors {
-    __m128i ac, b;
-};
-inline channel_factors set_channel_factors(int a, int b, int c) {
-    return {set_pair(static_cast<uint8_t>(a), static_cast<uint8_t>(c)),
-            set_u16(static_cast<uint16_t>(b))};
-}
-inline __m128i dot(__m128i ac, __m128i b, const channel_factors &f) {
-    return _mm_add_epi16(_mm_maddubs_epi16(ac, f.ac), _mm_mullo_epi16(b, f.b));
-}
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
-}
-inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
-
-struct channels_v {
-    u8v c[3];
-};
-inline channels_v channels_of(rgb_v v) {
-    return {join(even(v.ac_even), v.ac_odd), join(v.b_even, v.b_odd),
-            join_high(v.ac_even, v.ac_odd)};
-}
-
 // Four bytes of a pixel, in a 32-bit lane, become a 565 word with two multiply-adds: the channels
 // lose their low bits, 32 c0 + c1 and c2 are made from bytes, and 64 times the first plus the
 // second is 8 times the word.
@@ -499,53 +456,19 @@ inline void exchange_888(uint8_t *p, const uint8_t *q) {
     third(2);
 }
 
-struct quads_v {
-    __m128i v[4];
-};
-inline quads_v load_quads(const uint8_t *p) {
-    return {{load(p), load(p + 16), load(p + 32), load(p + 48)}};
-}
-inline __m128i set_quad(bool skips_first, int a, int b, int c) {
-    const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
-    const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
-    return set_u32(skips_first ? all << 8 : all);
-}
-// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
-// the shift, as the weights' sum is even.
-struct quad_weights {
-    __m128i weights, offset;
-};
-inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
-    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
-}
-inline __m128i add_pairs(__m128i a, __m128i b) {
+// For x86.h.
+inline s16v add_pairs(s16v a, s16v b) {
     const __m128i one = _mm_set1_epi16(1);
     return _mm_packs_epi32(_mm_madd_epi16(a, one), _mm_madd_epi16(b, one));
 }
-inline u8v dot_high(const quads_v &v, const quad_weights &w) {
-    const auto products = [&](__m128i x) {
-        return _mm_maddubs_epi16(w.weights, _mm_xor_si128(x, _mm_set1_epi8(-128)));
-    };
-    const auto eight = [&](__m128i x, __m128i y) {
-        return _mm_srai_epi16(add_pairs(products(x), products(y)), 8);
-    };
-    return _mm_add_epi8(_mm_packs_epi16(eight(v.v[0], v.v[1]), eight(v.v[2], v.v[3])), w.offset);
+inline u8v pack_bytes(s16v a, s16v b) { return _mm_packs_epi16(a, b); }
+inline u8v even_dwords(u8v a, u8v b) {
+    return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), 0x88));
 }
-using quad_factors = __m128i;
-inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
-    return set_quad(skips_first, a, b, c);
-}
-inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const auto even_pixels = [](__m128i x, __m128i y) {
-        return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(x), _mm_castsi128_ps(y), 0x88));
-    };
-    const __m128i low = even_pixels(v.v[0], v.v[1]), high = even_pixels(v.v[2], v.v[3]);
-    const auto dot = [&](__m128i k) {
-        return _mm_subs_epi16(c, add_pairs(_mm_maddubs_epi16(low, k), _mm_maddubs_epi16(high, k)));
-    };
-    return join_high(dot(f), dot(g));
-}
+inline u8v unpack_order(u8v v) { return v; }
 
 }  // namespace simgp::sse41
+
+#include "simd/x86.h"
 
 #endif

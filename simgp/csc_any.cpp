@@ -1,251 +1,11 @@
-// Any format to any format: the scalar rows, which define the results, and the walks.
+// Any format to any format: the matrices, and the walks over rows and strips.
 #include "simgp/csc_any.h"
 
 #include "simgp/csc.h"
-#include "simgp/pixel.h"
 #include "simgp/tile_offset.h"
 #include "simgp/walk.h"
 
 namespace simgp {
-namespace scalar {
-namespace {
-
-int clamp(int v) { return v < 0 ? 0 : v > 255 ? 255 : v; }
-
-// The bytes of a pixel of some kind.
-constexpr int size_of(pixel_kind kind) { return int(kind) + 2; }
-
-void write_pixel(pixel_kind kind, const yuv_to_rgb &how, uint8_t *p, const rgb &c) {
-    const int first = how.blue_first ? c.b : c.r, last = how.blue_first ? c.r : c.b;
-    if (kind == pixel_kind::words) {
-        const int word = first >> 3 << 11 | c.g >> 2 << 5 | last >> 3;
-        p[0] = uint8_t(word);
-        p[1] = uint8_t(word >> 8);
-        return;
-    }
-    if (kind == pixel_kind::four) {
-        p[how.alpha_first ? 0 : 3] = 255;
-        p += how.alpha_first;
-    }
-    p[0] = uint8_t(first);
-    p[1] = uint8_t(c.g);
-    p[2] = uint8_t(last);
-}
-
-rgb from_yuv(const yuv_weights &w, const yuv &p) {
-    const int luma = w.luma * (p.y - w.black), u = p.u - 128, v = p.v - 128;
-    return {clamp((luma + w.red * v + 128) >> 8),
-            clamp((luma - w.green_u * u - w.green_v * v + 128) >> 8),
-            clamp((luma + w.blue * u + 128) >> 8)};
-}
-
-template <chroma_in Layout>
-yuv read_any(const yuv_to_rgb &how, const yuv_samples &s, ptrdiff_t x) {
-    if constexpr (Layout == chroma_in::half) return read_yuv<yuv_layout::half>(s, x);
-    if constexpr (Layout == chroma_in::full) return read_yuv<yuv_layout::full>(s, x);
-    if constexpr (Layout == chroma_in::pairs)
-        return how.v_first ? read_yuv<yuv_layout::vu>(s, x) : read_yuv<yuv_layout::uv>(s, x);
-    if constexpr (Layout == chroma_in::groups)
-        return how.luma_first ? read_yuv<yuv_layout::yuyv>(s, x) : read_yuv<yuv_layout::uyvy>(s, x);
-}
-
-template <chroma_in Layout, pixel_kind Kind>
-void any_to_rgb(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
-                uint8_t *dst, ptrdiff_t width) {
-    const yuv_samples s{y, u, v, width};
-    for (ptrdiff_t x = 0; x < width; x++)
-        write_pixel(Kind, how, dst + size_of(Kind) * x,
-                    from_yuv(how.weights, read_any<Layout>(how, s, x)));
-}
-
-template <chroma_in Layout, pixel_kind Kind>
-void any_to_rgb_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
-                     const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
-    any_to_rgb<Layout, Kind>(how, y0, u, v, dst0, width);
-    any_to_rgb<Layout, Kind>(how, y1, u, v, dst1, width);
-}
-
-// The channels of a pixel in the order of memory.
-struct channels {
-    int c[3];
-};
-template <rgb_in In>
-channels read_channels(const uint8_t *src, ptrdiff_t x) {
-    constexpr rgb_packing packing = In == rgb_in::words   ? rgb_packing::rgb565
-                                    : In == rgb_in::three ? rgb_packing::rgb888
-                                    : In == rgb_in::four  ? rgb_packing::rgba8888
-                                                          : rgb_packing::argb8888;
-    const rgb p = read_rgb<packing>(src, x);
-    return {{p.r, p.g, p.b}};
-}
-int dot(const int16_t (&w)[3], const channels &p) {
-    return w[0] * p.c[0] + w[1] * p.c[1] + w[2] * p.c[2];
-}
-uint8_t luma_of(const rgb_weights &w, const channels &p) {
-    return uint8_t((dot(w.y, p) >> 8) + w.black);
-}
-uint8_t chroma_of(const int16_t (&w)[3], const channels &p) {
-    return uint8_t(clamp(((dot(w, p) + 128) >> 8) + 128));
-}
-
-template <pixel_kind Kind, chroma_out Out>
-void any_to_yuv(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    const auto pixel = [&w](const uint8_t *src, ptrdiff_t x) {
-        return read_channels<rgb_in(Kind)>(src + w.alpha_first, x);
-    };
-    for (ptrdiff_t x = 0; x < width; x++) {
-        const channels p = pixel(src0, x);
-        y0[x] = luma_of(w, p);
-        if (src1) y1[x] = luma_of(w, pixel(src1, x));
-        if (Out == chroma_out::none || x & 1) continue;
-        const uint8_t of_u = chroma_of(w.u, p), of_v = chroma_of(w.v, p);
-        if (Out == chroma_out::half) {
-            u[x / 2] = of_u;
-            v[x / 2] = of_v;
-        } else {
-            u[x] = of_u;
-            u[x + 1] = of_v;
-        }
-    }
-}
-
-void chroma(const rgb_weights &w, const uint8_t *const of[3], uint8_t *u, uint8_t *v,
-            ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) {
-        const channels p{{of[0][x], of[1][x], of[2][x]}};
-        u[x] = chroma_of(w.u, p);
-        v[x] = chroma_of(w.v, p);
-    }
-}
-
-template <rgb_in In>
-void split_pixels(const uint8_t *src, uint8_t *const of[3], ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) {
-        const channels p = read_channels<In>(src, x);
-        for (int k = 0; k < 3; k++) of[k][x] = uint8_t(p.c[k]);
-    }
-}
-
-// Channels stand in the order of memory here: r for the first, b for the last.
-template <pixel_kind From, pixel_kind To>
-void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    const yuv_to_rgb how{{}, false, false, order.exchange, order.to_alpha_first};
-    for (ptrdiff_t x = 0; x < count; x++) {
-        const uint8_t *const p = src + size_of(From) * x;
-        const bool skip = From == pixel_kind::four && order.from_alpha_first;
-        const channels c = From == pixel_kind::words
-                               ? read_channels<rgb_in::words>(p, 0)
-                               : channels{{p[skip], p[skip + 1], p[skip + 2]}};
-        uint8_t *const q = dst + size_of(To) * x;
-        write_pixel(To, how, q, {c.c[0], c.c[1], c.c[2]});
-        if (From == pixel_kind::four && To == pixel_kind::four)
-            q[order.to_alpha_first ? 0 : 3] = p[order.from_alpha_first ? 0 : 3];
-    }
-}
-
-void split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
-                  bool luma_first) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        y[2 * i] = src[4 * i + luma];
-        y[2 * i + 1] = src[4 * i + luma + 2];
-        u[i] = src[4 * i + of_u];
-        v[i] = src[4 * i + of_u + 2];
-    }
-}
-void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
-                 ptrdiff_t pairs, bool luma_first) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        dst[4 * i + luma] = y[2 * i];
-        dst[4 * i + luma + 2] = y[2 * i + 1];
-        dst[4 * i + of_u] = u[i];
-        dst[4 * i + of_u + 2] = v[i];
-    }
-}
-
-template <bool Pairs>
-void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1, uint8_t *u,
-                   uint8_t *v, ptrdiff_t pairs, bool luma_first) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    for (ptrdiff_t x = 0; x < 2 * pairs; x++) {
-        y0[x] = src0[2 * x + luma];
-        y1[x] = src1[2 * x + luma];
-    }
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        u[Pairs ? 2 * i : i] = src0[4 * i + of_u];
-        (Pairs ? u[2 * i + 1] : v[i]) = src0[4 * i + of_u + 2];
-    }
-}
-
-void mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[x] + b[x] + 1) >> 1);
-}
-void mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + 1) >> 1);
-}
-void mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++)
-        dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1] + 2) >> 2);
-}
-void every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) dst[x] = a[2 * x];
-}
-void twice(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) dst[x] = a[x / 2];
-}
-
-template <chroma_in Layout, pixel_kind Kind>
-void fill_to_rgb(any_rows &t) {
-    const size_t l = size_t(Layout), k = size_t(Kind);
-    t.to_rgb[l][k] = any_to_rgb<Layout, Kind>;
-    t.to_rgb_pair[l][k] = any_to_rgb_pair<Layout, Kind>;
-}
-template <chroma_in Layout>
-void fill_from_yuv(any_rows &t) {
-    fill_to_rgb<Layout, pixel_kind::words>(t);
-    fill_to_rgb<Layout, pixel_kind::three>(t);
-    fill_to_rgb<Layout, pixel_kind::four>(t);
-}
-template <pixel_kind From>
-void fill_from_rgb(any_rows &t) {
-    any_to_yuv_row **const to_yuv = t.to_yuv[size_t(From)];
-    to_yuv[size_t(chroma_out::none)] = any_to_yuv<From, chroma_out::none>;
-    to_yuv[size_t(chroma_out::half)] = any_to_yuv<From, chroma_out::half>;
-    to_yuv[size_t(chroma_out::pairs)] = any_to_yuv<From, chroma_out::pairs>;
-    t.split_pixels[size_t(From)] = split_pixels<rgb_in(From)>;
-    repack_row **const to = t.repack[size_t(From)];
-    to[size_t(pixel_kind::words)] = repack<From, pixel_kind::words>;
-    to[size_t(pixel_kind::three)] = repack<From, pixel_kind::three>;
-    to[size_t(pixel_kind::four)] = repack<From, pixel_kind::four>;
-}
-
-}  // namespace
-
-void fill_any(any_rows &t) {
-    fill_from_yuv<chroma_in::half>(t);
-    fill_from_yuv<chroma_in::full>(t);
-    fill_from_yuv<chroma_in::pairs>(t);
-    fill_from_yuv<chroma_in::groups>(t);
-    fill_from_rgb<pixel_kind::words>(t);
-    fill_from_rgb<pixel_kind::three>(t);
-    fill_from_rgb<pixel_kind::four>(t);
-    t.split_pixels[size_t(rgb_in::four_alpha_first)] = split_pixels<rgb_in::four_alpha_first>;
-    t.chroma = chroma;
-    t.split_groups = split_groups;
-    t.join_groups = join_groups;
-    t.groups_to_planes = groups_to_420<false>;
-    t.groups_to_pairs = groups_to_420<true>;
-    t.mean_of_lines = mean_of_lines;
-    t.mean_of_pairs = mean_of_pairs;
-    t.mean_of_blocks = mean_of_blocks;
-    t.every_second = every_second;
-    t.twice = twice;
-}
-
-}  // namespace scalar
-
 namespace {
 
 // The matrices, by colour (ITU-R BT.601, BT.709, BT.2020).
@@ -334,6 +94,17 @@ struct yuv_strip {
     uint8_t y[2][strip_width], u[2][strip_width], v[2][strip_width];
 };
 
+// Sets the chroma of a band to where it stands in planes of its own.
+template <class Band, class Plane>
+void point_to_chroma(const format &f, const strip_rows &b, Band &to, Plane plane) {
+    const sharing shared = sharing_of(f);
+    for (ptrdiff_t r = 0; r < (shared.down ? 1 : b.rows); r++) {
+        const ptrdiff_t line = (b.y + r) >> shared.down, x = b.x >> shared.across;
+        to.u[r] = plane(f.u).line(line) + x;
+        to.v[r] = plane(f.v).line(line) + x;
+    }
+}
+
 // YUV sources
 // -----------------------------------------------------------------------------------------------
 
@@ -407,12 +178,7 @@ planar_band read_band(const job &j, const strip_rows &b, yuv_strip &s) {
         split_pairs(j, j.from.layout == yuv_layout::vu, j.in(1).line(b.y >> 1) + b.x, s.u[0],
                     s.v[0], b.pairs());
     } else {
-        const sharing shared = sharing_of(j.from);
-        for (ptrdiff_t r = 0; r < (shared.down ? 1 : b.rows); r++) {
-            const ptrdiff_t line = (b.y + r) >> shared.down, x = b.x >> shared.across;
-            p.u[r] = j.in(j.from.u).line(line) + x;
-            p.v[r] = j.in(j.from.v).line(line) + x;
-        }
+        point_to_chroma(j.from, b, p, [&j](int plane) { return j.in(plane); });
     }
     return p;
 }
@@ -465,12 +231,7 @@ target_band place_band(const job &j, const strip_rows &b, yuv_strip &s) {
     if (j.to.kind != format_kind::planar) return t;
     for (ptrdiff_t r = 0; r < b.rows; r++) t.y[r] = j.out(0).line(b.y + r) + b.x;
     if (j.to.u < 0 || has_pairs(j.to)) return t;
-    const sharing shared = sharing_of(j.to);
-    for (ptrdiff_t r = 0; r < (shared.down ? 1 : b.rows); r++) {
-        const ptrdiff_t line = (b.y + r) >> shared.down, x = b.x >> shared.across;
-        t.u[r] = j.out(j.to.u).line(line) + x;
-        t.v[r] = j.out(j.to.v).line(line) + x;
-    }
+    point_to_chroma(j.to, b, t, [&j](int plane) { return j.out(plane); });
     return t;
 }
 

@@ -219,22 +219,21 @@ class resampled_lines {
         const ptrdiff_t row = y.cell(line);
         const bool pair = line + 1 < end && y.cell(line + 1) == row && y.phase(line + 1);
         const ptrdiff_t below = pair ? y.next(line + 1) : y.next(line);
-        const int count = pair ? 2 : 1, held_below = held(below), a = keep(row, held_below);
-        const int c = below == row ? a : 1 - a;
+        const int count = pair ? 2 : 1, a = keep(row), c = below == row ? a : 1 - a;
         const resize_line two[2] = {{ring_[a], ring_[c], y.phase(line)},
                                     {ring_[a], ring_[c], y.phase(line + 1)}};
-        if (c == a || c == held_below)
+        if (held_[c] == below)
             r_.loops.down(strip_, two, count, dst, stride);
         else
             blend(below, c, two, count, dst, stride);
         return count;
     }
-    int held(ptrdiff_t row) const { return held_[0] == row ? 0 : held_[1] == row ? 1 : -1; }
-    // Where the row is kept, from now on if it was not; the one at `wanted` stays.
-    int keep(ptrdiff_t row, int wanted) {
-        int at = held(row);
-        if (at >= 0) return at;
-        at = wanted >= 0 ? 1 - wanted : held_[0] <= held_[1] ? 0 : 1;
+    // Where the row is kept, from now on if it was not, in the place of the earlier one: rows come in
+    // rising order.
+    int keep(ptrdiff_t row) {
+        for (int at = 0; at < 2; at++)
+            if (held_[at] == row) return at;
+        const int at = held_[0] <= held_[1] ? 0 : 1;
         blend(row, at, nullptr, 0, nullptr, 0);
         return at;
     }

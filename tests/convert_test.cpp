@@ -490,6 +490,11 @@ TEST_F(convert_test, deblocking_comes_first_and_is_the_librarys) {
         good("smooth." + format + " --size 32x16 -q -o luma --to yuv420");
         EXPECT_EQ(read("luma").substr(0, 32 * 16), smooth.substr(0, 32 * 16)) << format;
     }
+    // From tiles, too, in the planes that were coded.
+    good("blocks.t64x32 --size 32x16 -v -o tiles.rgb888 --deblock 4");
+    EXPECT_NE(got.err.find("t64x32 -> yuv420 -> yuv420 (simgp_dbf8x8_yuv 4) -> rgb888"),
+              std::string::npos)
+        << got.err;
     good("blocks.yuv420 --size 32x16 -o one.rgb565 --deblock 4 --resize 20x10 --rotate 180");
     good("smooth.yuv420 --size 32x16 -o two.rgb565 --resize 20x10 --rotate 180");
     EXPECT_EQ(read("one.rgb565"), read("two.rgb565"));

@@ -16,14 +16,6 @@
 #include <unistd.h>
 #endif
 
-#if defined(__SANITIZE_ADDRESS__)
-#define RIG_ASAN 1
-#elif defined(__has_feature)
-#if __has_feature(address_sanitizer)
-#define RIG_ASAN 1
-#endif
-#endif
-
 namespace rig {
 
 namespace {

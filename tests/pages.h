@@ -5,6 +5,15 @@
 #include <stddef.h>
 #include <stdint.h>
 
+// Whether AddressSanitizer is at work.
+#if defined(__SANITIZE_ADDRESS__)
+#define RIG_ASAN 1
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer)
+#define RIG_ASAN 1
+#endif
+#endif
+
 namespace rig {
 
 size_t page_size();

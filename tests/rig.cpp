@@ -6,13 +6,6 @@
 #include "areas.h"
 #include "simgp/simgp.h"
 
-#if defined(__SANITIZE_ADDRESS__)
-#define RIG_ASAN 1
-#elif defined(__has_feature)
-#if __has_feature(address_sanitizer)
-#define RIG_ASAN 1
-#endif
-#endif
 #ifdef RIG_ASAN
 #include <sanitizer/asan_interface.h>
 #endif

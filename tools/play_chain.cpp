@@ -1,7 +1,5 @@
 #include "tools/play_chain.h"
 
-#include <utility>
-
 namespace tools {
 
 namespace {
@@ -51,13 +49,7 @@ chain::chain(const picture_shape &from, int32_t colour, const look &wish, int wi
     edit.turn = turn.first;
     edit.width = width;
     edit.height = height;
-    if (wish.tiled) {
-        // Blocks are those of the planes that were coded.
-        edits first;
-        std::swap(first.deblock, edit.deblock);
-        if (first.deblock > 0) add(*from.format, false, first);
-        add(format_coded(SIMGP_FMT_T64X32), false, {});
-    }
+    if (wish.tiled) add(format_coded(SIMGP_FMT_T64X32), false, {});
     if (turn.second != SIMGP_ROT_NONE) {
         // Tiles cannot be turned.
         add(at.format->is_tiled() ? format_coded(SIMGP_FMT_YUV420) : turned(*at.format, turn.first),

@@ -39,6 +39,13 @@ int resize_cost(const pixel_format &f, const size &from, const size &to, const p
     return 2 + (f.is_rgb16() ? 10 : 0) + (f.chroma() != best ? 1 : 0);
 }
 
+// Blocks are those of the planes that were coded: chroma that has been repeated or dropped has others.
+int deblock_cost(const pixel_format &f, const pixel_format &source) {
+    const bool as_coded = f.chroma_x_shift() == source.chroma_x_shift() &&
+                          f.chroma_y_shift() == source.chroma_y_shift();
+    return as_coded ? 2 : 10;
+}
+
 // Of an odd number of columns (lines), the last one has a chroma sample of its own. If it comes
 // first, that sample is taken for two columns, and every other one is a column off.
 int turn_cost(const pixel_format &f, const size &from, int turn) {
@@ -154,6 +161,10 @@ struct plan {
                     go(done + 1, after, method::thumbnail,
                        bytes ? 6 : turn_cost(f, exchanged(to, true), turn));
                 }
+                break;
+            case method::deblock:
+                if (offered(f, f, method::deblock))
+                    go(done + 1, f, method::deblock, deblock_cost(f, source));
                 break;
             default:
                 if (offered(f, f, parts[done])) go(done + 1, f, parts[done], 2);

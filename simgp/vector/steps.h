@@ -46,6 +46,18 @@ inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
         [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
 }
 
+// Samples in steps of `Step`: vector(x) does so many of them from x on, one(x) one. The last step
+// ends at the last sample and may do some again.
+template <int Step = bytes, class Vector, class One>
+inline void in_steps(ptrdiff_t count, Vector vector, One one) {
+    if (count < Step) {
+        for (ptrdiff_t x = 0; x < count; x++) one(x);
+        return;
+    }
+    for (ptrdiff_t x = 0; x + Step < count; x += Step) vector(x);
+    vector(count - Step);
+}
+
 // Moves `pairs` >= 1 pairs in steps of a vector: whole(i) does `bytes` of them from pair i on,
 // half(i) half as many, one(i) one. The last step ends at the last pair and may do some again.
 template <class Whole, class Half, class One>

@@ -59,10 +59,10 @@ if command -v lintian >/dev/null; then
     [ -z "$said" ] || fault "lintian finds:" "$said"
 fi
 
-# A program in $root, whose folder /work has sources and packages, does all the rest.
+# A program in $root, whose folder /trial has sources and packages, does all the rest.
 cat >"$scratch/try.sh" <<'END'
 set -e
-cd /work
+cd /trial
 cc -std=c11 road.c -o road_pkg-config $(pkg-config --cflags --libs simgp)
 ./road_pkg-config
 cmake -S . -B build >/dev/null
@@ -83,7 +83,7 @@ target_link_libraries(road PRIVATE simgp::simgp)
 add_executable(road_static road.c)
 target_link_libraries(road_static PRIVATE simgp::simgp_static)
 END
-put_work_into() { # FOLDER
+put_trial_into() { # FOLDER
     mkdir -p "$1"
     cp "$scratch/try.sh" "$scratch/CMakeLists.txt" "$source_dir/examples/road.c" "${files[@]}" "$1"
 }
@@ -101,25 +101,25 @@ if [ "$(id -u)" = 0 ] && command -v debootstrap >/dev/null; then
 fi
 if [ -f "$clean" ]; then
     echo "In a clean system:"
-    put_work_into "$scratch/root/work"
+    put_trial_into "$scratch/root/trial"
     # What they depend on comes from the distribution.
-    timeout 300 chroot "$scratch/root" sh -c 'apt-get update && apt-get install -y --no-install-recommends /work/*.deb' \
+    timeout 300 chroot "$scratch/root" sh -c 'apt-get update && apt-get install -y --no-install-recommends /trial/*.deb' \
         >"$scratch/log" 2>&1 || {
         tail -n 20 "$scratch/log"
         fault "The packages cannot be installed."
         finish
     }
-    chroot "$scratch/root" sh /work/try.sh || fault "What is installed does not work."
+    chroot "$scratch/root" sh /trial/try.sh || fault "What is installed does not work."
     chroot "$scratch/root" apt-get purge -y $packages >"$scratch/log" 2>&1 || fault "The packages cannot be removed."
     left=$(cd "$scratch/root" && find usr etc var/lib/dpkg/info -path '*simgp*')
     [ -z "$left" ] || fault "Left behind when they are removed:" "$left"
 else
     echo "Unpacked into a folder; there is no clean system here:"
     for file in "${files[@]}"; do dpkg-deb -x "$file" "$scratch/root"; done
-    put_work_into "$scratch/work"
-    sed -i "s#^cd /work#cd '$scratch/work'#" "$scratch/work/try.sh"
+    put_trial_into "$scratch/trial"
+    sed -i "s#^cd /trial#cd '$scratch/trial'#" "$scratch/trial/try.sh"
     PATH=$scratch/root/usr/bin:$PATH LD_LIBRARY_PATH=$scratch/root/usr/lib/$triplet \
         PKG_CONFIG_PATH=$scratch/root/usr/lib/$triplet/pkgconfig CMAKE_PREFIX_PATH=$scratch/root/usr \
-        sh "$scratch/work/try.sh" || fault "What is unpacked does not work."
+        sh "$scratch/trial/try.sh" || fault "What is unpacked does not work."
 fi
 finish

@@ -2,7 +2,7 @@
 # name is there, no constant has another value, and the descriptors still have their form.
 . "$(dirname "$0")/gate.sh" "$1"
 
-stored=$source_dir/tests/package/abi
+stored=$source_dir/cmake/abi
 header=$stored/simgp-1.0.h
 libdir=$(dirname "$shared_library")
 suffix=
@@ -14,7 +14,7 @@ build() { # PROGRAM SOURCE [ARG ...]: in C, against the stored header and nothin
 run() { $emulator "$scratch/$1$suffix"; }
 
 # shellcheck disable=SC2086
-build user "$stored/user.c" "$shared_library" -Wl,-rpath,"$libdir" || fault "user.c does not build."
+build user "$(dirname "$0")/old_user.c" "$shared_library" -Wl,-rpath,"$libdir" || fault "old_user.c does not build."
 run user || fault "The program built against the stored header failed."
 
 # Every name, by its address.

@@ -1,0 +1,97 @@
+// What the x86 layers have in common: sums of products, said in their own vocabulary. Included at the end
+// of each.
+//
+// Besides the vocabulary, a layer gives
+//   add_pairs(a, b)      16-bit lanes: the sums of two neighbours each, of a and of b, block by block
+//   pack_bytes(a, b)     signed 16-bit lanes to bytes, block by block
+//   even_dwords(a, b)    dwords 0 and 2 of each block of a, then of b
+//   unpack_order(v)      what two steps of packing leave, put in order: granule k of block j belongs to
+//                        vector k
+#ifndef SIMD_X86_H
+#define SIMD_X86_H
+
+namespace simgp::SIMD_TARGET {
+
+// The pair of products fits 16 bits; the sum with the third wraps.
+template <int A, int B, int C>
+inline u16v dot(u8v ac, u16v b) {
+    return add(dot_pairs(ac, set_pair(static_cast<uint8_t>(A), static_cast<uint8_t>(C))),
+               mul(b, set_u16(static_cast<uint16_t>(B))));
+}
+template <int A, int B, int C, int D>
+inline u8v dot_high(rgb_v v) {
+    static_assert(limits::channel_weights<A, B, C>);
+    return add_u8(join_high(dot<A, B, C>(v.ac_even, v.b_even), dot<A, B, C>(v.ac_odd, v.b_odd)),
+                  set_u8(D));
+}
+template <int A, int B, int C, int D>
+inline u16v even_dot(rgb_v v) {
+    static_assert(limits::channel_factors<A, B, C>);
+    return add(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
+}
+
+// The same with factors that are known at run time.
+struct channel_factors {
+    u8v ac;
+    u16v b;
+};
+inline channel_factors set_channel_factors(int a, int b, int c) {
+    return {set_pair(static_cast<uint8_t>(a), static_cast<uint8_t>(c)),
+            set_u16(static_cast<uint16_t>(b))};
+}
+inline u16v dot(u8v ac, u16v b, const channel_factors &f) {
+    return add(dot_pairs(ac, f.ac), mul(b, f.b));
+}
+inline u8v dot_high(rgb_v v, const channel_factors &f) {
+    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
+}
+inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
+
+struct channels_v {
+    u8v c[3];
+};
+inline channels_v channels_of(rgb_v v) {
+    return {join(even(v.ac_even), v.ac_odd), join(v.b_even, v.b_odd),
+            join_high(v.ac_even, v.ac_odd)};
+}
+
+// Pixels of four bytes, a vector's worth of each quarter of what is read.
+struct quads_v {
+    u8v v[4];
+};
+inline quads_v load_quads(const uint8_t *p) {
+    return {{load(p), load(p + bytes), load(p + 2 * bytes), load(p + 3 * bytes)}};
+}
+inline u8v set_quad(bool skips_first, int a, int b, int c) {
+    const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
+    const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;
+    return set_u32(skips_first ? all << 8 : all);
+}
+// The multiply-add takes weights of bytes and samples less 128; `offset` makes up for these, after
+// the shift, as the weights' sum is even.
+struct quad_weights {
+    u8v weights, offset;
+};
+inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
+    return {set_quad(skips_first, a, b, c), set_u8(static_cast<uint8_t>((a + b + c) / 2 + d))};
+}
+inline u8v dot_high(const quads_v &v, const quad_weights &w) {
+    const auto products = [&](u8v x) { return dot_pairs(w.weights, bit_xor(x, set_u8(128))); };
+    const auto half = [&](u8v x, u8v y) { return sar<8>(add_pairs(products(x), products(y))); };
+    return add_u8(unpack_order(pack_bytes(half(v.v[0], v.v[1]), half(v.v[2], v.v[3]))), w.offset);
+}
+using quad_factors = u8v;
+inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
+    return set_quad(skips_first, a, b, c);
+}
+inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
+    const u8v low = even_dwords(v.v[0], v.v[1]), high = even_dwords(v.v[2], v.v[3]);
+    const auto dot = [&](u8v k) {
+        return sub_sat(c, add_pairs(dot_pairs(low, k), dot_pairs(high, k)));
+    };
+    return unpack_order(join_high(dot(f), dot(g)));
+}
+
+}  // namespace simgp::SIMD_TARGET
+
+#endif

@@ -1,0 +1,272 @@
+// Rows between any two formats that move bytes and know no matrix: RGB to RGB, YUV to YUV.
+#ifndef SIMGP_VECTOR_ANY_BYTES_H
+#define SIMGP_VECTOR_ANY_BYTES_H
+
+#include <string.h>
+
+#include "rows/any.h"
+#include "simgp/vector/steps.h"
+
+namespace simgp::SIMD_TARGET {
+
+// RGB to RGB
+// ------------------------------------------------------------------------------------------------
+
+template <rgb_in In>
+inline constexpr int size_in = In == rgb_in::words   ? 2
+                               : In == rgb_in::three ? 3
+                                                     : 4;
+template <rgb_in In>
+inline rgb_v load_pixels(const uint8_t *p) {
+    if constexpr (In == rgb_in::words) return load_565(p);
+    if constexpr (In == rgb_in::three) return load_888(p);
+    if constexpr (In == rgb_in::four) return load_8888<0>(p);
+    if constexpr (In == rgb_in::four_alpha_first) return load_8888<1>(p);
+}
+
+template <rgb_in In>
+static void split_pixels_vectors(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count) {
+    constexpr int size = size_in<In>;
+    row_of_steps<false>(
+        count, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
+        [&](ptrdiff_t x, rgb_v p) {
+            const channels_v c = channels_of(p);
+            for (int k = 0; k < 3; k++) store(channels[k] + x, c.c[k]);
+        },
+        [&](ptrdiff_t x, int part) {
+            uint8_t pixels[bytes * size] = {}, to[3][bytes];
+            uint8_t *const planes[] = {to[0], to[1], to[2]};
+            memcpy(pixels, src + size * x, size_t(part) * size);
+            split_pixels_vectors<In>(pixels, planes, bytes);
+            for (int k = 0; k < 3; k++) memcpy(channels[k] + x, to[k], size_t(part));
+        });
+}
+
+template <pixel_kind Kind>
+inline void store_channels(uint8_t *dst, u8v first, u8v g, u8v last, bool alpha_first) {
+    if constexpr (Kind == pixel_kind::three) {
+        store_zip3(dst, first, g, last);
+    } else if constexpr (Kind == pixel_kind::four) {
+        first = natural_to_by4(first), g = natural_to_by4(g), last = natural_to_by4(last);
+        if (alpha_first)
+            store_zip4(dst, set_u8(255), first, g, last);
+        else
+            store_zip4(dst, first, g, last, set_u8(255));
+    } else {
+        // Bits of bytes, by shifts of words: those that come from the neighbour are dropped.
+        const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
+        const u8v high = bit_or(bit_and(first, set_u8(0xF8)), bits(shr<5>(as_u16(g)), 0x07));
+        const u8v low = bit_or(bits(shl<3>(as_u16(g)), 0xE0), bits(shr<3>(as_u16(last)), 0x1F));
+        store_zip8(dst, natural_to_by8(low), natural_to_by8(high));
+    }
+}
+
+// Calls convert(p, q) for every `bytes` pixels of `size` bytes at q that become pixels of `to_size`
+// bytes at p; what is left goes through the stack.
+template <int Size, int ToSize, class Convert>
+inline void repack_in_steps(const uint8_t *src, uint8_t *dst, ptrdiff_t count, Convert convert) {
+    row_of_steps<false>(
+        count, [&](ptrdiff_t x) { return src + Size * x; },
+        [&](ptrdiff_t x, const uint8_t *from) { convert(dst + ToSize * x, from); },
+        [&](ptrdiff_t x, int part) {
+            uint8_t pixels[bytes * Size] = {}, to[bytes * ToSize];
+            memcpy(pixels, src + Size * x, size_t(part) * Size);
+            convert(to, pixels);
+            memcpy(dst + ToSize * x, to, size_t(part) * ToSize);
+        });
+}
+
+template <rgb_in In, pixel_kind To>
+static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    repack_in_steps<size_in<In>, int(To) + 2>(src, dst, count, [&](uint8_t *p, const uint8_t *q) {
+        channels_v c = channels_of(load_pixels<In>(q));
+        if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
+        store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
+    });
+}
+static void four_to_words(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    (order.from_alpha_first
+         ? repack_pixels<rgb_in::four_alpha_first, pixel_kind::words>
+         : repack_pixels<rgb_in::four, pixel_kind::words>)(order, src, dst, count);
+}
+static void exchange_three(const repacking &, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
+    repack_in_steps<3, 3>(src, dst, count,
+                          [](uint8_t *p, const uint8_t *q) { exchange_888(p, q); });
+}
+static void three_to_four(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    const widen_moves m = set_widen_moves(order.exchange, order.to_alpha_first);
+    repack_in_steps<3, 4>(src, dst, count,
+                          [&](uint8_t *p, const uint8_t *q) { repack_888_to_8888(p, q, m); });
+}
+static void four_to_three(const repacking &order, const uint8_t *src, uint8_t *dst,
+                          ptrdiff_t count) {
+    const narrow_moves m = set_narrow_moves(order.exchange, order.from_alpha_first);
+    repack_in_steps<4, 3>(src, dst, count,
+                          [&](uint8_t *p, const uint8_t *q) { repack_8888_to_888(p, q, m); });
+}
+
+// The first byte of each byte's pixel, from the start of the block.
+struct first_byte {
+    alignas(64) uint8_t lane[bytes];
+    constexpr first_byte() : lane() {
+        for (int i = 0; i < bytes; i++) lane[i] = static_cast<uint8_t>(i % 16 / 4 * 4);
+    }
+};
+static constexpr first_byte first_byte_of_pixel;
+
+// Four bytes to four: each stays in its pixel.
+static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *dst,
+                         ptrdiff_t count) {
+    // Where the bytes of a pixel come from.
+    const int skip = order.from_alpha_first, at = order.to_alpha_first;
+    uint8_t from[4];
+    from[at ? 0 : 3] = skip ? 0 : 3;
+    for (int k = 0; k < 3; k++)
+        from[at + k] = static_cast<uint8_t>(skip + (order.exchange ? 2 - k : k));
+    const u8v index = add_u8(set_u32(uint32_t(from[0]) | uint32_t(from[1]) << 8 |
+                                     uint32_t(from[2]) << 16 | uint32_t(from[3]) << 24),
+                             load(first_byte_of_pixel.lane));
+    if (count < bytes / 4) {
+        for (ptrdiff_t x = 0; x < count; x++)
+            for (int k = 0; k < 4; k++) dst[4 * x + k] = src[4 * x + from[k]];
+        return;
+    }
+    const auto vector = [&](ptrdiff_t i) { store(dst + i, shuffle(load(src + i), index)); };
+    const ptrdiff_t size = 4 * count;
+    ptrdiff_t i = 0;
+    for (; i + 4 * bytes <= size; i += 4 * bytes)
+        for (int k = 0; k < 4; k++) vector(i + k * bytes);
+    for (; i + bytes < size; i += bytes) vector(i);
+    vector(size - bytes);
+}
+
+// YUV to YUV
+// ------------------------------------------------------------------------------------------------
+
+static void any_split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
+                             ptrdiff_t pairs, bool luma_first) {
+    in_steps<bytes / 2>(
+        pairs,
+        [&](ptrdiff_t i) {
+            const pair_u8 p = load_split_natural(src + 4 * i);
+            store(y + 2 * i, luma_first ? p.even : p.odd);
+            store_split(u + i, v + i, luma_first ? p.odd : p.even);
+        },
+        [&](ptrdiff_t i) {
+            const uint8_t *const luma = src + 4 * i + !luma_first;
+            const uint8_t *const chroma = src + 4 * i + luma_first;
+            y[2 * i] = luma[0];
+            y[2 * i + 1] = luma[2];
+            u[i] = chroma[0];
+            v[i] = chroma[2];
+        });
+}
+
+static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                            ptrdiff_t pairs, bool luma_first) {
+    in_steps<bytes / 2>(
+        pairs,
+        [&](ptrdiff_t i) {
+            const u8v luma = natural_to_by8(load(y + 2 * i));
+            const u8v chroma = natural_to_by8(load_zip(u + i, v + i));
+            store_zip8(dst + 4 * i, luma_first ? luma : chroma, luma_first ? chroma : luma);
+        },
+        [&](ptrdiff_t i) {
+            uint8_t *const luma = dst + 4 * i + !luma_first, *const chroma =
+                                                                 dst + 4 * i + luma_first;
+            luma[0] = y[2 * i];
+            luma[2] = y[2 * i + 1];
+            chroma[0] = u[i];
+            chroma[2] = v[i];
+        });
+}
+
+template <bool LumaFirst, bool Pairs>
+static void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                          uint8_t *u, uint8_t *v, ptrdiff_t pairs) {
+    in_steps<bytes / 2>(
+        pairs,
+        [&](ptrdiff_t i) {
+            const pair_u8 p = load_split(src0 + 4 * i);
+            const pair_u8 q = load_split(src1 + 4 * i);
+            const u8v chroma = by8_to_natural(LumaFirst ? p.odd : p.even);
+            store(y0 + 2 * i, by8_to_natural(LumaFirst ? p.even : p.odd));
+            store(y1 + 2 * i, by8_to_natural(LumaFirst ? q.even : q.odd));
+            if constexpr (Pairs)
+                store(u + 2 * i, chroma);
+            else
+                store_split(u + i, v + i, chroma);
+        },
+        [&](ptrdiff_t i) {
+            constexpr int luma = LumaFirst ? 0 : 1, chroma = 1 - luma;
+            for (int k = 0; k < 2; k++) {
+                y0[2 * i + k] = src0[4 * i + 2 * k + luma];
+                y1[2 * i + k] = src1[4 * i + 2 * k + luma];
+                *(Pairs ? u + 2 * i + k : k ? v + i : u + i) = src0[4 * i + 2 * k + chroma];
+            }
+        });
+}
+template <bool Pairs>
+static void any_groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                              uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool luma_first) {
+    (luma_first ? groups_to_420<true, Pairs> : groups_to_420<false, Pairs>)(src0, src1, y0, y1, u,
+                                                                            v, pairs);
+}
+
+static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count, [&](ptrdiff_t x) { store(dst + x, avg_u8(load(a + x), load(b + x))); },
+        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[x] + b[x] + 1) >> 1); });
+}
+static void any_mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count,
+        [&](ptrdiff_t x) {
+            const pair_u8 p = load_split_natural(a + 2 * x);
+            store(dst + x, avg_u8(p.even, p.odd));
+        },
+        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[2 * x] + a[2 * x + 1] + 1) >> 1); });
+}
+static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
+    const s16v two = as_s16(set_u16(2));
+    in_steps(
+        count,
+        [&](ptrdiff_t x) {
+            const auto sums = [&](ptrdiff_t at) {
+                const u8v of_a = load(a + at), of_b = load(b + at);
+                const s16v of_even = add(as_s16(even(of_a)), as_s16(even(of_b)));
+                const s16v of_odd = add(as_s16(odd(of_a)), as_s16(odd(of_b)));
+                return sar<2>(add(add(of_even, of_odd), two));
+            };
+            store(dst + x, by8_to_natural(narrow(sums(2 * x), sums(2 * x + bytes))));
+        },
+        [&](ptrdiff_t x) {
+            const int sum = a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1];
+            dst[x] = static_cast<uint8_t>((sum + 2) >> 2);
+        });
+}
+
+// What follows the last sample may lie behind the line.
+static void any_every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count - 1, [&](ptrdiff_t x) { store(dst + x, load_split_natural(a + 2 * x).even); },
+        [&](ptrdiff_t x) { dst[x] = a[2 * x]; });
+    dst[count - 1] = a[2 * (count - 1)];
+}
+static void any_twice(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
+    in_steps(
+        count / 2,
+        [&](ptrdiff_t i) {
+            const u8v v = natural_to_by8(load(a + i));
+            store_zip8(dst + 2 * i, v, v);
+        },
+        [&](ptrdiff_t i) { dst[2 * i] = dst[2 * i + 1] = a[i]; });
+    if (count & 1) dst[count - 1] = a[count / 2];
+}
+
+}  // namespace simgp::SIMD_TARGET
+
+#endif
