@@ -833,7 +833,7 @@ TEST_F(convert_test, files_appear_when_they_are_complete) {
 TEST_F(convert_test, the_demonstration_leaves_its_pictures) {
     good("--demo pictures testcard:320x240@3");
     EXPECT_EQ(files("pictures"),
-              (std::set<std::string>{"every-rgb-format.png", "every-turn.png",
+              (std::set<std::string>{"at-a-glance.png", "every-rgb-format.png", "every-turn.png",
                                      "every-yuv-to-rgb.png", "right-and-wrong-colour.png",
                                      "road-to-the-screen.png", "tiles-and-dithering.png"}));
     for (const std::string &name : files("pictures")) {
@@ -845,7 +845,7 @@ TEST_F(convert_test, the_demonstration_leaves_its_pictures) {
 // One frame is enough for it, in another colour too.
 TEST_F(convert_test, the_demonstration_of_a_still) {
     good("--demo pictures testcard:64x48@1 --colour bt709");
-    EXPECT_EQ(files("pictures").size(), 6u);
+    EXPECT_EQ(files("pictures").size(), 7u);
 }
 
 TEST_F(convert_test, the_list_names_formats_colours_and_dithered_conversions) {

@@ -3,7 +3,9 @@
 #include <string.h>
 
 #include <algorithm>
+#include <cmath>
 #include <filesystem>
+#include <numbers>
 
 #include "tools/job.h"
 #include "tools/rgb.h"
@@ -108,11 +110,16 @@ picture gradient(int width, int height) {
     return p;
 }
 
-// `width` x `height` pixels from the middle of an RGB picture, each drawn `scale` times as large.
-picture enlarged(const picture &p, int width, int height, int scale) {
+enum class part { middle, corner };
+
+// `width` x `height` pixels from the middle or the upper left corner of an RGB picture, each drawn
+// `scale` times as large.
+picture enlarged(const picture &p, int width, int height, int scale, part which = part::middle) {
     width = std::min(width, p.width());
     height = std::min(height, p.height());
-    const int left = (p.width() - width) / 2, top = (p.height() - height) / 2;
+    const bool middle = which == part::middle;
+    const int left = middle ? (p.width() - width) / 2 : 0;
+    const int top = middle ? (p.height() - height) / 2 : 0;
     const int bytes = p.format().planes[0].bytes;
     picture large({&p.format(), width * scale, height * scale});
     for (int y = 0; y < large.height(); ++y)
@@ -181,6 +188,80 @@ std::vector<tile> road_to_the_screen(picture &frame) {
     return tiles;
 }
 
+// What a decoder makes of a plane of `width` x `height` samples that was coded in blocks of 8 x 8:
+// their cosine transforms, rounded to multiples of `step`.
+void code_coarsely(picture &p, int plane, int width, int height, double step) {
+    double cosine[8][8];  // [frequency][place], orthonormal
+    for (int f = 0; f < 8; ++f)
+        for (int at = 0; at < 8; ++at)
+            cosine[f][at] = (f == 0 ? std::sqrt(0.125) : 0.5) *
+                            std::cos((2 * at + 1) * f * std::numbers::pi / 16);
+    for (int top = 0; top < height; top += 8)
+        for (int left = 0; left < width; left += 8) {
+            double block[8][8], half[8][8] = {};
+            // Blocks that lie across the edge of the picture go on with its last samples.
+            for (int y = 0; y < 8; ++y)
+                for (int x = 0; x < 8; ++x)
+                    block[y][x] =
+                        p.line(plane, std::min(top + y, height - 1))[std::min(left + x, width - 1)];
+            for (int y = 0; y < 8; ++y)
+                for (int f = 0; f < 8; ++f)
+                    for (int x = 0; x < 8; ++x) half[y][f] += block[y][x] * cosine[f][x];
+            for (int g = 0; g < 8; ++g)
+                for (int f = 0; f < 8; ++f) {
+                    double sum = 0;
+                    for (int y = 0; y < 8; ++y) sum += half[y][f] * cosine[g][y];
+                    block[g][f] = step * std::round(sum / step);
+                }
+            for (int y = 0; y < 8 && top + y < height; ++y)
+                for (int x = 0; x < 8 && left + x < width; ++x) {
+                    double sum = 0;
+                    for (int g = 0; g < 8; ++g)
+                        for (int f = 0; f < 8; ++f)
+                            sum += block[g][f] * cosine[g][y] * cosine[f][x];
+                    p.line(plane, top + y)[left + x] =
+                        uint8_t(std::clamp(std::lround(sum), 0l, 255l));
+                }
+        }
+}
+
+// What is done most to frames: resized and turned for a screen, shown in 24 and 16 bits, deblocked.
+std::vector<tile> at_a_glance(picture &frame) {
+    std::vector<tile> tiles;
+    const pixel_format &wide = format_coded(SIMGP_FMT_RGB888);
+    const pixel_format &narrow = format_coded(SIMGP_FMT_RGB565);
+    const edits fitting = shrunk_to(frame, 320);
+    road shrink(frame.shape(), frame.format(), false, fitting);
+    picture &small = shrink.run(frame);
+    auto shown = [](picture &from, const pixel_format &to, bool dither, const edits &edit) {
+        road r(from.shape(), to, dither, edit);
+        return to_rgb888(r.run(from));
+    };
+    auto part_of = [&](const picture &p, int scale, part which, const std::string &label) {
+        tiles.push_back({enlarged(p, std::max(small.width() / scale, 1),
+                                  std::max(small.height() / scale, 1), scale, which),
+                         label});
+    };
+    tiles.push_back({shown(small, wide, false, {}), "24 bits"});
+    part_of(shown(small, narrow, false, {}), 3, part::corner, "x 3: 16 bits");
+    part_of(shown(small, narrow, true, {}), 3, part::corner, "x 3: 16 bits dithered");
+
+    edits turned = fitting;
+    turned.turn = SIMGP_ROT_180;
+    tiles.push_back({shown(frame, wide, false, turned), "turned"});
+    picture coded = small;  // which may be the frame itself
+    for (int plane = 0; plane < 3; ++plane) {
+        const int half = plane > 0;
+        code_coarsely(coded, plane, (small.width() + half) >> half, (small.height() + half) >> half,
+                      56);
+    }
+    part_of(shown(coded, wide, false, {}), 2, part::middle, "x 2: coded in blocks");
+    edits deblocked;
+    deblocked.deblock = 12;
+    part_of(shown(coded, wide, false, deblocked), 2, part::middle, "x 2: deblocked");
+    return tiles;
+}
+
 // Every rotation code in formats that are turned in different ways: a row for each format.
 std::vector<tile> every_turn(picture &frame) {
     std::vector<tile> tiles;
@@ -215,10 +296,15 @@ void demo(const std::string &directory, const source_options &options) {
                           : colour_named(wanted.colour);
     std::vector<picture> frames = sample_frames(*in, c);
     const std::string folder = directory + "/";
+    save(folder + "at-a-glance.png", at_a_glance(frames.front()), 3);
+    printf("%sat-a-glance.png: 24 and 16 bits, dithered, deblocked, resized and turned\n",
+           folder.c_str());
     const std::vector<tile> rgb = every_rgb(frames);
     save(folder + "every-rgb-format.png", rgb, int(rgb.size() / frames.size()));
     printf("%severy-rgb-format.png: %s in every RGB format\n", folder.c_str(),
-           wanted.path == "-" ? "the video" : in->name().c_str());
+           wanted.path != "-"  ? in->name().c_str()
+           : frames.size() > 1 ? "the video"
+                               : "the picture");
     save(folder + "every-yuv-to-rgb.png", every_pair(), 7);
     printf("%severy-yuv-to-rgb.png: the test card through every YUV to RGB conversion\n",
            folder.c_str());

@@ -1,6 +1,7 @@
 #!/bin/bash
 # demo.sh SIMGP_CONVERT FOLDER [FILE]: writes the demonstration's pictures into FOLDER, from FILE or the
-# test card. What is neither Y4M nor PNG is decoded by ffmpeg, if that is installed.
+# test card. What is neither Y4M nor PNG is decoded by ffmpeg, if that is installed. With the test card goes a
+# photograph, in FOLDER/photo, if the packages palapeli-data and libjpeg-turbo-progs are installed.
 set -euo pipefail
 
 [ $# -ge 2 ] && [ $# -le 3 ] || {
@@ -9,7 +10,18 @@ set -euo pipefail
 }
 convert=$1 folder=$2 file=${3:-}
 
-[ -n "$file" ] || exec "$convert" --demo "$folder"
+# In the public domain, by John Severns; docs/pictures/README.md says more.
+photo=/usr/share/palapeli/collection/european-honey-bee.jpg
+if [ -z "$file" ]; then
+    "$convert" --demo "$folder"
+    if [ ! -r $photo ] || ! command -v djpeg >/dev/null; then
+        echo "No photograph beside the test card: palapeli-data or libjpeg-turbo-progs is not installed"
+        exit 0
+    fi
+    echo "The same of a photograph:"
+    djpeg -scale 3/8 $photo | "$convert" --demo "$folder/photo" -
+    exit 0
+fi
 
 [ -r "$file" ] && [ -f "$file" ] || {
     echo "demo: cannot read '$file'" >&2

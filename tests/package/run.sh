@@ -15,6 +15,9 @@ case $1 in
         mkdir -p "$2/bench"
         printf '#!/bin/sh\necho measured "$@"\n' >"$2/bench/simgp-bench"
         chmod +x "$2/bench/simgp-bench"
+        mkdir -p "$2/tools"
+        printf '#!/bin/sh\necho converted "$@"\n[ "$3" != - ] || cat >/dev/null\n' >"$2/tools/simgp-convert"
+        chmod +x "$2/tools/simgp-convert"
         [ -z "${BREAK:-}" ] || { echo "error: broken"; exit 1; }
         ;;
 esac
@@ -40,4 +43,14 @@ grep -q '\[2/2\] Building second' elsewhere/bench/build.log || fault "On a termi
 BREAK=yes SIMGP_BUILD_DIR=elsewhere script -qec "'$source_dir/run' bench" /dev/null >"$scratch/log" 2>&1 &&
     fault "On a terminal, a build that failed went unnoticed."
 grep -q 'error: broken' "$scratch/log" || fault "On a terminal, a build failed without a word."
+
+# The demonstration does without the photograph where its package cannot be had. Root, to ask nobody else.
+printf '#!/bin/sh\ncase "$*" in *palapeli-data) echo unknown ;; *) echo installed ;; esac\n' >"$scratch/bin/dpkg-query"
+printf '#!/bin/sh\necho "E: no such package"\nexit 100\n' >"$scratch/bin/apt-get"
+printf '#!/bin/sh\necho 0\n' >"$scratch/bin/id"
+chmod +x "$scratch"/bin/*
+said=$(SIMGP_BUILD_DIR=elsewhere "$source_dir/run" demo 2>&1) ||
+    fault "Without a package for the photograph, ./run demo failed:" "$said"
+grep -qx 'Installing with apt-get: palapeli-data' <<<"$said" || fault "./run demo did not ask for the photograph:" "$said"
+grep -qx 'converted --demo demo' <<<"$said" || fault "Without the photograph, ./run demo shows no test card:" "$said"
 finish
