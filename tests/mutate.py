@@ -32,7 +32,7 @@ TESTS = [
     ("tools/probe.cpp tools/stream.* tools/h264.*", "probe"),
     ("tools/main.h tools/text.* tools/fault.h tools/progress.*", "convert probe"),
     ("tools/*", "convert"),
-    ("simgp/vector/any.h simgp/csc_any.cpp rows/any.h", "csc_any"),
+    ("simgp/vector/any*.h simgp/any.cpp simgp/csc_any.cpp rows/any.h", "csc_any"),
     ("*/deblock.*", "deblock"),
     ("simgp/vector/steps.h", "layout yuv2rgb rgb2yuv csc_any"),
     ("*/dither.*", "dither resize_rot csc"),
