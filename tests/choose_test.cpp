@@ -89,6 +89,18 @@ TEST(choice, is_the_best_that_the_processor_has) {
     }
 }
 
+// The build's list of targets has no name that the choice does not know.
+TEST(choice, knows_every_target_that_is_compiled) {
+    std::istringstream compiled(SIMGP_TARGETS);
+    std::string name;
+    while (compiled >> name) {
+        bool known = false;
+        for (int t = 0; t < int(target::count); t++)
+            known = known || simgp::target_name(target(t)) == name;
+        EXPECT_TRUE(known) << name;
+    }
+}
+
 // Each bit that a target needs is looked at: without it the processor has the next lower one.
 #if defined(__x86_64__) || defined(__i386__)
 TEST(choice, follows_the_words_of_the_processor) {

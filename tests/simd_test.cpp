@@ -55,4 +55,9 @@ LAYER(avx2)
 LAYER(avx512)
 #endif
 
+TEST(simd, every_layer_is_tested) {
+    const auto *suite = testing::UnitTest::GetInstance()->current_test_suite();
+    EXPECT_EQ(suite->total_test_count() - 1, SIMGP_LAYERS);
+}
+
 }  // namespace
