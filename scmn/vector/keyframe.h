@@ -19,8 +19,7 @@ inline u8v codes_at(const uint8_t *p, u8v mask, u8v code) {
 // the pairs numbers that min_s16 can compare. Here for four vectors.
 inline bool zeros_near(const uint8_t *p, u16v either) {
     const auto pairs = [=](int i) { return as_s16(bit_and(as_u16(load(p + i * bytes)), either)); };
-    const u16v least =
-        as_u16(min_s16(min_s16(pairs(0), pairs(1)), min_s16(pairs(2), pairs(3))));
+    const u16v least = as_u16(min_s16(min_s16(pairs(0), pairs(1)), min_s16(pairs(2), pairs(3))));
     const u16v folded = bit_or(bit_or(least, shr<8>(least)), set_u16(0xFF00));
     return first_zero(as_u8(folded)) < bytes;
 }
