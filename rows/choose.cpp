@@ -91,6 +91,7 @@ cpu detect() { return {}; }
 row_table tables[size_t(target::count)];
 bool available[size_t(target::count)];
 target best = target::scalar;
+
 // The rows of a target take the place of the scalar ones.
 row_table &add_table(target t) {
     available[size_t(t)] = true;

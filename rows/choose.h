@@ -32,8 +32,8 @@ bool target_available(target t);
 const row_table &rows_of(target t);
 
 // The rows in use: those of the most wanted target that is available, unless a test or a benchmark
-// has forced others. The choice is made at the first call, on whatever thread that is. It stands here
-// because a call is a third of the time of a fill of 256 bytes.
+// has forced others. The choice is made at the first call, on whatever thread that is. Inline,
+// as a call shows in fills of some hundred bytes.
 extern std::atomic<const row_table *> live_table;  // null until the choice is made
 const row_table &choose_rows();
 inline const row_table &live_rows() {
