@@ -8,8 +8,6 @@
 #include <sched.h>
 #endif
 
-#include <atomic>
-
 #include "areas.h"  // SIMGP_AREAS, made by the build from its list
 
 #if defined(__x86_64__) || defined(__i386__)
@@ -19,6 +17,8 @@
 #endif
 
 namespace simgp {
+
+std::atomic<const row_table *> live_table;
 
 // clang-format off
 #define DECLARE(area) void fill_##area(area##_rows &);
@@ -91,7 +91,6 @@ cpu detect() { return {}; }
 row_table tables[size_t(target::count)];
 bool available[size_t(target::count)];
 target best = target::scalar;
-std::atomic<const row_table *> live_table;
 
 // The rows of a target take the place of the scalar ones.
 row_table &add_table(target t) {
@@ -175,13 +174,9 @@ const row_table &rows_of(target t) {
     return tables[size_t(t)];
 }
 
-const row_table &live_rows() {
-    const row_table *table = live_table.load(std::memory_order_acquire);
-    if (!table) {
-        ensure_tables();
-        table = live_table.load(std::memory_order_acquire);
-    }
-    return *table;
+const row_table &choose_rows() {
+    ensure_tables();
+    return *live_table.load(std::memory_order_acquire);
 }
 
 target live_target() { return target(&live_rows() - tables); }

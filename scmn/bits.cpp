@@ -43,12 +43,14 @@ static inline uint32_t little_endian(uint32_t x) {
 template <bool Msb>
 static inline int32_t load_cache(scmn_bsr_ctx *ctx, int32_t nbytes) {
     const intptr_t left = bytes_left(ctx->cur, ctx->last);
-    if (left >= 4 && nbytes >= 4) {
+    if (left >= 4 && nbytes >= 1) {
+        const int32_t count = nbytes < 4 ? nbytes : 4, excess = 32 - 8 * count;
         uint32_t word;
         memcpy(&word, ctx->cur, 4);
-        ctx->cache = Msb ? big_endian(word) : little_endian(word);
-        ctx->bits = 32;
-        ctx->cur += 4;
+        ctx->cache =
+            Msb ? big_endian(word) >> excess << excess : little_endian(word) << excess >> excess;
+        ctx->bits = 8 * count;
+        ctx->cur += count;
         return 0;
     }
     const int32_t count = left < nbytes ? static_cast<int32_t>(left) : nbytes;
@@ -66,10 +68,19 @@ static inline int32_t load_cache(scmn_bsr_ctx *ctx, int32_t nbytes) {
 
 // The refill of the context, without a call where it is the library's own.
 template <bool Msb>
+static inline bool has_own_refill(const scmn_bsr_ctx *ctx) {
+    return ctx->refill == (Msb ? scmn_bsr_flush : scmn_bsr_le_flush);
+}
+template <bool Msb>
 static inline int32_t refill(scmn_bsr_ctx *ctx, int32_t nbytes) {
-    if (ctx->refill == (Msb ? scmn_bsr_flush : scmn_bsr_le_flush))
-        return load_cache<Msb>(ctx, nbytes);
-    return ctx->refill(ctx, nbytes);
+    return has_own_refill<Msb>(ctx) ? load_cache<Msb>(ctx, nbytes) : ctx->refill(ctx, nbytes);
+}
+
+// Are four bytes at hand for the library's own refill? What does not begin with this question saves
+// registers for the refill's call, so it is a function of its own that is jumped to.
+template <bool Msb>
+static inline bool word_at_hand(const scmn_bsr_ctx *ctx) {
+    return has_own_refill<Msb>(ctx) && bytes_left(ctx->cur, ctx->last) >= 4;
 }
 
 static inline void drop(scmn_bsr_ctx *ctx, int32_t n) {
@@ -97,6 +108,17 @@ int32_t scmn_bsr_le_flush(scmn_bsr_ctx *ctx, int32_t nbytes) {
     return load_cache<false>(ctx, nbytes);
 }
 
+// `high` are the bits of the cache, fewer than n; `loaded` what a refill returned.
+static inline uint32_t read_on(scmn_bsr_ctx *ctx, uint32_t high, int32_t rest, int32_t loaded) {
+    if (loaded != 0) return 0xFFFFFFFF;
+    const uint32_t result = high | shr(ctx->cache, minus(32, rest));
+    drop(ctx, rest);
+    return result;
+}
+[[gnu::noinline]] static uint32_t read_at_end(scmn_bsr_ctx *ctx, uint32_t high, int32_t rest) {
+    return read_on(ctx, high, rest, refill<true>(ctx, 4));
+}
+
 uint32_t scmn_bsr_read(scmn_bsr_ctx *ctx, int32_t n) {
     const uint32_t high =
         shr(ctx->cache, minus(32, n));  // where bits < n: the valid ones, then zeros
@@ -104,12 +126,9 @@ uint32_t scmn_bsr_read(scmn_bsr_ctx *ctx, int32_t n) {
         drop(ctx, n);
         return high;
     }
-    const int32_t have = ctx->bits;
-    if (refill<true>(ctx, 4) != 0) return 0xFFFFFFFF;
-    const int32_t rest = minus(n, have);
-    const uint32_t result = high | shr(ctx->cache, minus(32, rest));
-    drop(ctx, rest);
-    return result;
+    const int32_t rest = minus(n, ctx->bits);
+    if (word_at_hand<true>(ctx)) return read_on(ctx, high, rest, load_cache<true>(ctx, 4));
+    return read_at_end(ctx, high, rest);
 }
 
 uint32_t scmn_bsr_read1(scmn_bsr_ctx *ctx) {
@@ -120,27 +139,28 @@ uint32_t scmn_bsr_read1(scmn_bsr_ctx *ctx) {
     return result;
 }
 
-void scmn_bsr_skip(scmn_bsr_ctx *ctx, int32_t n) {
-    const int32_t have = ctx->bits;
-    if (have < n) {
-        if (refill<true>(ctx, 4) != 0) return;
-        n = minus(n, have);
+// Of n bits, more than the cache holds. Returns false at the end.
+static inline bool skip_on(scmn_bsr_ctx *ctx, int32_t rest, int32_t loaded) {
+    if (loaded == 0) drop(ctx, rest);
+    return loaded == 0;
+}
+[[gnu::noinline]] static bool skip_at_end(scmn_bsr_ctx *ctx, int32_t rest) {
+    return skip_on(ctx, rest, refill<true>(ctx, 4));
+}
+static inline bool skip(scmn_bsr_ctx *ctx, int32_t n) {
+    if (ctx->bits >= n) {
+        drop(ctx, n);
+        return true;
     }
-    drop(ctx, n);
+    const int32_t rest = minus(n, ctx->bits);
+    if (word_at_hand<true>(ctx)) return skip_on(ctx, rest, load_cache<true>(ctx, 4));
+    return skip_at_end(ctx, rest);
 }
 
-uint32_t scmn_bsr_peek(scmn_bsr_ctx *ctx, int32_t n) {
-    if (ctx->bits < n) {
-        const int32_t have = ctx->bits;
-        const int32_t room = minus(32, have) / 8;
-        if (room >= 1) {
-            const uint32_t old = ctx->cache;
-            // After a failure nothing is added to what there was.
-            refill<true>(ctx, room < 4 ? room : 4);
-            ctx->cache = old | shr(ctx->cache, have);
-            ctx->bits = plus(ctx->bits, have);
-        }
-    }
+void scmn_bsr_skip(scmn_bsr_ctx *ctx, int32_t n) { skip(ctx, n); }
+
+// The next n bits, from the cache and from the byte behind it.
+static inline uint32_t look(const scmn_bsr_ctx *ctx, int32_t n) {
     uint32_t result = shr(ctx->cache, minus(32, n));
     const int32_t lack = minus(n, ctx->bits);
     // 1 to 7 inside a buffer, as the cache is topped up by whole bytes.
@@ -149,15 +169,35 @@ uint32_t scmn_bsr_peek(scmn_bsr_ctx *ctx, int32_t n) {
     return result;
 }
 
-uint32_t scmn_bsr_skip_peek(scmn_bsr_ctx *ctx, int32_t nskip, int32_t npeek) {
+[[gnu::noinline]] static uint32_t peek_at_end(scmn_bsr_ctx *ctx, int32_t n) {
     const int32_t have = ctx->bits;
-    if (have < nskip) {
-        if (refill<true>(ctx, 4) != 0) return 0;
-        nskip = minus(nskip, have);
+    const int32_t room = minus(32, have) / 8;
+    if (room >= 1) {
+        const uint32_t old = ctx->cache;
+        // After a failure nothing is added to what there was.
+        refill<true>(ctx, room < 4 ? room : 4);
+        ctx->cache = old | shr(ctx->cache, have);
+        ctx->bits = plus(ctx->bits, have);
     }
-    drop(ctx, nskip);
-    if (ctx->bits >= npeek) return shr(ctx->cache, minus(32, npeek));
-    return scmn_bsr_peek(ctx, npeek);
+    return look(ctx, n);
+}
+
+uint32_t scmn_bsr_peek(scmn_bsr_ctx *ctx, int32_t n) {
+    const int32_t have = ctx->bits;
+    if (have >= n) return shr(ctx->cache, minus(32, n));
+    // The same where all goes well: as many whole bytes as there is room for, behind those bits.
+    if (have < 0 || have > 24 || !word_at_hand<true>(ctx)) return peek_at_end(ctx, n);
+    uint32_t word;
+    memcpy(&word, ctx->cur, 4);
+    const int32_t excess = (32 - have) % 8;
+    ctx->cache = (ctx->cache | big_endian(word) >> have) >> excess << excess;
+    ctx->bits = 32 - excess;
+    ctx->cur += (32 - have) / 8;
+    return look(ctx, n);
+}
+
+uint32_t scmn_bsr_skip_peek(scmn_bsr_ctx *ctx, int32_t nskip, int32_t npeek) {
+    return skip(ctx, nskip) ? scmn_bsr_peek(ctx, npeek) : 0;
 }
 
 void scmn_bsr_skip_to_align8(scmn_bsr_ctx *ctx) { drop(ctx, ctx->bits & 7); }
@@ -191,15 +231,20 @@ void scmn_bsw_init(scmn_bsw_ctx *ctx, uint8_t *buf, int32_t size, scmn_bsw_byte_
     ctx->on_byte = on_byte;
 }
 
-// Puts the top n bits of v into the current byte, which has room for them.
-static inline void put(scmn_bsw_ctx *ctx, uint32_t v, int32_t n) {
-    *ctx->cur = static_cast<uint8_t>(*ctx->cur << n | shr(v, 32 - n));
-    ctx->free_bits -= n;
-    if (ctx->free_bits == 0) {
-        if (ctx->on_byte) ctx->on_byte(ctx);
-        ctx->free_bits = 8;
-        ctx->cur++;
-    }
+// A function of its own, which a write that does not end a byte saves no registers for. Returns 0.
+[[gnu::noinline]] static int32_t end_byte(scmn_bsw_ctx *ctx) {
+    if (ctx->on_byte) ctx->on_byte(ctx);
+    ctx->free_bits = 8;
+    ctx->cur++;
+    return 0;
+}
+
+// Appends the low n bits of v to the current byte, which has room for them. Returns 0.
+static inline int32_t put(scmn_bsw_ctx *ctx, uint32_t v, int32_t n) {
+    const int32_t free_bits = ctx->free_bits - n;
+    *ctx->cur = static_cast<uint8_t>(*ctx->cur << n | v);
+    ctx->free_bits = free_bits;
+    return free_bits == 0 ? end_byte(ctx) : 0;
 }
 
 // The low n bytes of x, 1 to 4, highest first; for 2 and more in two stores that may overlap.
@@ -215,8 +260,7 @@ static inline void store_bytes(uint8_t *p, uint32_t x, int32_t n) {
 
 int32_t scmn_bsw_write1(scmn_bsw_ctx *ctx, uint32_t bit) {
     if (bytes_left(ctx->cur, ctx->last) <= 0) return -1;
-    put(ctx, bit << 31, 1);
-    return 0;
+    return put(ctx, bit & 1, 1);
 }
 
 // Byte by byte, with a look at the end before each.
@@ -228,7 +272,7 @@ int32_t scmn_bsw_write1(scmn_bsw_ctx *ctx, uint32_t bit) {
     while (n > 0) {
         if (bytes_left(ctx->cur, ctx->last) <= 0) return -1;
         const int32_t k = n < ctx->free_bits ? n : ctx->free_bits;
-        put(ctx, v, k);
+        put(ctx, shr(v, 32 - k), k);
         v = shl(v, k);
         n -= k;
     }

@@ -79,16 +79,31 @@ TEST(keyframe, rules_hold_for_any_bytes) {
     });
 }
 
-// A code at every place of every short buffer, among zero pairs that are none, and none at all.
+// A code at every place of every short buffer and of some that take many steps, among zero pairs that are
+// none, and none at all.
 TEST(keyframe, search_finds_the_first_code) {
     rig::for_each_target([](const rig::target_rows &target) {
-        for (ptrdiff_t count = 0; count <= 330; count += count < 140 ? 1 : 17)
+        // Zeros, the code byte, both and neither take turns in one buffer of four.
+        const auto mixed = [](ptrdiff_t i) -> uint8_t {
+            switch (i / 304 % 4) {
+                case 0:
+                    return 0;
+                case 1:
+                    return 7;
+                case 2:
+                    return i % 2 ? 0x83 : 0;
+                default:
+                    return 0x83;
+            }
+        };
+        for (ptrdiff_t count = 0; count <= 2600; count += count < 140 ? 1 : count < 330 ? 17 : 753)
             for (ptrdiff_t at = 0; at <= count; at++) {
-                const bool zeros = (count + at) % 3 == 0;
+                const ptrdiff_t kind = (count + at) % 4;
                 const rig::guarded buffer(size_t(count) + 2,
                                           at % 2 ? rig::flush::at_end : rig::flush::at_start);
                 uint8_t *b = buffer.data();
-                for (ptrdiff_t i = 0; i < count + 2; i++) b[i] = zeros ? 0 : uint8_t(1 + i % 255);
+                for (ptrdiff_t i = 0; i < count + 2; i++)
+                    b[i] = kind == 0 ? 0 : kind == 1 ? mixed(i) : uint8_t(1 + i % 255);
                 if (at < count) b[at] = b[at + 1] = 0, b[at + 2] = 0x83;
                 ASSERT_EQ(target.rows->keyframe.find_code(b, count, 0xFC, 0x80), at)
                     << "of " << count;
