@@ -271,7 +271,9 @@ TEST_F(convert_test, what_a_format_cannot_hold_is_said_once) {
          "averaged"},
         {"testcard:8x8 -o o.yuv400", "yuv400 holds no colour"},
         {"testcard:8x8 -o o.rgb565", "rgb565 holds 5 and 6 bits of each channel"},
-        {"testcard:8x8 -f rgba8888 -o o.rgb888", "rgb888 holds no alpha"},
+        {"testcard:8x8 -f rgba8888 -o o.rgb565 --dither",
+         "rgb565 holds 5 and 6 bits of each channel, dithered; no alpha"},
+        {"testcard:8x8 -f rgba8888 -o o.png", "rgba8888 holds no alpha in a png file"},
         {"testcard:8x8 -o o.nv21 --colour bt601-full", "nv21 holds nothing that says bt601-full"},
     };
     for (const auto &c : cases) {

@@ -106,7 +106,7 @@ std::string loss_note(const picture_shape &from, const picture_shape &to, const 
         return f.is_rgb() && f.planes[0].bytes == 4;
     };
     if (has_alpha(a) && (!has_alpha(b) || kind == "png" || kind == "ppm"))
-        notes.emplace_back("no alpha");
+        notes.push_back(has_alpha(b) ? "no alpha in a " + kind + " file" : "no alpha");
     const bool sited = traits.space == "420mpeg2" || traits.space == "420paldv";
     if (sited && &a != &b && b.chroma() > 0)
         notes.push_back("chroma as if it lay on the first pixel, not as " + traits.space + " says");

@@ -15,6 +15,8 @@ namespace tools {
 
 namespace {
 
+constexpr int ending_signals[] = {SIGINT, SIGTERM, SIGHUP};
+
 // The file to take away when a signal ends the program: a plain array, for the signal handler.
 char unfinished[PATH_MAX];
 
@@ -28,7 +30,7 @@ void remove_unfinished(int number) {
 
 void tidy_on_signals() {
     signal(SIGPIPE, SIG_IGN);
-    for (int number : {SIGINT, SIGTERM, SIGHUP}) signal(number, remove_unfinished);
+    for (int number : ending_signals) signal(number, remove_unfinished);
 }
 
 output::output(const destination &to)
@@ -51,12 +53,18 @@ output::output(const destination &to)
         }
         const size_t slash = path.rfind('/') + 1;  // 0 where there is no slash
         temporary_ = path.substr(0, slash) + "." + path.substr(slash) + ".XXXXXX";
+        // A signal waits until the handler can find the name.
+        sigset_t ending, before;
+        sigemptyset(&ending);
+        for (int number : ending_signals) sigaddset(&ending, number);
+        sigprocmask(SIG_BLOCK, &ending, &before);
         const int descriptor = mkostemp(temporary_.data(), O_CLOEXEC);
+        if (descriptor >= 0 && temporary_.size() < sizeof unfinished)
+            memcpy(unfinished, temporary_.c_str(), temporary_.size() + 1);
+        sigprocmask(SIG_SETMASK, &before, nullptr);
         if (descriptor < 0) {
             temporary_.clear();
         } else {
-            if (temporary_.size() < sizeof unfinished)
-                memcpy(unfinished, temporary_.c_str(), temporary_.size() + 1);
             // mkostemp makes private files; this one shall be as any other, or as the one before.
             const mode_t mask = umask(0);
             umask(mask);
