@@ -77,7 +77,7 @@ PEERS = {
     "any every second": {"ScaleRowDown2": 1},
     "transpose bytes": {"TransposeWx8": 1},
     "reverse bytes": {"MirrorRow": 1},
-    "fill": {"ARGBSetRow": .25},
+    "fill": {"ARGBSetRow": 1},
 }
 # Of two lines, one gives luma alone.
 SUMS = {f"{p} to yuv420": {f"{p} to half": .5, f"{p} to grey": .5} for p in ("rgb888", "bgr888", "rgb565")}
