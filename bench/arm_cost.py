@@ -340,7 +340,9 @@ def head(llvm):
           "archive for arm64, and for ARMv7 its\nsources by GCC. Sums of rows: \"to yuv420\" is half a row with chroma "
           "and half a row without.\n")
     print("The models make latencies weigh more than they do on Cortex-A53 and A55, and loads and stores of "
-          "structures less on\nCortex-A9, where 128 bits also cost as much as 64.\n")
+          "structures less on\nCortex-A9, where 128 bits also cost as much as 64. Instructions that they do not know "
+          "are left out of the cycles.\nThe resampler's rows, which follow a plan made at run time, are not measured, "
+          "nor are those at the end of this page.\n")
 
 
 def main():
