@@ -190,8 +190,8 @@ inline s16v high_minus_128_shl8(u8v v) {
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
     static_assert(limits::narrowing_shift<N>);
-    const uint8x8x2_t zip = vzip_u8(vqshrun_n_s16(even, N), vqshrun_n_s16(odd, N));
-    return vcombine_u8(zip.val[0], zip.val[1]);
+    // Shifted left, 0 ... 65535, with the result in the high byte.
+    return as_u8(vsriq_n_u16(vqshluq_n_s16(odd, 8 - N), vqshluq_n_s16(even, 8 - N), 8));
 }
 
 inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
@@ -322,17 +322,28 @@ inline u16v add_product(u16v sum, uint8x8_t x) {
     if constexpr (K < 0) return vmlsl_u8(sum, x, vdup_n_u8(-K));
     return sum;
 }
+// Dot products of the low and of the high half, by factors that are the same in all lanes. 64-bit
+// ARM multiplies high halves where they lie.
+inline u16v dot_low(rgb_v v, u8v a, u8v b, u8v c) {
+    const u16v sum = vmull_u8(vget_low_u8(v.val[0]), vget_low_u8(a));
+    return vmlal_u8(vmlal_u8(sum, vget_low_u8(v.val[1]), vget_low_u8(b)), vget_low_u8(v.val[2]),
+                    vget_low_u8(c));
+}
+inline u16v dot_upper(rgb_v v, u8v a, u8v b, u8v c) {
+#ifdef __aarch64__
+    return vmlal_high_u8(vmlal_high_u8(vmull_high_u8(v.val[0], a), v.val[1], b), v.val[2], c);
+#else
+    const u16v sum = vmull_u8(vget_high_u8(v.val[0]), vget_low_u8(a));
+    return vmlal_u8(vmlal_u8(sum, vget_high_u8(v.val[1]), vget_low_u8(b)), vget_high_u8(v.val[2]),
+                    vget_low_u8(c));
+#endif
+}
 template <int A, int B, int C, int D>
 inline u8v dot_high(rgb_v v) {
     static_assert(limits::channel_weights<A, B, C>);
-    const auto half = [](uint8x8_t c0, uint8x8_t c1, uint8x8_t c2) {
-        const u16v sum = vmull_u8(c0, vdup_n_u8(A));
-        return vshrn_n_u16(add_product<C>(add_product<B>(sum, c1), c2), 8);
-    };
-    const uint8x16_t dot =
-        vcombine_u8(half(vget_low_u8(v.val[0]), vget_low_u8(v.val[1]), vget_low_u8(v.val[2])),
-                    half(vget_high_u8(v.val[0]), vget_high_u8(v.val[1]), vget_high_u8(v.val[2])));
-    return vaddq_u8(dot, vdupq_n_u8(D));
+    const u8v a = vdupq_n_u8(A), b = vdupq_n_u8(B), c = vdupq_n_u8(C);
+    const u16v d = vdupq_n_u16(D << 8);
+    return vcombine_u8(vaddhn_u16(dot_low(v, a, b, c), d), vaddhn_u16(dot_upper(v, a, b, c), d));
 }
 template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
@@ -351,15 +362,9 @@ inline channel_factors set_channel_factors(int a, int b, int c) {
     return {static_cast<int16_t>(a), static_cast<int16_t>(b), static_cast<int16_t>(c)};
 }
 inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    const uint8x8_t a = vdup_n_u8(static_cast<uint8_t>(f.a)),
-                    b = vdup_n_u8(static_cast<uint8_t>(f.b)),
-                    c = vdup_n_u8(static_cast<uint8_t>(f.c));
-    const auto half = [&](uint8x8_t c0, uint8x8_t c1, uint8x8_t c2) {
-        return vshrn_n_u16(vmlal_u8(vmlal_u8(vmull_u8(c0, a), c1, b), c2, c), 8);
-    };
-    return vcombine_u8(
-        half(vget_low_u8(v.val[0]), vget_low_u8(v.val[1]), vget_low_u8(v.val[2])),
-        half(vget_high_u8(v.val[0]), vget_high_u8(v.val[1]), vget_high_u8(v.val[2])));
+    const u8v a = vdupq_n_u8(static_cast<uint8_t>(f.a)), b = vdupq_n_u8(static_cast<uint8_t>(f.b)),
+              c = vdupq_n_u8(static_cast<uint8_t>(f.c));
+    return vcombine_u8(vshrn_n_u16(dot_low(v, a, b, c), 8), vshrn_n_u16(dot_upper(v, a, b, c), 8));
 }
 inline s16v even_dot(rgb_v v, const channel_factors &f) {
     s16v sum = vmulq_n_s16(as_s16(even(v.val[0])), f.a);

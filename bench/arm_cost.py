@@ -1,0 +1,386 @@
+"""Instructions and cycles per pixel of the NEON rows beside libyuv's, without an ARM processor.
+
+A probe program (arm_probe.cpp) calls a row twice, with two sizes, under qemu-user, which logs every
+instruction that the row executes. What the longer call repeats is the inner loop, in the order of
+execution, wherever the compiler has put its blocks; llvm-mca tells its cycles. The models of LLVM 19:
+
+- Cortex-A53 and A55 retire in order, which makes latencies weigh more than they do there.
+- Cortex-A9: loads and stores of structures cost next to nothing, and 128 bits as much as 64.
+- Memory is always in the first cache. Of ARMv7's lists of three or four registers only the first counts
+  as read or written.
+"""
+import argparse
+import collections
+import concurrent.futures
+import datetime
+import os
+import re
+import subprocess
+import sys
+
+FAMILIES = {
+    "armv7": dict(title="ARMv7", emulator="qemu-arm", triple="thumbv7-linux-gnueabihf", attributes="+neon,+vfp3",
+                  processors=["cortex-a9", "cortex-a57"]),
+    "aarch64": dict(title="AArch64", emulator="qemu-aarch64", triple="aarch64-linux-gnu", attributes="+neon",
+                    processors=["cortex-a53", "cortex-a55", "cortex-a72", "neoverse-n1"]),
+}
+
+# libyuv's rows that do the work of ours, with their multiples for each pixel. Its names of packings are
+# those of a little-endian word: ARGB is bgra8888, RGB24 is bgr888, RAW is rgb888. Where it exchanges U and
+# V to reach a packing, the row is the same.
+PEERS = {
+    **{f"half to {p}{two}": {row: 1}
+       for p, row in [("rgb565", "I422ToRGB565Row"), ("bgr565", "I422ToRGB565Row"), ("rgb888", "I422ToRGB24Row"),
+                      ("bgr888", "I422ToRGB24Row"), ("rgba8888", "I422ToARGBRow"), ("bgra8888", "I422ToARGBRow"),
+                      ("argb8888", "I422ToRGBARow")]
+       for two in ("", ", two")},
+    **{f"{matrix}{pairs} to {p}, two": {row: 1}
+       for matrix in ("", "coarse ") for pairs in ("uv", "vu")
+       for p, row in [("rgb565", "NV12ToRGB565Row"), ("bgr565", "NV12ToRGB565Row"), ("rgb888", "NV21ToRGB24Row")]},
+    "uyvy to bgra8888": {"UYVYToARGBRow": 1},
+    "uyvy to rgba8888": {"UYVYToARGBRow": 1},
+    "rgb888 to grey": {"RAWToYRow": 1},
+    "bgr888 to grey": {"RGB24ToYRow": 1},
+    "rgb565 to grey": {"RGB565ToYRow": 1},
+    "rgb888 to yuv420": {"RAWToYRow": 1, "RAWToUVRow": .5},
+    "bgr888 to yuv420": {"RGB24ToYRow": 1, "RGB24ToUVRow": .5},
+    "rgb565 to yuv420": {"RGB565ToYRow": 1, "RGB565ToUVRow": .5},
+    "rgba8888 to rgb565": {"ARGBToRGB565Row": 1},
+    "pack": {"MergeUVRow": 1},
+    "unpack": {"SplitUVRow": 1},
+    "any half to words, two": {"I422ToRGB565Row": 1},
+    "any half to three, two": {"I422ToRGB24Row": 1},
+    "any half to four, two": {"I422ToARGBRow": 1},
+    "any full to four": {"I444ToARGBRow": 1},
+    "any pairs to words, two": {"NV12ToRGB565Row": 1},
+    "any pairs to three, two": {"NV12ToRGB24Row": 1},
+    "any pairs to four, two": {"NV12ToARGBRow": 1},
+    "any groups to four": {"YUY2ToARGBRow": 1},
+    "any three to grey, two": {"RAWToYRow": 1},
+    "any four to grey, two": {"ARGBToYRow": 1},
+    "any words to grey, two": {"RGB565ToYRow": 1},
+    "any three to half, two": {"RAWToYRow": 1, "RAWToUVRow": .5},
+    "any four to half, two": {"ARGBToYRow": 1, "ARGBToUVRow": .5},
+    "any words to half, two": {"RGB565ToYRow": 1, "RGB565ToUVRow": .5},
+    "any split three": {"SplitRGBRow": 1},
+    "any words to four": {"RGB565ToARGBRow": 1},
+    "any three to three": {"RAWToRGB24Row": 1},
+    "any three to four": {"RAWToARGBRow": 1},
+    "any four to words": {"ARGBToRGB565Row": 1},
+    "any four to three": {"ARGBToRGB24Row": 1},
+    "any split groups": {"YUY2ToYRow": 1, "YUY2ToUV422Row": 1},
+    "any groups to planes, two": {"YUY2ToYRow": 1, "YUY2ToUV422Row": .5},
+    "any join groups": {"I422ToYUY2Row": 1},
+    "any mean of lines": {"InterpolateRow": 1},
+    "any mean of pairs": {"ScaleRowDown2Linear": 1},
+    "any mean of blocks": {"ScaleRowDown2Box": 1},
+    "any every second": {"ScaleRowDown2": 1},
+    "transpose bytes": {"TransposeWx8": 1},
+    "reverse bytes": {"MirrorRow": 1},
+    "fill": {"ARGBSetRow": 1},
+}
+# Of two lines, one gives luma alone.
+SUMS = {f"{p} to yuv420": {f"{p} to half": .5, f"{p} to grey": .5} for p in ("rgb888", "bgr888", "rgb565")}
+
+
+def inner_loop(short, long):
+    """The addresses of a round of the loop that a larger size runs more often, and how many more rounds it ran.
+
+    `short` and `long` are the addresses that two calls executed.
+    """
+    before, after = collections.Counter(short), collections.Counter(long)
+    more = {at: n - before[at] for at, n in after.items() if n >= 8 and n > before[at]}
+    if not more:
+        raise ValueError("no loop")
+    pivot = min(more, key=lambda at: (more[at], at))
+    visits = [i for i, at in enumerate(long) if at == pivot]
+    rounds = collections.Counter(tuple(long[i:j]) for i, j in zip(visits, visits[1:]))
+    loop, times = rounds.most_common(1)[0]
+    if times < .7 * (len(visits) - 1):
+        raise ValueError(f"no steady state: {len(rounds)} different rounds")
+    if abs(len(loop) * more[pivot] / (len(long) - len(short)) - 1) > .05:
+        raise ValueError("the loop is not what grows with the size")
+    return list(loop), more[pivot]
+
+
+ACCESS = re.compile(r"v?(ld|st)[^c]|v?(push|pop)")
+GENERAL = r"(x\d+|w\d+|r\d+|lr|sb|sl|fp|ip)\b"
+
+
+class Stack:
+    """Which general registers hold addresses on the stack, followed through what was executed."""
+
+    def __init__(self):
+        self.registers = {"sp"}
+
+    def is_read_or_written(self, mnemonic, operands):
+        if not ACCESS.match(mnemonic):
+            return False
+        base = re.search(r"\[(\w+)", operands) or re.match(r"(\w+)!?, *\{", operands)
+        return base[1] in self.registers if base else True  # push and pop
+
+    def follow(self, mnemonic, operands):
+        to = re.match(GENERAL, operands)
+        if not to or re.match("v?st|cmp|tst|cb|tb", mnemonic):
+            return
+        names = [name.strip() for name in operands.split(",")]
+        if re.match("add|sub|mov", mnemonic) and len(names) > 1 and names[1] in self.registers:
+            self.registers.add(to[1])
+        elif not ("[" not in operands and ACCESS.match(mnemonic)):  # lists of registers keep their base
+            self.registers.discard(to[1])
+
+
+def is_move(mnemonic, operands):
+    """From one vector register to another, nothing else."""
+    names = [name.strip().split(".")[0] for name in operands.split(",")]
+    if not all(re.fullmatch(r"[vqd]\d+", name) for name in names):
+        return False
+    kind = mnemonic.split(".")[0]
+    return (kind in ("mov", "vmov", "fmov") and len(names) == 2) or \
+        (kind in ("orr", "vorr") and len(names) == 3 and names[1] == names[2])
+
+
+def counts(loop, stack):
+    """Instructions, register moves, and loads and stores of vectors on the stack."""
+    moves = spills = 0
+    for mnemonic, operands in loop:
+        moves += is_move(mnemonic, operands)
+        vector = mnemonic.startswith("v") or re.search(r"\b[vqds]\d+\b", operands)
+        spills += bool(vector) and stack.is_read_or_written(mnemonic, operands)
+        stack.follow(mnemonic, operands)
+    return dict(instructions=len(loop), moves=moves, spills=spills)
+
+
+CONDITIONS = "eq|ne|cs|hs|cc|lo|mi|pl|vs|vc|hi|ls|ge|lt|gt|le"
+
+
+def assembly(loop):
+    """The loop as source text. What points into the code points at a name.
+
+    The models know neither Thumb's conditional instructions, which are taken as done, nor vswp, for which
+    vtrn stands, nor lists of more than two registers in vldm and vstm, which are split.
+    """
+    lines, conditional = [], 0
+    for mnemonic, operands in loop:
+        if re.fullmatch("it[te]*", mnemonic):
+            conditional = len(mnemonic) - 1
+            continue
+        if conditional:
+            conditional -= 1
+            mnemonic = re.sub(rf"^([a-z]+?)({CONDITIONS})(\..*)?$", r"\1\3", mnemonic)
+        if re.match("(b|cb|tb)", mnemonic) and not re.match("bic|bf|bif|bit|bsl", mnemonic):
+            operands = re.sub(r"(#-?)?(0x[0-9a-f]+|(?<=#)-?\d+)\s*$", "there", re.sub(r"\s*<.*", "", operands))
+        elif re.match("adrp?$|ldr", mnemonic):
+            operands = re.sub("(?<=, )#?0x[0-9a-f]+ *<.*", "there", operands)
+        many = re.fullmatch(r"(\w+)!?, *\{(d\d+(, d\d+)*)\}", operands)
+        if mnemonic == "vswp":
+            lines.append(f"vtrn.32 {operands}")
+        elif mnemonic in ("vldmia", "vstmia") and many:
+            registers = many[2].split(", ")
+            lines += [f"{mnemonic[:3]}1.64 {{{', '.join(registers[i:i + 2])}}}, [{many[1]}]"
+                      for i in range(0, len(registers), 2)]
+        else:
+            lines.append(f"{mnemonic} {operands}")
+    return "\n".join(lines) + "\n"
+
+
+def cycles(mca, family, processor, texts):
+    """Of one more round of each loop. Instructions that have no model, such as returns, are left out."""
+    regions = "".join(f"# LLVM-MCA-BEGIN\n{text}# LLVM-MCA-END\n" for text in texts)
+    totals = []
+    for rounds in (100, 200):
+        out = subprocess.run([mca, f"-mtriple={family['triple']}", f"-mattr={family['attributes']}",
+                              f"-mcpu={processor}", f"-iterations={rounds}", "-all-views=false", "-summary-view",
+                              "-skip-unsupported-instructions=lack-sched"],
+                             input=regions, capture_output=True, text=True)
+        totals.append([int(total) for total in re.findall(r"Total Cycles: +(\d+)", out.stdout)])
+        if len(totals[-1]) != len(texts):
+            sys.exit(f"llvm-mca, {processor}: {out.stderr}")
+    return [(more - less) / 100 for less, more in zip(*totals)]
+
+
+def disassemble(objdump, program, attributes):
+    """{address: (mnemonic, operands)} of the rows and of what they call."""
+    out = subprocess.run([objdump, "-d", "-j", ".text", "--no-show-raw-insn", f"--mattr={attributes}", program],
+                         capture_output=True, text=True, check=True).stdout
+    code, inside = {}, False
+    for line in out.splitlines():
+        label = re.match("[0-9a-f]+ <(.*)>:", line)
+        if label:
+            inside = re.search("4neon|_NEON|mem(cpy|move|set)", label[1])
+        m = inside and re.match(r"\s*([0-9a-f]+):\s+([a-z][\w.]*)\s*(.*)", line)
+        if m:
+            code[int(m[1], 16)] = m[2], re.sub(r"\s*(//|@|;).*", "", m[3]).strip()
+    return code
+
+
+def ranges(addresses):
+    """Those of addresses with no large gaps, as the emulator's log takes them."""
+    spans = []
+    for at in sorted(addresses):
+        if spans and at - spans[-1][1] <= 64:
+            spans[-1][1] = at
+        else:
+            spans.append([at, at])
+    return ",".join(f"{first:#x}..{last:#x}" for first, last in spans)
+
+
+class Probe:
+    """A probe program: the library by one compiler, and libyuv."""
+
+    def __init__(self, program, family, llvm):
+        self.program, self.family, self.mca = program, family, f"{llvm}/llvm-mca"
+        self.code = disassemble(f"{llvm}/llvm-objdump", program, family["attributes"])
+        self.ranges = ranges(self.code)
+        listing = subprocess.run([family["emulator"], program], capture_output=True, text=True, check=True).stdout
+        self.rows = {}
+        for number, line in enumerate(listing.splitlines()):
+            name, address, pixels, *sizes = line.split("\t")
+            self.rows[name] = number, int(address, 16) & ~1, int(pixels), [int(size) for size in sizes]
+
+    def executed(self, number, address, size):
+        """The addresses of what the row executed, and what it called."""
+        log = subprocess.run([self.family["emulator"], "-singlestep", "-d", "exec,nochain", "-dfilter", self.ranges,
+                              self.program, str(number), str(size)],
+                             capture_output=True, text=True, check=True).stderr
+        addresses = [int(at, 16) for at in re.findall(r"^Trace \d+: \S+ \[\w+/(\w+)/", log, re.M)]
+        return addresses[addresses.index(address):]
+
+    def loop(self, name):
+        """A round of its inner loop, how many pixels it does, and what there is to count."""
+        number, address, pixels, sizes = self.rows[name]
+        short, long = (self.executed(number, address, size) for size in sizes)
+        addresses, rounds = inner_loop(short, long)
+        stack = Stack()
+        for at in long[:long.index(addresses[0])]:
+            stack.follow(*self.code[at])
+        loop = [self.code[at] for at in addresses]
+        return assembly(loop), pixels * (sizes[1] - sizes[0]) / rounds, counts(loop, stack)
+
+    def measure(self, names):
+        """({row: (figures per pixel, text of the loop)}, {row: why there are none})"""
+        def loop_or_reason(name):
+            try:
+                return self.loop(name)
+            except ValueError as reason:
+                return reason
+
+        with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
+            found = dict(zip(names, pool.map(loop_or_reason, names)))
+        loops = {name: loop for name, loop in found.items() if not isinstance(loop, ValueError)}
+        texts = [text for text, _, _ in loops.values()]
+        for processor in self.family["processors"] if texts else []:
+            for (_, _, figures), figure in zip(loops.values(), cycles(self.mca, self.family, processor, texts)):
+                figures[processor] = figure
+        return ({name: ({kind: figure / pixels for kind, figure in figures.items()}, text)
+                 for name, (text, pixels, figures) in loops.items()},
+                {name: loop for name, loop in found.items() if isinstance(loop, ValueError)})
+
+
+def weighted(measured, terms):
+    """The sum of multiples of rows, or None where one is missing."""
+    if not terms or any(name not in measured for name in terms):
+        return None
+    kinds = next(iter(measured.values()))
+    return {kind: sum(factor * measured[name][kind] for name, factor in terms.items()) for kind in kinds}
+
+
+def number(x):
+    return "–" if x is None else f"{x:.2f}"
+
+
+def table(head, lines):
+    width = [max(len(line[i]) for line in [head, *lines]) for i in range(len(head))]
+    for line in [head, ["-" * w for w in width], *lines]:
+        print("| " + " | ".join(cell.ljust(w) for cell, w in zip(line, width)) + " |")
+    print()
+
+
+def report(family, results, chosen):
+    compilers = list(results)
+    peers = {n.removeprefix("libyuv "): m for n, m in results[compilers[0]].items() if n.startswith("libyuv ")}
+    names = [n for n in dict.fromkeys(n for c in compilers for n in results[c]) if not n.startswith("libyuv ")]
+    rows = []
+    for name in [*names, *(s for s in SUMS if chosen.search(s))]:
+        ours = [weighted(results[c], SUMS.get(name, {name: 1})) for c in compilers]
+        rows.append((name, ours, weighted(peers, PEERS.get(name))))
+    of = lambda m, kind: m and m[kind]
+    print(f"## {family['title']}: the inner loops\n")
+    kinds = ["instructions", "moves", "spills"]
+    table(["per pixel", *(f"{kind} {who}" for kind in kinds for who in [*compilers, "libyuv"])],
+          [[name, *(number(of(m, kind)) for kind in kinds for m in [*ours, peer])] for name, ours, peer in rows])
+    for processor in family["processors"]:
+        print(f"## {family['title']}, {processor}: cycles\n")
+        compared = [[m[processor] / peer[processor] for m in ours if m] for _, ours, peer in rows if peer]
+        ratios = sorted(ratio for row in compared for ratio in row)
+        if ratios:
+            print(f"Of {len(ratios)} comparisons, {sum(r <= .8 for r in ratios)} are at 0.8 of libyuv's cycles or below, "
+                  f"{sum(.8 < r <= 1 for r in ratios)} at 1.0 or below, {sum(r > 1 for r in ratios)} above; "
+                  f"the largest is {ratios[-1]:.2f}.\n")
+        ratio = lambda m, peer: number(m[processor] / peer[processor] if m and peer else None)
+        table(["per pixel", *compilers, "libyuv", *(f"{c} / libyuv" for c in compilers)],
+              [[name, *(number(of(m, processor)) for m in [*ours, peer]), *(ratio(m, peer) for m in ours)]
+               for name, ours, peer in rows])
+
+
+def first_line(*command):
+    return subprocess.run(command, capture_output=True, text=True, check=True).stdout.strip().splitlines()[0]
+
+
+def head(llvm):
+    mca = re.search(r"LLVM version [\d.]+", subprocess.run([f"{llvm}/llvm-mca", "--version"], capture_output=True,
+                                                           text=True, check=True).stdout)[0]
+    print("# The NEON rows, on paper\n")
+    print(f"Made by `./run bench --arm` on {datetime.date.today()}: {first_line('aarch64-linux-gnu-g++', '--version')}, "
+          f"{first_line('clang++', '--version')}, llvm-mca of {mca}.\n")
+    print("No ARM processor was timed. These are the instructions that one round of a row's inner loop executes, and "
+          "the cycles\nthat llvm-mca's models give for it, per pixel (per sample or byte where a row moves those), with "
+          "memory in the first\ncache. Moves are between vector registers; spills are loads and stores of vectors on "
+          "the stack, constants\namong them. Rows named \"two\" do two lines at once. libyuv's rows are Debian's: its "
+          "archive for arm64, and for ARMv7 its\nsources by GCC. Sums of rows: \"to yuv420\" is half a row with chroma "
+          "and half a row without.\n")
+    print("The models make latencies weigh more than they do on Cortex-A53 and A55, and loads and stores of "
+          "structures less on\nCortex-A9, where 128 bits also cost as much as 64. Instructions that they do not know "
+          "are left out of the cycles.\nThe resampler's rows, which follow a plan made at run time, are not measured, "
+          "nor are those at the end of this page.\n")
+
+
+def main():
+    parser = argparse.ArgumentParser(description=__doc__.split("\n\n")[0])
+    parser.add_argument("--llvm", required=True, help="the folder of llvm-mca and llvm-objdump")
+    parser.add_argument("--rows", default="", help="regular expression: the rows to measure")
+    parser.add_argument("--show", action="store_true", help="print the loops too")
+    parser.add_argument("probes", nargs="+", metavar="FAMILY:COMPILER:PROGRAM")
+    args = parser.parse_args()
+    chosen = re.compile(args.rows)
+    wanted = lambda name: chosen.search(name) or any(
+        chosen.search(whole) and name.removeprefix("libyuv ") in terms
+        for sums in (SUMS, PEERS) for whole, terms in sums.items())
+    head(args.llvm)
+    families = collections.defaultdict(dict)
+    for probe in args.probes:
+        family, compiler, program = probe.split(":", 2)
+        families[family][compiler] = program
+    failed = []
+    for name, programs in families.items():
+        results = {}
+        for compiler, program in programs.items():
+            probe = Probe(program, FAMILIES[name], args.llvm)
+            # libyuv's rows are the same in each program.
+            rows = [row for row in probe.rows if wanted(row) and not (results and row.startswith("libyuv "))]
+
+            measured, reasons = probe.measure(rows)
+            failed += [f"{name}, {compiler}, {row}: {reason}" for row, reason in reasons.items()]
+            results[compiler] = {row: figures for row, (figures, _) in measured.items()}
+            if args.show:
+                for row, (_, text) in measured.items():
+                    print(f"### {name}, {compiler}, {row}\n\n```\n{text}```\n")
+        report(FAMILIES[name], results, chosen)
+    if failed:
+        print("## Without figures\n")
+        print("Rows whose rounds differ, or that spend their time in several loops.\n")
+        print("\n".join(f"- {line}" for line in sorted(failed)))
+
+
+if __name__ == "__main__":
+    sys.exit(main())
