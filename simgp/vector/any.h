@@ -173,27 +173,15 @@ struct any_source<chroma_in::groups> {
     }
 };
 
-template <chroma_in In, pixel_kind Kind>
-static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
-                    uint8_t *dst, ptrdiff_t width);
-template <chroma_in In, pixel_kind Kind>
-static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
-                         const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
-                         ptrdiff_t width);
-
-// Less than a vector goes through the stack, by the row for one.
-template <chroma_in In, pixel_kind Kind>
-[[gnu::noinline]] static void any_part(const yuv_to_rgb &how, const samples &in, uint8_t *dst,
-                                       ptrdiff_t x, int count) {
-    constexpr int size = any_packer<Kind>::size;
+// Less than a vector goes through the stack, by the row for one, whose pixels have `size` bytes.
+template <chroma_in In>
+[[gnu::noinline]] static void any_part(any_to_rgb_row *row, int size, const yuv_to_rgb &how,
+                                       const samples &in, uint8_t *dst, ptrdiff_t x, int count) {
     staged to;
-    uint8_t pixels[bytes * size];
+    uint8_t pixels[bytes * 4];
     any_source<In>(how).stage(to, in, x, count);
-    if constexpr (In == chroma_in::pairs)
-        any_row_pair<In, Kind>(how, to.y, to.y, to.u, to.v, pixels, pixels, bytes);
-    else
-        any_row<In, Kind>(how, to.y, to.u, to.v, pixels, bytes);
-    memcpy(dst + x * size, pixels, size_t(count) * size);
+    row(how, to.y, to.u, to.v, pixels, bytes);
+    memcpy(dst + x * size, pixels, size_t(count) * size_t(size));
 }
 
 template <chroma_in In, pixel_kind Kind>
@@ -216,11 +204,24 @@ static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, c
                   m.order);
     };
     const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
-    const auto part = [&](ptrdiff_t x, int count) { any_part<In, Kind>(how, in, dst, x, count); };
+    const auto part = [&](ptrdiff_t x, int count) {
+        any_part<In>(any_row<In, Kind>, to::size, how, in, dst, x, count);
+    };
     if constexpr (In == chroma_in::full)
         row_of_steps<false>(width, load, write_full, part);
     else
         row_of_steps<true>(width, load, write_half, part);
+}
+
+template <chroma_in In, pixel_kind Kind>
+static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
+                         const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
+                         ptrdiff_t width);
+// One row by the row for two.
+template <chroma_in In, pixel_kind Kind>
+static void any_row_of_pair(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u,
+                            const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
+    any_row_pair<In, Kind>(how, y, y, u, v, dst, dst, width);
 }
 
 template <chroma_in In, pixel_kind Kind>
@@ -249,17 +250,13 @@ static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t
                       m.apply(odd(p.second_y), t), m.order);
         },
         [&](ptrdiff_t x, int count) {
-            any_part<In, Kind>(how, in, dst0, x, count);
-            any_part<In, Kind>(how, {y1, u, v}, dst1, x, count);
+            constexpr any_to_rgb_row *row = any_row_of_pair<In, Kind>;
+            any_part<In>(row, to::size, how, in, dst0, x, count);
+            any_part<In>(row, to::size, how, {y1, u, v}, dst1, x, count);
         });
 }
 
-// Rows for one of what rows for two do, and the other way round.
-template <chroma_in In, pixel_kind Kind>
-static void any_row_of_pair(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u,
-                            const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
-    any_row_pair<In, Kind>(how, y, y, u, v, dst, dst, width);
-}
+// Two rows by the row for one.
 template <chroma_in In, pixel_kind Kind>
 static void any_pair_of_rows(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
                              const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
@@ -321,10 +318,33 @@ inline auto load_pixels(const uint8_t *p) {
         return load_pixels<rgb_in(Kind)>(p);
 }
 
+// Less than a vector goes through the stack, by the row itself. A pixel has `size` bytes, and the
+// chroma of two `chroma_size` in u (0: there is none); with one of them, v has the other.
+struct any_yuv_sizes {
+    int size, chroma_size;
+};
+[[gnu::noinline]] static void any_yuv_part(any_to_yuv_row *row, any_yuv_sizes of,
+                                           const rgb_weights &w, const uint8_t *src0,
+                                           const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                                           uint8_t *u, uint8_t *v, ptrdiff_t x, int count) {
+    uint8_t pixels[2][bytes * 4] = {}, to_y[2][bytes], to_u[bytes], to_v[bytes];
+    const size_t pixel_bytes = size_t(count) * size_t(of.size);
+    memcpy(pixels[0], src0 + of.size * x, pixel_bytes);
+    if (src1) memcpy(pixels[1], src1 + of.size * x, pixel_bytes);
+    row(w, pixels[0], pixels[1], to_y[0], to_y[1], to_u, to_v, bytes);
+    memcpy(y0 + x, to_y[0], size_t(count));
+    if (src1) memcpy(y1 + x, to_y[1], size_t(count));
+    if (of.chroma_size == 0) return;
+    const size_t samples = size_t(count + 1) / 2;
+    memcpy(u + of.chroma_size * (x / 2), to_u, size_t(of.chroma_size) * samples);
+    if (of.chroma_size == 1) memcpy(v + x / 2, to_v, samples);
+}
+
 template <pixel_kind Kind, chroma_out Out>
 static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
                         uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    constexpr int size = int(Kind) + 2, chroma_size = Out == chroma_out::pairs ? 2 : 1;
+    constexpr int size = int(Kind) + 2;
+    constexpr int chroma_size = Out == chroma_out::none ? 0 : Out == chroma_out::pairs ? 2 : 1;
     const any_yuv_matrix<Kind> m(w);
     row_of_steps<Out != chroma_out::none>(
         width, [](ptrdiff_t x) { return x; },
@@ -336,16 +356,8 @@ static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t
             if (src1) store(y1 + x, m.luma(load_pixels<Kind>(src1 + size * x)));
         },
         [&](ptrdiff_t x, int count) {
-            uint8_t pixels[2][bytes * size] = {}, to_y[2][bytes], to_u[bytes], to_v[bytes];
-            memcpy(pixels[0], src0 + size * x, size_t(count) * size);
-            if (src1) memcpy(pixels[1], src1 + size * x, size_t(count) * size);
-            any_yuv_row<Kind, Out>(w, pixels[0], pixels[1], to_y[0], to_y[1], to_u, to_v, bytes);
-            memcpy(y0 + x, to_y[0], size_t(count));
-            if (src1) memcpy(y1 + x, to_y[1], size_t(count));
-            if (Out == chroma_out::none) return;
-            const size_t samples = size_t(count + 1) / 2;
-            memcpy(u + chroma_size * (x / 2), to_u, chroma_size * samples);
-            if (Out == chroma_out::half) memcpy(v + x / 2, to_v, samples);
+            any_yuv_part(any_yuv_row<Kind, Out>, {size, chroma_size}, w, src0, src1, y0, y1, u, v,
+                         x, count);
         });
 }
 

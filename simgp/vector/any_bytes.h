@@ -24,6 +24,15 @@ inline rgb_v load_pixels(const uint8_t *p) {
     if constexpr (In == rgb_in::four_alpha_first) return load_8888<1>(p);
 }
 
+[[gnu::noinline]] static void split_part(split_pixels_row *row, int size, const uint8_t *src,
+                                         uint8_t *const channels[3], ptrdiff_t x, int count) {
+    uint8_t pixels[bytes * 4] = {}, to[3][bytes];
+    uint8_t *const planes[] = {to[0], to[1], to[2]};
+    memcpy(pixels, src + size * x, size_t(count) * size_t(size));
+    row(pixels, planes, bytes);
+    for (int k = 0; k < 3; k++) memcpy(channels[k] + x, to[k], size_t(count));
+}
+
 template <rgb_in In>
 static void split_pixels_vectors(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count) {
     constexpr int size = size_in<In>;
@@ -34,11 +43,7 @@ static void split_pixels_vectors(const uint8_t *src, uint8_t *const channels[3],
             for (int k = 0; k < 3; k++) store(channels[k] + x, c.c[k]);
         },
         [&](ptrdiff_t x, int part) {
-            uint8_t pixels[bytes * size] = {}, to[3][bytes];
-            uint8_t *const planes[] = {to[0], to[1], to[2]};
-            memcpy(pixels, src + size * x, size_t(part) * size);
-            split_pixels_vectors<In>(pixels, planes, bytes);
-            for (int k = 0; k < 3; k++) memcpy(channels[k] + x, to[k], size_t(part));
+            split_part(split_pixels_vectors<In>, size, src, channels, x, part);
         });
 }
 
@@ -61,29 +66,41 @@ inline void store_channels(uint8_t *dst, u8v first, u8v g, u8v last, bool alpha_
     }
 }
 
-// Calls convert(p, q) for every `bytes` pixels of `size` bytes at q that become pixels of `to_size`
-// bytes at p; what is left goes through the stack.
+// Less than a vector goes through the stack, by the row itself.
+struct repack_sizes {
+    int from, to;
+};
+[[gnu::noinline]] static void repack_part(repack_row *row, repack_sizes size,
+                                          const repacking &order, const uint8_t *src, uint8_t *dst,
+                                          ptrdiff_t x, int count) {
+    uint8_t pixels[bytes * 4] = {}, to[bytes * 4];
+    memcpy(pixels, src + size.from * x, size_t(count) * size_t(size.from));
+    row(order, pixels, to, bytes);
+    memcpy(dst + size.to * x, to, size_t(count) * size_t(size.to));
+}
+
+// Calls convert(p, q) for every `bytes` pixels of Size bytes at q that become pixels of ToSize bytes
+// at p. What is left is done by `row`, which is the caller.
 template <int Size, int ToSize, class Convert>
-inline void repack_in_steps(const uint8_t *src, uint8_t *dst, ptrdiff_t count, Convert convert) {
+inline void repack_in_steps(repack_row *row, const repacking &order, const uint8_t *src,
+                            uint8_t *dst, ptrdiff_t count, Convert convert) {
     row_of_steps<false>(
         count, [&](ptrdiff_t x) { return src + Size * x; },
         [&](ptrdiff_t x, const uint8_t *from) { convert(dst + ToSize * x, from); },
         [&](ptrdiff_t x, int part) {
-            uint8_t pixels[bytes * Size] = {}, to[bytes * ToSize];
-            memcpy(pixels, src + Size * x, size_t(part) * Size);
-            convert(to, pixels);
-            memcpy(dst + ToSize * x, to, size_t(part) * ToSize);
+            repack_part(row, {Size, ToSize}, order, src, dst, x, part);
         });
 }
 
 template <rgb_in In, pixel_kind To>
 static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
-    repack_in_steps<size_in<In>, int(To) + 2>(src, dst, count, [&](uint8_t *p, const uint8_t *q) {
-        channels_v c = channels_of(load_pixels<In>(q));
-        if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
-        store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
-    });
+    repack_in_steps<size_in<In>, int(To) + 2>(
+        repack_pixels<In, To>, order, src, dst, count, [&](uint8_t *p, const uint8_t *q) {
+            channels_v c = channels_of(load_pixels<In>(q));
+            if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
+            store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
+        });
 }
 static void four_to_words(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
@@ -91,20 +108,21 @@ static void four_to_words(const repacking &order, const uint8_t *src, uint8_t *d
          ? repack_pixels<rgb_in::four_alpha_first, pixel_kind::words>
          : repack_pixels<rgb_in::four, pixel_kind::words>)(order, src, dst, count);
 }
-static void exchange_three(const repacking &, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    repack_in_steps<3, 3>(src, dst, count,
+static void exchange_three(const repacking &order, const uint8_t *src, uint8_t *dst,
+                           ptrdiff_t count) {
+    repack_in_steps<3, 3>(exchange_three, order, src, dst, count,
                           [](uint8_t *p, const uint8_t *q) { exchange_888(p, q); });
 }
 static void three_to_four(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
     const widen_moves m = set_widen_moves(order.exchange, order.to_alpha_first);
-    repack_in_steps<3, 4>(src, dst, count,
+    repack_in_steps<3, 4>(three_to_four, order, src, dst, count,
                           [&](uint8_t *p, const uint8_t *q) { repack_888_to_8888(p, q, m); });
 }
 static void four_to_three(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
     const narrow_moves m = set_narrow_moves(order.exchange, order.from_alpha_first);
-    repack_in_steps<4, 3>(src, dst, count,
+    repack_in_steps<4, 3>(four_to_three, order, src, dst, count,
                           [&](uint8_t *p, const uint8_t *q) { repack_8888_to_888(p, q, m); });
 }
 

@@ -45,6 +45,28 @@ struct yuv_row_out {
     uint8_t *y, *u, *v;
 };
 
+// Less than a vector goes through the stack, by the row itself. A pixel has `size` bytes, and the
+// chroma of two `chroma_size` in u (0: there is none); with one of them, v has the other.
+struct yuv_row_sizes {
+    int size, chroma_size;
+};
+[[gnu::noinline]] static void part_to_yuv(rgb_to_yuv_row *row, yuv_row_sizes of, const uint8_t *in,
+                                          const yuv_row_out &out, ptrdiff_t x, int count) {
+    uint8_t pixels[bytes * 3] = {}, y[bytes], u[bytes], v[bytes];
+    memcpy(pixels, in + of.size * x, size_t(count) * size_t(of.size));
+    row(pixels, y, u, v, bytes);
+    memcpy(out.y + x, y, size_t(count));
+    const size_t chroma = size_t(count / 2);
+    if (of.chroma_size == 0 || chroma == 0) return;
+    memcpy(out.u + of.chroma_size * (x / 2), u, chroma * size_t(of.chroma_size));
+    if (of.chroma_size == 1) memcpy(out.v + x / 2, v, chroma);
+}
+
+template <rgb_packing Packing, yuv_layout Layout>
+static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width);
+template <rgb_packing Packing>
+static void to_rgb565_row(const uint8_t *src, uint8_t *dst, ptrdiff_t width);
+
 // Chroma goes to plane u in samples or pairs of `chroma_size` bytes, and to plane v where there are
 // samples.
 template <rgb_packing Packing, yuv_layout Layout>
@@ -70,16 +92,18 @@ struct rgb_to_yuv_step {
         }
     }
     static void part(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x, int count) {
-        uint8_t pixels[bytes * from::size] = {}, y[bytes], u[bytes], v[bytes];
-        memcpy(pixels, in + from::size * x, size_t(count) * from::size);
-        write({y, u, v}, 0, pixels);
-        memcpy(out.y + x, y, size_t(count));
-        if (const size_t chroma = size_t(count / 2); pixels_in_pairs && chroma) {
-            memcpy(out.u + chroma_size * (x / 2), u, chroma * chroma_size);
-            if (planar) memcpy(out.v + x / 2, v, chroma);
-        }
+        part_to_yuv(to_yuv_row<Packing, Layout>, {from::size, pixels_in_pairs ? chroma_size : 0},
+                    in, out, x, count);
     }
 };
+
+[[gnu::noinline]] static void part_to_rgb565(rgb_to_rgb_row *row, int size, const uint8_t *in,
+                                             uint8_t *out, ptrdiff_t x, int count) {
+    uint8_t pixels[bytes * 4] = {}, words[2 * bytes];
+    memcpy(pixels, in + size * x, size_t(count) * size_t(size));
+    row(pixels, words, bytes);
+    memcpy(out + 2 * x, words, 2 * size_t(count));
+}
 
 template <rgb_packing Packing>
 struct rgb_to_rgb565_step {
@@ -97,10 +121,7 @@ struct rgb_to_rgb565_step {
             repack_888_to_565(out + 2 * x, pixels);
     }
     static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
-        uint8_t pixels[bytes * size] = {}, words[2 * bytes];
-        memcpy(pixels, in + size * x, size_t(count) * size);
-        write(words, 0, pixels);
-        memcpy(out + 2 * x, words, 2 * size_t(count));
+        part_to_rgb565(to_rgb565_row<Packing>, size, in, out, x, count);
     }
 };
 

@@ -10,14 +10,23 @@
 
 namespace simgp::SIMD_TARGET {
 
-// Less than a vector goes through the stack.
-template <class Step>
-inline void part_through_stack(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
+template <yuv_layout Layout, class Matrix, rgb_packing Packing>
+static void to_rgb_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                       ptrdiff_t width);
+template <yuv_layout Layout, class Matrix, rgb_packing Packing>
+static void to_rgb_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
+                            const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width);
+
+// Less than a vector goes through the stack, by the row for one, whose pixels have `size` bytes: a copy of
+// this for every row would be a third of all their code.
+template <class Source>
+[[gnu::noinline]] static void part_through_stack(yuv_to_rgb_row *row, int size, const samples &in,
+                                                 uint8_t *out, ptrdiff_t x, int count) {
     staged to;
-    uint8_t pixels[bytes * Step::size];
-    Step::stage(to, in, x, count);
-    Step::write(pixels, 0, Step::load(to.all(), 0));
-    memcpy(out + x * Step::size, pixels, size_t(count) * Step::size);
+    uint8_t pixels[bytes * 4];
+    Source::stage(to, in, x, count);
+    row(to.y, to.u, to.v, pixels, bytes);
+    memcpy(out + x * size, pixels, size_t(count) * size_t(size));
 }
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
@@ -55,8 +64,9 @@ struct yuv_step : source<Layout> {
         to::store(out + x * size, even, odd);
     }
     static void part(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
-        part_through_stack<yuv_step>(in, out, x, count);
+        part_through_stack<from>(to_rgb_row<Layout, Matrix, Packing>, size, in, out, x, count);
     }
+    static constexpr yuv_to_rgb_row_pair *row_pair = to_rgb_row_pair<Layout, Matrix, Packing>;
 };
 
 // Two rows with the same chroma, whose terms are computed once.
@@ -67,6 +77,18 @@ struct samples_pair {
 struct out_pair {
     uint8_t *first, *second;
 };
+template <class Source>
+[[gnu::noinline]] static void part_through_stack(yuv_to_rgb_row_pair *rows, int size,
+                                                 const samples_pair &in, const out_pair &out,
+                                                 ptrdiff_t x, int count) {
+    staged to;
+    uint8_t second_y[bytes] = {}, pixels[2][bytes * 4];
+    Source::stage(to, in.first, x, count);
+    memcpy(second_y, in.second_y + x, size_t(count));
+    rows(to.y, second_y, to.u, to.v, pixels[0], pixels[1], bytes);
+    memcpy(out.first + x * size, pixels[0], size_t(count) * size_t(size));
+    memcpy(out.second + x * size, pixels[1], size_t(count) * size_t(size));
+}
 template <class Step>
 struct pair_step : Step {
     template <class Pixels>
@@ -86,8 +108,7 @@ struct pair_step : Step {
         Step::apply(out.second, x, p.second_y, terms);
     }
     static void part(const samples_pair &in, const out_pair &out, ptrdiff_t x, int count) {
-        Step::part(in.first, out.first, x, count);
-        Step::part({in.second_y, in.first.u, in.first.v}, out.second, x, count);
+        part_through_stack<typename Step::from>(Step::row_pair, Step::size, in, out, x, count);
     }
 };
 
@@ -109,7 +130,8 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
                    bit_or(bits(w, 0xF8), bits(shr<5>(w), 0x07)));
     }
     static void part(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
-        part_through_stack<yuv_step>(in, out, x, count);
+        part_through_stack<yuv_step>(to_rgb_row<yuv_layout::grey, bt601, Packing>, size, in, out, x,
+                                     count);
     }
 };
 
