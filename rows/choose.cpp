@@ -100,6 +100,14 @@ row_table &add_table(target t) {
     return tables[size_t(t)] = tables[size_t(target::scalar)];
 }
 
+// Rows shorter than the vectors of `wide` are left to those of `narrow`, if there are such.
+void leave_short_rows(target wide, target narrow, ptrdiff_t bytes) {
+    if (!available[size_t(wide)] || !available[size_t(narrow)]) return;
+    row_table &table = tables[size_t(wide)];
+    table.for_short = &tables[size_t(narrow)];
+    table.short_below = bytes;
+}
+
 // Rows that suit the processor better than those of its instruction set in general.
 void fit(row_table &table, const cpu &has) {
     if (has.fast_strings && table.mem.fill_with_strings)
@@ -130,6 +138,8 @@ void fill_tables() {
 #ifdef SIMGP_HAVE_avx512
     if (has.avx512) OFFER(avx512)
 #endif
+    leave_short_rows(target::avx2, target::sse41, 32);
+    leave_short_rows(target::avx512, target::avx2, 64);
     live_table.store(&tables[size_t(best)], std::memory_order_release);
 }
 #undef FILL

@@ -33,6 +33,14 @@ const row_table &rows_of(target t);
 // has forced others. The choice is made at the first call, on whatever thread that is.
 const row_table &live_rows();
 
+// The same for rows of `width` samples: where that is less than a vector, the rows of an instruction
+// set with shorter ones, which the same processor has.
+inline const row_table &live_rows(ptrdiff_t width) {
+    const row_table *rows = &live_rows();
+    while (rows->for_short && width < rows->short_below) rows = rows->for_short;
+    return *rows;
+}
+
 // The target in use.
 target live_target();
 

@@ -165,11 +165,9 @@ struct any_source<chroma_in::groups> {
         if (!luma_first) p = {p.pairs, p.y};
         return p;
     }
-    void stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
-        if (luma_first)
-            source<yuv_layout::yuyv>::stage(to, s, x, count);
-        else
-            source<yuv_layout::uyvy>::stage(to, s, x, count);
+    samples stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
+        return (luma_first ? source<yuv_layout::yuyv>::stage : source<yuv_layout::uyvy>::stage)(
+            to, s, x, count);
     }
 };
 
@@ -188,12 +186,12 @@ template <chroma_in In, pixel_kind Kind>
     constexpr int size = any_packer<Kind>::size;
     staged to;
     uint8_t pixels[bytes * size];
-    any_source<In>(how).stage(to, in, x, count);
+    const samples s = any_source<In>(how).stage(to, in, x, count);
     if constexpr (In == chroma_in::pairs)
-        any_row_pair<In, Kind>(how, to.y, to.y, to.u, to.v, pixels, pixels, bytes);
+        any_row_pair<In, Kind>(how, s.y, s.y, s.u, s.v, pixels, pixels, bytes);
     else
-        any_row<In, Kind>(how, to.y, to.u, to.v, pixels, bytes);
-    memcpy(dst + x * size, pixels, size_t(count) * size);
+        any_row<In, Kind>(how, s.y, s.u, s.v, pixels, bytes);
+    unstage_few<size>(dst + x * size, pixels, count);
 }
 
 template <chroma_in In, pixel_kind Kind>
@@ -336,16 +334,17 @@ static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t
             if (src1) store(y1 + x, m.luma(load_pixels<Kind>(src1 + size * x)));
         },
         [&](ptrdiff_t x, int count) {
-            uint8_t pixels[2][bytes * size] = {}, to_y[2][bytes], to_u[bytes], to_v[bytes];
-            memcpy(pixels[0], src0 + size * x, size_t(count) * size);
-            if (src1) memcpy(pixels[1], src1 + size * x, size_t(count) * size);
-            any_yuv_row<Kind, Out>(w, pixels[0], pixels[1], to_y[0], to_y[1], to_u, to_v, bytes);
-            memcpy(y0 + x, to_y[0], size_t(count));
-            if (src1) memcpy(y1 + x, to_y[1], size_t(count));
+            uint8_t pixels[2][bytes * size], to_y[2][bytes], to_u[bytes], to_v[bytes];
+            stage_few<size, bytes * size>(pixels[0], src0 + size * x, count);
+            if (src1) stage_few<size, bytes * size>(pixels[1], src1 + size * x, count);
+            any_yuv_row<Kind, Out>(w, pixels[0], src1 ? pixels[1] : nullptr, to_y[0], to_y[1], to_u,
+                                   to_v, bytes);
+            unstage_few<1>(y0 + x, to_y[0], count);
+            if (src1) unstage_few<1>(y1 + x, to_y[1], count);
             if (Out == chroma_out::none) return;
-            const size_t samples = size_t(count + 1) / 2;
-            memcpy(u + chroma_size * (x / 2), to_u, chroma_size * samples);
-            if (Out == chroma_out::half) memcpy(v + x / 2, to_v, samples);
+            const int samples = (count + 1) / 2;
+            unstage_few<chroma_size>(u + chroma_size * (x / 2), to_u, samples);
+            if (Out == chroma_out::half) unstage_few<1>(v + x / 2, to_v, samples);
         });
 }
 

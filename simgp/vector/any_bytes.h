@@ -34,11 +34,11 @@ static void split_pixels_vectors(const uint8_t *src, uint8_t *const channels[3],
             for (int k = 0; k < 3; k++) store(channels[k] + x, c.c[k]);
         },
         [&](ptrdiff_t x, int part) {
-            uint8_t pixels[bytes * size] = {}, to[3][bytes];
+            uint8_t pixels[bytes * size], to[3][bytes];
             uint8_t *const planes[] = {to[0], to[1], to[2]};
-            memcpy(pixels, src + size * x, size_t(part) * size);
+            stage_few<size, bytes * size>(pixels, src + size * x, part);
             split_pixels_vectors<In>(pixels, planes, bytes);
-            for (int k = 0; k < 3; k++) memcpy(channels[k] + x, to[k], size_t(part));
+            for (int k = 0; k < 3; k++) unstage_few<1>(channels[k] + x, to[k], part);
         });
 }
 
@@ -69,10 +69,10 @@ inline void repack_in_steps(const uint8_t *src, uint8_t *dst, ptrdiff_t count, C
         count, [&](ptrdiff_t x) { return src + Size * x; },
         [&](ptrdiff_t x, const uint8_t *from) { convert(dst + ToSize * x, from); },
         [&](ptrdiff_t x, int part) {
-            uint8_t pixels[bytes * Size] = {}, to[bytes * ToSize];
-            memcpy(pixels, src + Size * x, size_t(part) * Size);
+            uint8_t pixels[bytes * Size], to[bytes * ToSize];
+            stage_few<Size, bytes * Size>(pixels, src + Size * x, part);
             convert(to, pixels);
-            memcpy(dst + ToSize * x, to, size_t(part) * ToSize);
+            unstage_few<ToSize>(dst + ToSize * x, to, part);
         });
 }
 

@@ -70,13 +70,13 @@ struct rgb_to_yuv_step {
         }
     }
     static void part(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x, int count) {
-        uint8_t pixels[bytes * from::size] = {}, y[bytes], u[bytes], v[bytes];
-        memcpy(pixels, in + from::size * x, size_t(count) * from::size);
+        uint8_t pixels[bytes * from::size], y[bytes], u[bytes], v[bytes];
+        stage_few<from::size, bytes * from::size>(pixels, in + from::size * x, count);
         write({y, u, v}, 0, pixels);
-        memcpy(out.y + x, y, size_t(count));
-        if (const size_t chroma = size_t(count / 2); pixels_in_pairs && chroma) {
-            memcpy(out.u + chroma_size * (x / 2), u, chroma * chroma_size);
-            if (planar) memcpy(out.v + x / 2, v, chroma);
+        unstage_few<1>(out.y + x, y, count);
+        if (const int chroma = count / 2; pixels_in_pairs && chroma) {
+            unstage_few<chroma_size>(out.u + chroma_size * (x / 2), u, chroma);
+            if (planar) unstage_few<1>(out.v + x / 2, v, chroma);
         }
     }
 };
@@ -97,10 +97,10 @@ struct rgb_to_rgb565_step {
             repack_888_to_565(out + 2 * x, pixels);
     }
     static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
-        uint8_t pixels[bytes * size] = {}, words[2 * bytes];
-        memcpy(pixels, in + size * x, size_t(count) * size);
+        uint8_t pixels[bytes * size], words[2 * bytes];
+        stage_few<size, bytes * size>(pixels, in + size * x, count);
         write(words, 0, pixels);
-        memcpy(out + 2 * x, words, 2 * size_t(count));
+        unstage_few<2>(out + 2 * x, words, count);
     }
 };
 

@@ -3,8 +3,57 @@
 #define SIMGP_VECTOR_STEPS_H
 
 #include <stddef.h>
+#include <string.h>
 
 namespace simgp::SIMD_TARGET {
+
+// Less than a vector
+// ------------------------------------------------------------------------------------------------
+//
+// It goes through the stack. What a vector is loaded from there should have been stored by one: the
+// processor would have to wait until several stores have reached the cache. Hence the last sample of
+// an odd row, the commonest part of all, is staged by whole vectors.
+
+// Copies `count` bytes, a few.
+[[gnu::noinline]] static void copy_few(uint8_t *to, const uint8_t *from, ptrdiff_t count) {
+    const auto move = [&](ptrdiff_t n) __attribute__((always_inline)) {
+        memcpy(to, from, size_t(n));
+        to += n;
+        from += n;
+    };
+    for (; count >= 16; count -= 16) move(16);
+    if (count & 8) move(8);
+    if (count & 4) move(4);
+    if (count & 2) move(2);
+    if (count & 1) move(1);
+}
+
+// Puts `count` >= 1 samples of Size bytes where Room bytes will be read, a number of vectors. What is
+// behind them has no meaning.
+template <int Size, int Room>
+inline void stage_few(uint8_t *to, const uint8_t *from, int count) {
+    static_assert(Size >= 1 && Size <= 4 && Room % bytes == 0);
+    u8v first = set_u8(0);
+    if (count == 1) {
+        uint32_t sample = 0;
+        for (int k = 0; k < Size; k++) sample |= uint32_t(from[k]) << 8 * k;
+        first = set_u32(sample);
+    }
+    for (int i = 0; i < Room; i += bytes) store(to + i, first);
+    if (count > 1) copy_few(to, from, ptrdiff_t(Size) * count);
+}
+
+// Takes `count` >= 1 samples of Size bytes from where they were staged.
+template <int Size>
+inline void unstage_few(uint8_t *to, const uint8_t *from, int count) {
+    if (count == 1)
+        memcpy(to, from, Size);
+    else
+        copy_few(to, from, ptrdiff_t(Size) * count);
+}
+
+// Steps
+// ------------------------------------------------------------------------------------------------
 
 // The same as row_of_steps below, by functions.
 template <bool PixelsInPairs, class Load, class Write, class Part>

@@ -15,9 +15,8 @@ template <class Step>
 inline void part_through_stack(const samples &in, uint8_t *out, ptrdiff_t x, int count) {
     staged to;
     uint8_t pixels[bytes * Step::size];
-    Step::stage(to, in, x, count);
-    Step::write(pixels, 0, Step::load(to.all(), 0));
-    memcpy(out + x * Step::size, pixels, size_t(count) * Step::size);
+    Step::write(pixels, 0, Step::load(Step::stage(to, in, x, count), 0));
+    unstage_few<Step::size>(out + x * Step::size, pixels, count);
 }
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
@@ -99,8 +98,9 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
     static constexpr int size = 2;
 
     static u8v load(const samples &in, ptrdiff_t x) { return load_luma<pixel_order::by8>(in.y, x); }
-    static void stage(staged &to, const samples &in, ptrdiff_t x, int count) {
-        memcpy(to.y, in.y + x, size_t(count));
+    static samples stage(staged &to, const samples &in, ptrdiff_t x, int count) {
+        stage_few<1, bytes>(to.y, in.y + x, count);
+        return {to.y, to.y, to.y};
     }
     static void write(uint8_t *out, ptrdiff_t x, u8v y) {
         const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
