@@ -15,7 +15,8 @@ namespace simgp::SIMD_TARGET {
 // an odd row, the commonest part of all, is staged by whole vectors.
 
 // Copies `count` bytes, a few.
-[[gnu::noinline]] static void copy_few(uint8_t *to, const uint8_t *from, ptrdiff_t count) {
+[[gnu::noinline, maybe_unused]] static void copy_few(uint8_t *to, const uint8_t *from,
+                                                     ptrdiff_t count) {
     const auto move = [&](ptrdiff_t n) __attribute__((always_inline)) {
         memcpy(to, from, size_t(n));
         to += n;
