@@ -351,6 +351,16 @@ int run(int argc, char **argv) {
     std::vector<std::pair<std::string, comparison>> all;
     for (const family &f : families)
         for (comparison &c : f.comparisons()) all.emplace_back(f.name, std::move(c));
+    if (sizes.empty()) {
+        for (size_t i = 0, count = all.size(); i < count; i++) {
+            comparison c = all[i].second;
+            if (std::find(small_operations.begin(), small_operations.end(), c.name) ==
+                small_operations.end())
+                continue;
+            c.sizes = small_sizes;
+            all.emplace_back("Small pictures", std::move(c));
+        }
+    }
     for (const auto &[family_name, c] : all) {
         for (const std::string &size : sizes.empty() ? c.sizes : sizes_like(c.sizes, sizes)) {
             const auto body = [&out, name = family_name, c = c, size, s](benchmark::State &state) {

@@ -74,6 +74,27 @@ std::function<void()> memory_traffic_in_place(std::shared_ptr<void> keep, uint8_
 // Ends the program with a message on stderr.
 [[noreturn]] void fail(const std::string &message);
 
+// Icons, macroblocks and spans: rows of less than a vector or two; and the least odd size above one
+// of the usual ones.
+inline const std::vector<std::string> small_sizes = {"8x8",   "16x16", "24x24",
+                                                     "40x40", "64x48", "321x241"};
+// What is measured at these: the main operations of each family.
+inline const std::vector<std::string> small_operations = {"yuv420_to_rgb565",
+                                                          "yuv420_to_rgb888",
+                                                          "yuv420_to_rgba8888",
+                                                          "yuv444_to_rgb565",
+                                                          "nv12_to_rgb565",
+                                                          "uyvy_to_rgb565",
+                                                          "rgb888_to_yuv420",
+                                                          "rgba8888_to_rgb565",
+                                                          "yuv420_to_nv12",
+                                                          "nv12_to_yuv420",
+                                                          "cpy_8b",
+                                                          "cpy_32b",
+                                                          "any_rgba8888_to_nv12",
+                                                          "any_yuyv_to_yuv420",
+                                                          "any_rgb888_to_bgra8888"};
+
 // Each area's comparisons (bench/<area>_bench.cpp).
 std::vector<comparison> yuv2rgb_comparisons();
 std::vector<comparison> packed2rgb_comparisons();

@@ -99,6 +99,14 @@ row_table &add_table(target t) {
     return tables[size_t(t)] = tables[size_t(target::scalar)];
 }
 
+// Rows shorter than the vectors of `wide` are left to those of `narrow`, if there are such.
+void leave_short_rows(target wide, target narrow, ptrdiff_t bytes) {
+    if (!available[size_t(wide)] || !available[size_t(narrow)]) return;
+    row_table &table = tables[size_t(wide)];
+    table.for_short = &tables[size_t(narrow)];
+    table.short_below = bytes;
+}
+
 // Rows that suit the processor better than those of its instruction set in general.
 void fit(row_table &table, const cpu &has) {
     if (has.fast_strings && table.mem.fill_with_strings)
@@ -129,6 +137,8 @@ void fill_tables() {
 #ifdef SIMGP_HAVE_avx512
     if (has.avx512) OFFER(avx512)
 #endif
+    leave_short_rows(target::avx2, target::sse41, 32);
+    leave_short_rows(target::avx512, target::avx2, 64);
     live_table.store(&tables[size_t(best)], std::memory_order_release);
 }
 #undef FILL
@@ -177,6 +187,12 @@ const row_table &rows_of(target t) {
 const row_table &choose_rows() {
     ensure_tables();
     return *live_table.load(std::memory_order_acquire);
+}
+
+const row_table &live_rows(ptrdiff_t width) {
+    const row_table *rows = &live_rows();
+    while (rows->for_short && width < rows->short_below) rows = rows->for_short;
+    return *rows;
 }
 
 target live_target() { return target(&live_rows() - tables); }

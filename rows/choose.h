@@ -41,6 +41,10 @@ inline const row_table &live_rows() {
     return table ? *table : choose_rows();
 }
 
+// The same for rows of `width` samples: where that is less than a vector, the rows of an instruction
+// set with shorter ones, which the same processor has.
+const row_table &live_rows(ptrdiff_t width);
+
 // The target in use.
 target live_target();
 

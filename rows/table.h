@@ -30,6 +30,11 @@ struct row_table {
     rotate_rows rotate;
     tile_rows tile;
     yuv2rgb_rows yuv2rgb;
+
+    // Rows of less than `short_below` samples are those of `for_short`, whose vectors are shorter;
+    // null: none are.
+    const row_table *for_short;
+    ptrdiff_t short_below;
 };
 
 }  // namespace simgp

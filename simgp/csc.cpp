@@ -23,5 +23,5 @@ constexpr simgp::conversion conversions[] = {
 
 int32_t simgp_csc(const simgp_img *src, const simgp_img *dst) {
     if (src->format == dst->format) return SIMGP_ERR_PARAM;
-    return simgp::convert_by(conversions, *src, *dst);
+    return simgp::convert_by<conversions>(*src, *dst);
 }

@@ -494,7 +494,7 @@ int32_t simgp_csc_any(const simgp_img *src, const simgp_img *dst, int32_t colour
     if (width < 1 || height < 1) return SIMGP_OK;
     if (colour == SIMGP_COLOUR_BT601 && simgp_csc(src, dst) == SIMGP_OK) return SIMGP_OK;
 
-    const row_table &live = live_rows();
+    const row_table &live = live_rows(width);
     const job j{*from, *to, *src, *dst, matrix, mean, width, height, live.any, live.layout};
     if (from == to)
         copy_picture(j);

@@ -46,8 +46,8 @@ void finish_row(const const_lines &from, const Lines &to, ptrdiff_t width, ptrdi
     if (y == 0) {
         for (int k = 0; k < 2; k++) memcpy(to.line(k), from.line(k), size_t(width));
     } else if (y <= height - 2) {
-        live_rows().dither.dither(from.line(y + 1), to.line(y - 1), to.line(y), to.line(y + 1),
-                                  width);
+        live_rows(width - 5).dither.dither(from.line(y + 1), to.line(y - 1), to.line(y),
+                                           to.line(y + 1), width);
     }
 }
 
@@ -196,5 +196,5 @@ int32_t simgp_csc_dither(const simgp_img *src, const simgp_img *dst) {
         dither_planes(*src, *dst);
         return SIMGP_OK;
     }
-    return convert_by(dithered_conversions, *src, *dst);
+    return convert_by<dithered_conversions>(*src, *dst);
 }

@@ -34,10 +34,31 @@ consteval bool described_as_listed() {
 }
 static_assert(described_as_listed());
 
+// Where a code stands in that list. Codes with a name are 100 n + 0 ... 11, below 600.
+class format_places {
+  public:
+    static constexpr int count = int(sizeof coded_formats / sizeof *coded_formats);
+
+    consteval format_places() : place_() {
+        for (int8_t &p : place_) p = -1;
+        for (int8_t i = 0; i < count; i++) place_[slot(coded_formats[i].code)] = i;
+    }
+    // -1: it has no name.
+    constexpr int of(int32_t code) const {
+        if (code < 0 || code >= 100 * families || code % 100 >= members) return -1;
+        return place_[slot(code)];
+    }
+
+  private:
+    static constexpr int families = 6, members = 12;
+    static constexpr int slot(int32_t code) { return code / 100 * members + code % 100; }
+    int8_t place_[families * members];
+};
+inline constexpr format_places places_of_formats;
+
 constexpr const format *find_format(int32_t code) {
-    for (const coded_format &f : coded_formats)
-        if (f.code == code) return f.is;
-    return nullptr;
+    const int place = places_of_formats.of(code);
+    return place < 0 ? nullptr : coded_formats[place].is;
 }
 
 // The planes that operations see which keep the format, copy and rotation: planar and semi-planar

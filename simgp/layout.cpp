@@ -47,7 +47,7 @@ void pack_plane(const const_lines &a, const const_lines &b, const lines &dst, pt
                 ptrdiff_t height) {
     if (pairs < 1 || height < 1) return;
     join_rows(pairs, height, a.stride, b.stride, dst.stride);
-    pack_row *const row = live_rows().layout.pack;
+    pack_row *const row = live_rows(2 * pairs).layout.pack;
     for (ptrdiff_t y = 0; y < height; y++) row(a.line(y), b.line(y), dst.line(y), pairs);
 }
 
@@ -57,7 +57,7 @@ void unpack_plane(const const_lines &src, const lines &a, const lines &b, ptrdif
     if (bytes < 1 || height < 1) return;
     ptrdiff_t pairs = bytes / 2;
     if (bytes % 2 == 0) join_rows(pairs, height, a.stride, b.stride, src.stride);
-    unpack_row *const row = live_rows().layout.unpack;
+    unpack_row *const row = live_rows(2 * pairs).layout.unpack;
     for (ptrdiff_t y = 0; y < height; y++) {
         if (pairs > 0) row(src.line(y), a.line(y), b.line(y), pairs);
         if (bytes % 2) a.line(y)[pairs] = src.line(y)[2 * pairs];

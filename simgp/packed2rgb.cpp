@@ -9,7 +9,8 @@ namespace {
 
 template <const format &From, const format &To>
 void packed_to_rgb(const csc_args &a) {
-    yuv_to_rgb_row *const row = yuv_to_rgb_row_of<From, To, yuv_rule::usual>(live_rows());
+    const row_table &live = live_rows(a.src_widths[0]);
+    yuv_to_rgb_row *const row = yuv_to_rgb_row_of<From, To, yuv_rule::usual>(live);
     walk_one_plane(a, src_lines(a, 0), From.bytes[0], dst_lines(a, 0), To.bytes[0],
                    [=](const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
                        row(src, nullptr, nullptr, dst, width);

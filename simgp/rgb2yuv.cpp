@@ -66,7 +66,7 @@ template <const format &From, const format &To>
 void rgb_to_yuv(const csc_args &a) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
-    const auto &to_layout = live_rows().rgb2yuv.row[size_t(From.packing)];
+    const auto &to_layout = live_rows(width).rgb2yuv.row[size_t(From.packing)];
     rgb_to_yuv_row *const with_chroma = to_layout[size_t(To.layout)];
     rgb_to_yuv_row *const luma_only = to_layout[size_t(yuv_layout::grey)];
     const const_lines in = whole_pixel_lines(src_lines(a, 0), From.bytes[0]);
@@ -82,7 +82,7 @@ template <const format &From, const format &To>
 void rgb_to_rgb565(const csc_args &a) {
     walk_one_plane(a, whole_pixel_lines(src_lines(a, 0), From.bytes[0]), From.bytes[0],
                    whole_pixel_lines(dst_lines(a, 0), To.bytes[0]), To.bytes[0],
-                   live_rows().rgb2yuv.to_rgb565[size_t(From.packing)]);
+                   live_rows(a.src_widths[0]).rgb2yuv.to_rgb565[size_t(From.packing)]);
 }
 
 }  // namespace

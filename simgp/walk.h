@@ -51,7 +51,7 @@ struct walk_span {
 // takes chroma line (y + lead) >> 1.
 template <const format &From, const format &To, yuv_rule Rule, class Luma, class U, class V>
 void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_span &span, int lead) {
-    auto *const row = yuv_to_rgb_row_of<From, To, Rule>(live_rows());
+    auto *const row = yuv_to_rgb_row_of<From, To, Rule>(live_rows(span.width));
     if (span.width < 1) return;
     const ptrdiff_t at = span.x * To.bytes[0];
     if constexpr (!serves_two_rows(From)) {

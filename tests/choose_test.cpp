@@ -152,6 +152,21 @@ TEST(choice, can_be_forced_and_given_back) {
     EXPECT_EQ(simgp::live_target(), best_available());
 }
 
+// Rows shorter than a vector are left to the widest vectors that they fill, if the processor has any.
+TEST(choice, short_rows_go_to_shorter_vectors) {
+    using simgp::rows_of;
+    for (const rig::target_rows &t : rig::all_targets()) {
+        rig::forced rows(t);
+        for (ptrdiff_t width : {-3, 0, 1, 31, 32, 63, 64, 1000}) {
+            const simgp::row_table *expected = t.rows;
+            if (t.name == std::string("avx512") && width < 64) expected = &rows_of(target::avx2);
+            if (expected == &rows_of(target::avx2) && width < 32)
+                expected = &rows_of(target::sse41);
+            EXPECT_EQ(&simgp::live_rows(width), expected) << t.name << ", " << width;
+        }
+    }
+}
+
 // A target has rows of its own, not those of another under a new name.
 TEST(choice, every_target_has_its_own_rows) {
     if (__BYTE_ORDER__ != __ORDER_LITTLE_ENDIAN__) GTEST_SKIP() << "there are scalar rows only";

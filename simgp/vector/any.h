@@ -165,11 +165,9 @@ struct any_source<chroma_in::groups> {
         if (!luma_first) p = {p.pairs, p.y};
         return p;
     }
-    void stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
-        if (luma_first)
-            source<yuv_layout::yuyv>::stage(to, s, x, count);
-        else
-            source<yuv_layout::uyvy>::stage(to, s, x, count);
+    samples stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
+        return (luma_first ? source<yuv_layout::yuyv>::stage : source<yuv_layout::uyvy>::stage)(
+            to, s, x, count);
     }
 };
 
@@ -179,9 +177,9 @@ template <chroma_in In>
                                        const samples &in, uint8_t *dst, ptrdiff_t x, int count) {
     staged to;
     uint8_t pixels[bytes * 4];
-    any_source<In>(how).stage(to, in, x, count);
-    row(how, to.y, to.u, to.v, pixels, bytes);
-    memcpy(dst + x * size, pixels, size_t(count) * size_t(size));
+    const samples s = any_source<In>(how).stage(to, in, x, count);
+    row(how, s.y, s.u, s.v, pixels, bytes);
+    copy_few(dst + x * size, pixels, ptrdiff_t(size) * count);
 }
 
 template <chroma_in In, pixel_kind Kind>
@@ -327,17 +325,16 @@ struct any_yuv_sizes {
                                            const rgb_weights &w, const uint8_t *src0,
                                            const uint8_t *src1, uint8_t *y0, uint8_t *y1,
                                            uint8_t *u, uint8_t *v, ptrdiff_t x, int count) {
-    uint8_t pixels[2][bytes * 4] = {}, to_y[2][bytes], to_u[bytes], to_v[bytes];
-    const size_t pixel_bytes = size_t(count) * size_t(of.size);
-    memcpy(pixels[0], src0 + of.size * x, pixel_bytes);
-    if (src1) memcpy(pixels[1], src1 + of.size * x, pixel_bytes);
-    row(w, pixels[0], pixels[1], to_y[0], to_y[1], to_u, to_v, bytes);
-    memcpy(y0 + x, to_y[0], size_t(count));
-    if (src1) memcpy(y1 + x, to_y[1], size_t(count));
+    uint8_t pixels[2][bytes * 4], to_y[2][bytes], to_u[bytes], to_v[bytes];
+    stage_few(pixels[0], of.size, src0 + of.size * x, count, of.size);
+    if (src1) stage_few(pixels[1], of.size, src1 + of.size * x, count, of.size);
+    row(w, pixels[0], src1 ? pixels[1] : nullptr, to_y[0], to_y[1], to_u, to_v, bytes);
+    copy_few(y0 + x, to_y[0], count);
+    if (src1) copy_few(y1 + x, to_y[1], count);
     if (of.chroma_size == 0) return;
-    const size_t samples = size_t(count + 1) / 2;
-    memcpy(u + of.chroma_size * (x / 2), to_u, size_t(of.chroma_size) * samples);
-    if (of.chroma_size == 1) memcpy(v + x / 2, to_v, samples);
+    const int samples = (count + 1) / 2;
+    copy_few(u + of.chroma_size * (x / 2), to_u, ptrdiff_t(of.chroma_size) * samples);
+    if (of.chroma_size == 1) copy_few(v + x / 2, to_v, samples);
 }
 
 template <pixel_kind Kind, chroma_out Out>

@@ -26,11 +26,11 @@ inline rgb_v load_pixels(const uint8_t *p) {
 
 [[gnu::noinline]] static void split_part(split_pixels_row *row, int size, const uint8_t *src,
                                          uint8_t *const channels[3], ptrdiff_t x, int count) {
-    uint8_t pixels[bytes * 4] = {}, to[3][bytes];
+    uint8_t pixels[bytes * 4], to[3][bytes];
     uint8_t *const planes[] = {to[0], to[1], to[2]};
-    memcpy(pixels, src + size * x, size_t(count) * size_t(size));
+    stage_few(pixels, size, src + size * x, count, size);
     row(pixels, planes, bytes);
-    for (int k = 0; k < 3; k++) memcpy(channels[k] + x, to[k], size_t(count));
+    for (int k = 0; k < 3; k++) copy_few(channels[k] + x, to[k], count);
 }
 
 template <rgb_in In>
@@ -73,10 +73,10 @@ struct repack_sizes {
 [[gnu::noinline]] static void repack_part(repack_row *row, repack_sizes size,
                                           const repacking &order, const uint8_t *src, uint8_t *dst,
                                           ptrdiff_t x, int count) {
-    uint8_t pixels[bytes * 4] = {}, to[bytes * 4];
-    memcpy(pixels, src + size.from * x, size_t(count) * size_t(size.from));
+    uint8_t pixels[bytes * 4], to[bytes * 4];
+    stage_few(pixels, size.from, src + size.from * x, count, size.from);
     row(order, pixels, to, bytes);
-    memcpy(dst + size.to * x, to, size_t(count) * size_t(size.to));
+    copy_few(dst + size.to * x, to, ptrdiff_t(size.to) * count);
 }
 
 // Calls convert(p, q) for every `bytes` pixels of Size bytes at q that become pixels of ToSize bytes

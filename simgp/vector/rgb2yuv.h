@@ -52,14 +52,14 @@ struct yuv_row_sizes {
 };
 [[gnu::noinline]] static void part_to_yuv(rgb_to_yuv_row *row, yuv_row_sizes of, const uint8_t *in,
                                           const yuv_row_out &out, ptrdiff_t x, int count) {
-    uint8_t pixels[bytes * 3] = {}, y[bytes], u[bytes], v[bytes];
-    memcpy(pixels, in + of.size * x, size_t(count) * size_t(of.size));
+    uint8_t pixels[bytes * 3], y[bytes], u[bytes], v[bytes];
+    stage_few(pixels, of.size, in + of.size * x, count, of.size);
     row(pixels, y, u, v, bytes);
-    memcpy(out.y + x, y, size_t(count));
-    const size_t chroma = size_t(count / 2);
+    copy_few(out.y + x, y, count);
+    const int chroma = count / 2;
     if (of.chroma_size == 0 || chroma == 0) return;
-    memcpy(out.u + of.chroma_size * (x / 2), u, chroma * size_t(of.chroma_size));
-    if (of.chroma_size == 1) memcpy(out.v + x / 2, v, chroma);
+    copy_few(out.u + of.chroma_size * (x / 2), u, ptrdiff_t(of.chroma_size) * chroma);
+    if (of.chroma_size == 1) copy_few(out.v + x / 2, v, chroma);
 }
 
 template <rgb_packing Packing, yuv_layout Layout>
@@ -99,10 +99,10 @@ struct rgb_to_yuv_step {
 
 [[gnu::noinline]] static void part_to_rgb565(rgb_to_rgb_row *row, int size, const uint8_t *in,
                                              uint8_t *out, ptrdiff_t x, int count) {
-    uint8_t pixels[bytes * 4] = {}, words[2 * bytes];
-    memcpy(pixels, in + size * x, size_t(count) * size_t(size));
+    uint8_t pixels[bytes * 4], words[2 * bytes];
+    stage_few(pixels, size, in + size * x, count, size);
     row(pixels, words, bytes);
-    memcpy(out + 2 * x, words, 2 * size_t(count));
+    copy_few(out + 2 * x, words, 2 * ptrdiff_t(count));
 }
 
 template <rgb_packing Packing>

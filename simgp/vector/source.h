@@ -9,6 +9,7 @@
 #include <string.h>
 
 #include "simgp/vector/packer.h"
+#include "simgp/vector/steps.h"
 
 namespace simgp::SIMD_TARGET {
 
@@ -17,11 +18,9 @@ struct samples {
 };
 
 // Room on the stack for the samples of less than a vector of pixels, read by the loads of a whole
-// one. Bytes behind the samples hold 0.
+// one. stage(to, s, x, count) fills it, and gives the planes that are then to be read.
 struct staged {
-    uint8_t y[2 * bytes] = {}, u[bytes] = {}, v[bytes] = {};
-
-    samples all() const { return {y, u, v}; }
+    uint8_t y[2 * bytes], u[bytes], v[bytes];
 };
 
 template <pixel_order Order>
@@ -48,10 +47,11 @@ struct source<yuv_layout::half> {
     static yuv_half load(const samples &s, ptrdiff_t x) {
         return {load_luma<Order>(s.y, x), arrange<Order>(load_zip(s.u + x / 2, s.v + x / 2))};
     }
-    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        memcpy(to.y, s.y + x, size_t(count));
-        memcpy(to.u, s.u + x / 2, size_t(count + 1) / 2);
-        memcpy(to.v, s.v + x / 2, size_t(count + 1) / 2);
+    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        stage_few(to.y, 1, s.y + x, count, 1);
+        stage_few(to.u, 1, s.u + x / 2, (count + 1) / 2, 1);
+        stage_few(to.v, 1, s.v + x / 2, (count + 1) / 2, 1);
+        return {to.y, to.u, to.v};
     }
 };
 
@@ -66,10 +66,11 @@ struct source<yuv_layout::full> {
         const u8v v = arrange<Order>(SIMD_TARGET::load(s.v + x));
         return {load_luma<Order>(s.y, x), join(even(u), even(v)), join(odd(u), odd(v))};
     }
-    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        memcpy(to.y, s.y + x, size_t(count));
-        memcpy(to.u, s.u + x, size_t(count));
-        memcpy(to.v, s.v + x, size_t(count));
+    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        stage_few(to.y, 1, s.y + x, count, 1);
+        stage_few(to.u, 1, s.u + x, count, 1);
+        stage_few(to.v, 1, s.v + x, count, 1);
+        return {to.y, to.u, to.v};
     }
 };
 
@@ -82,9 +83,10 @@ struct source_pairs {
     static yuv_half load(const samples &s, ptrdiff_t x) {
         return {load_luma<Order>(s.y, x), arrange<Order>(SIMD_TARGET::load(s.u + x))};
     }
-    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        memcpy(to.y, s.y + x, size_t(count));
-        memcpy(to.u, s.u + x, size_t(count + 1) / 2 * 2);
+    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        stage_few(to.y, 1, s.y + x, count, 1);
+        stage_few(to.u, 1, s.u + x, (count + 1) / 2, 2);
+        return {to.y, to.u, to.u};
     }
 };
 
@@ -103,13 +105,20 @@ struct source_packed {
         return {LUMA_FIRST ? p.even : p.odd, LUMA_FIRST ? p.odd : p.even};
     }
     // A last group of one pixel gets the V of the group before.
-    static void stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        memcpy(to.y, s.y + 2 * x, 2 * size_t(count));
-        if (count & 1) {
-            constexpr int v = LUMA_FIRST ? 3 : 2;
-            const ptrdiff_t single = x + count - 1;
-            to.y[2 * (count - 1) + v] = single ? s.y[2 * single + v - 4] : 128;
+    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
+        constexpr int v = LUMA_FIRST ? 3 : 2;
+        const ptrdiff_t single = x + count - 1;
+        const uint8_t v_before = count & 1 && single ? s.y[2 * single + v - 4] : 128;
+        if (count == 1) {
+            const uint8_t *const at = s.y + 2 * x;
+            const u8v group = set_u32(at[0] | uint32_t(at[1]) << 8 | uint32_t(v_before) << 8 * v);
+            store(to.y, group);
+            store(to.y + bytes, group);
+            return {to.y, to.y, to.y};
         }
+        stage_few(to.y, 2, s.y + 2 * x, count, 2);
+        if (count & 1) to.y[2 * (count - 1) + v] = v_before;
+        return {to.y, to.y, to.y};
     }
 };
 template <>

@@ -3,8 +3,50 @@
 #define SIMGP_VECTOR_STEPS_H
 
 #include <stddef.h>
+#include <string.h>
 
 namespace simgp::SIMD_TARGET {
+
+// Less than a vector
+// ------------------------------------------------------------------------------------------------
+//
+// It goes through the stack. What a vector is loaded from there should have been stored by one: the
+// processor would have to wait until several stores have reached the cache. Hence the last sample of
+// an odd row, the commonest part of all, is staged by whole vectors.
+
+// Copies `count` bytes, a few.
+[[gnu::noinline, maybe_unused]] static void copy_few(uint8_t *to, const uint8_t *from,
+                                                     ptrdiff_t count) {
+    const auto move = [&](ptrdiff_t n) __attribute__((always_inline)) {
+        memcpy(to, from, size_t(n));
+        to += n;
+        from += n;
+    };
+    for (; count >= 16; count -= 16) move(16);
+    if (count & 8) move(8);
+    if (count & 4) move(4);
+    if (count & 2) move(2);
+    if (count & 1) move(1);
+}
+
+// Puts `count` >= 1 samples of `size` bytes, 1 to 4, where `vectors` vectors will be read. What is
+// behind them has no meaning.
+[[gnu::noinline, maybe_unused]] static void stage_few(uint8_t *to, int vectors, const uint8_t *from,
+                                                      int count, int size) {
+    u8v first = set_u8(0);
+    if (count == 1) {
+        uint32_t sample = 0;
+        for (int k = 0; k < size; k++) sample |= uint32_t(from[k]) << 8 * k;
+        first = set_u32(sample);
+    }
+    int i = 0;
+    do store(to + i * bytes, first);
+    while (++i < vectors);
+    if (count > 1) copy_few(to, from, ptrdiff_t(size) * count);
+}
+
+// Steps
+// ------------------------------------------------------------------------------------------------
 
 // The same as row_of_steps below, by functions.
 template <bool PixelsInPairs, class Load, class Write, class Part>

@@ -24,9 +24,9 @@ template <class Source>
                                                  uint8_t *out, ptrdiff_t x, int count) {
     staged to;
     uint8_t pixels[bytes * 4];
-    Source::stage(to, in, x, count);
-    row(to.y, to.u, to.v, pixels, bytes);
-    memcpy(out + x * size, pixels, size_t(count) * size_t(size));
+    const samples s = Source::stage(to, in, x, count);
+    row(s.y, s.u, s.v, pixels, bytes);
+    copy_few(out + x * size, pixels, ptrdiff_t(size) * count);
 }
 
 template <yuv_layout Layout, class Matrix, rgb_packing Packing>
@@ -82,12 +82,12 @@ template <class Source>
                                                  const samples_pair &in, const out_pair &out,
                                                  ptrdiff_t x, int count) {
     staged to;
-    uint8_t second_y[bytes] = {}, pixels[2][bytes * 4];
-    Source::stage(to, in.first, x, count);
-    memcpy(second_y, in.second_y + x, size_t(count));
-    rows(to.y, second_y, to.u, to.v, pixels[0], pixels[1], bytes);
-    memcpy(out.first + x * size, pixels[0], size_t(count) * size_t(size));
-    memcpy(out.second + x * size, pixels[1], size_t(count) * size_t(size));
+    uint8_t second_y[bytes], pixels[2][bytes * 4];
+    const samples s = Source::stage(to, in.first, x, count);
+    stage_few(second_y, 1, in.second_y + x, count, 1);
+    rows(s.y, second_y, s.u, s.v, pixels[0], pixels[1], bytes);
+    copy_few(out.first + x * size, pixels[0], ptrdiff_t(size) * count);
+    copy_few(out.second + x * size, pixels[1], ptrdiff_t(size) * count);
 }
 template <class Step>
 struct pair_step : Step {
@@ -120,8 +120,9 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
     static constexpr int size = 2;
 
     static u8v load(const samples &in, ptrdiff_t x) { return load_luma<pixel_order::by8>(in.y, x); }
-    static void stage(staged &to, const samples &in, ptrdiff_t x, int count) {
-        memcpy(to.y, in.y + x, size_t(count));
+    static samples stage(staged &to, const samples &in, ptrdiff_t x, int count) {
+        stage_few(to.y, 1, in.y + x, count, 1);
+        return {to.y, to.y, to.y};
     }
     static void write(uint8_t *out, ptrdiff_t x, u8v y) {
         const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
