@@ -47,28 +47,33 @@ struct walk_span {
     ptrdiff_t x, width, height;
 };
 
-// Converts the rows of a span from top to bottom, in pairs where chroma lines serve two. Row y then
-// takes chroma line (y + lead) >> 1.
+// Converts the rows of a span from top to bottom, by a row for each of them or by one for pairs, where
+// chroma lines serve two. Row y then takes chroma line (y + lead) >> 1. `at` is the way in bytes from the
+// destination's column 0 to its first pixel.
+template <class Luma, class U, class V>
+void walk_rows(yuv_to_rgb_row *row, Luma &luma, U &u, V &v, const lines &dst, ptrdiff_t at,
+               const walk_span &span, int) {
+    for (ptrdiff_t y = 0; y < span.height; y++)
+        row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y) + at, span.width);
+}
+template <class Luma, class U, class V>
+void walk_rows(yuv_to_rgb_row_pair *rows, Luma &luma, U &u, V &v, const lines &dst, ptrdiff_t at,
+               const walk_span &span, int lead) {
+    for (ptrdiff_t y = 0; y < span.height;) {
+        const ptrdiff_t chroma = (y + lead) >> 1;
+        // The row below, or the row again where it has its chroma line to itself.
+        const ptrdiff_t below = y + 1 < span.height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
+        const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
+        rows(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y) + at,
+             dst.line(below) + at, span.width);
+        y = below + 1;
+    }
+}
 template <const format &From, const format &To, yuv_rule Rule, class Luma, class U, class V>
 void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_span &span, int lead) {
     auto *const row = yuv_to_rgb_row_of<From, To, Rule>(live_rows(span.width));
     if (span.width < 1) return;
-    const ptrdiff_t at = span.x * To.bytes[0];
-    if constexpr (!serves_two_rows(From)) {
-        for (ptrdiff_t y = 0; y < span.height; y++)
-            row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y) + at, span.width);
-    } else {
-        for (ptrdiff_t y = 0; y < span.height;) {
-            const ptrdiff_t chroma = (y + lead) >> 1;
-            // The row below, or the row again where it has its chroma line to itself.
-            const ptrdiff_t below =
-                y + 1 < span.height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
-            const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
-            row(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y) + at,
-                dst.line(below) + at, span.width);
-            y = below + 1;
-        }
-    }
+    walk_rows(row, luma, u, v, dst, span.x * To.bytes[0], span, lead);
 }
 
 // The same for the whole picture of a kernel, its luma from wherever it comes.
