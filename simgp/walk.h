@@ -76,14 +76,36 @@ void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_spa
     walk_rows(row, luma, u, v, dst, span.x * To.bytes[0], span, lead);
 }
 
-// The same for the whole picture of a kernel, its luma from wherever it comes.
-template <const format &From, const format &To, yuv_rule Rule, class Luma>
-void convert_to_rgb(const csc_args &a, Luma &&luma) {
+// A conversion of whole pictures, as an argument: one walk serves them all.
+struct yuv_to_rgb_conversion {
+    const format &from, &to;
+    yuv_rule rule;
+};
+template <const format &From, const format &To, yuv_rule Rule>
+constexpr yuv_to_rgb_conversion conversion_of() {
+    static_assert(is_needed(From.layout, serves_two_rows(From), To.packing, matrix_of(Rule)),
+                  "rows/conversions.h has no kernel with such a row");
+    return {From, To, Rule};
+}
+
+// Converts the picture of a kernel, its luma from wherever it comes.
+template <class Luma>
+void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&luma) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
+    if (width < 1) return;
     // Rows do not look at the planes that their layout does not use.
-    constexpr int u = From.u < 0 ? 0 : From.u, v = From.v < 0 ? 0 : From.v;
-    walk_yuv_to_rgb<From, To, Rule>(luma, src_lines(a, u), src_lines(a, v), dst_lines(a, 0),
-                                    {0, width, height}, lead_of(Rule, width, height));
+    const const_lines u = src_lines(a, c.from.u < 0 ? 0 : c.from.u);
+    const const_lines v = src_lines(a, c.from.v < 0 ? 0 : c.from.v);
+    const lines dst = dst_lines(a, 0);
+    const yuv2rgb_rows &live = live_rows(width).yuv2rgb;
+    const size_t m = size_t(matrix_of(c.rule)), l = size_t(c.from.layout);
+    const size_t p = size_t(c.to.packing);
+    const walk_span span{0, width, height};
+    const int lead = lead_of(c.rule, width, height);
+    if (serves_two_rows(c.from))
+        walk_rows(live.pair[m][l][p], luma, u, v, dst, 0, span, lead);
+    else
+        walk_rows(live.row[m][l][p], luma, u, v, dst, 0, span, lead);
 }
 
 // Calls row(in, out, width) for every row of a picture of one plane on either side, whose pixels

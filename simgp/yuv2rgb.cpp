@@ -43,8 +43,9 @@ void fill_yuv2rgb(yuv2rgb_rows &t) {
 
 using namespace simgp;
 
-#define DEFINE(name, from, to, rule)                                                   \
-    SIMGP_CSC_KERNEL(name, convert_to_rgb<formats::from, formats::to, yuv_rule::rule>( \
-                               args, src_lines(args, 0)))
+#define DEFINE(name, from, to, rule)                                                            \
+    SIMGP_CSC_KERNEL(                                                                           \
+        name, convert_to_rgb(conversion_of<formats::from, formats::to, yuv_rule::rule>(), args, \
+                             src_lines(args, 0)))
 SIMGP_YUV_TO_RGB_KERNELS(DEFINE)
 #undef DEFINE
