@@ -1,5 +1,5 @@
 # Packages for Debian, by `cpack -G DEB` in a build that is configured with the prefix /usr (the preset
-# "packages"): libsimgp1, libsimgp-dev and simgp-tools, one for each component.
+# "packages"): libsimgp1, libsimgp-dev, simgp-tools and simgp-play, one for each component that the build has.
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME simgp)
 # Each package has a summary of its own.
@@ -14,6 +14,9 @@ set(CPACK_VERBATIM_VARIABLES ON)
 set(CPACK_COMPONENTS_ALL runtime dev)
 if(TARGET simgp-convert)
   list(APPEND CPACK_COMPONENTS_ALL tools)
+endif()
+if(TARGET simgp-play)
+  list(APPEND CPACK_COMPONENTS_ALL player)
 endif()
 
 set(CPACK_DEB_COMPONENT_INSTALL ON)
@@ -30,7 +33,9 @@ set(what_it_is "Conversion between planar, semi-planar, packed and tiled YUV and
  resizing, turns, deblocking and dithering, with vector instructions and
  the same result on every processor.")
 # simgp_package(COMPONENT name section summary)
+set(packages "")
 macro(simgp_package component name section summary)
+  list(APPEND packages "${component}:${name}")
   set(CPACK_DEBIAN_${component}_PACKAGE_NAME ${name})
   set(CPACK_DEBIAN_${component}_PACKAGE_SECTION ${section})
   set(CPACK_DEBIAN_${component}_DESCRIPTION "${summary}\n ${what_it_is}")
@@ -43,9 +48,12 @@ set(CPACK_DEBIAN_RUNTIME_PACKAGE_CONTROL_EXTRA ${PROJECT_BINARY_DIR}/debian/trig
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY >=)
 simgp_package(DEV libsimgp-dev libdevel "pixel kernels for players, cameras and devices: what programs are made with")
 simgp_package(TOOLS simgp-tools video "converts pictures and video frames, lists the pictures of streams")
+# The library is in it.
+simgp_package(PLAYER simgp-play video "shows films through the simgp library")
 set(CPACK_COMPONENT_DEV_DEPENDS runtime)
 set(CPACK_COMPONENT_TOOLS_DEPENDS runtime)
 
+string(TOLOWER "${packages}" packages)
 # Licence, changes and compressed manual pages go where Debian looks for them.
 configure_file(cmake/debian.cmake.in ${PROJECT_BINARY_DIR}/debian.cmake @ONLY)
 set(CPACK_PRE_BUILD_SCRIPTS ${PROJECT_BINARY_DIR}/debian.cmake)

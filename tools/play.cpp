@@ -6,7 +6,7 @@ namespace {
 
 constexpr const char *keys = R"(
 Keys:
-  space   pause            .   one frame on          left, right   to the key frame before, behind
+  space   pause            .   one frame on          left, right   to the key frame before, after
   r       quarter turn     h   mirror left to right  v             mirror top to bottom
   d       dither           b   deblock               f             16 or 32 bits a pixel
   o       overlay          s   screenshot            q, Esc        quit
@@ -45,6 +45,7 @@ int main(int argc, char **argv) {
     const auto screenshot =
         app.add_option("--screenshot", options.screenshot,
                        "file for the key s (simgp-play.png), and for the last of --frames");
+    app.set_version_flag("--version", "simgp-play " SIMGP_TOOLS_VERSION);
     const auto check = [&] {
         if (rgb565) options.format = "rgb565";
         if (rgb32) options.format = "bgra8888";
