@@ -29,16 +29,17 @@ set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${PROJECT_BINARY_DIR})
 set(CPACK_DEBIAN_ENABLE_COMPONENT_DEPENDS ON)
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
 
+# CPack indents it.
 set(what_it_is "Conversion between planar, semi-planar, packed and tiled YUV and RGB,
- resizing, turns, deblocking and dithering, with vector instructions and
- the same result on every processor.")
+resizing, turns, deblocking and dithering, with vector instructions and
+the same result on every processor.")
 # simgp_package(COMPONENT name section summary)
 set(packages "")
 macro(simgp_package component name section summary)
   list(APPEND packages "${component}:${name}")
   set(CPACK_DEBIAN_${component}_PACKAGE_NAME ${name})
   set(CPACK_DEBIAN_${component}_PACKAGE_SECTION ${section})
-  set(CPACK_DEBIAN_${component}_DESCRIPTION "${summary}\n ${what_it_is}")
+  set(CPACK_DEBIAN_${component}_DESCRIPTION "${summary}\n${what_it_is}")
 endmacro()
 simgp_package(RUNTIME libsimgp${PROJECT_VERSION_MAJOR} libs "pixel kernels for players, cameras and devices")
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)

@@ -12,6 +12,7 @@
 #include "tests/convert_program.h"
 #include "tools/colour.h"
 #include "tools/picture.h"
+#include "tools/road.h"
 
 namespace {
 
@@ -389,6 +390,36 @@ TEST_F(convert_test, turned_twice_is_the_picture_again) {
     write("one.rgba8888", "RGBArgba");
     good("one.rgba8888 --size 2x1 -o two.rgba8888 --rotate hori");
     EXPECT_EQ(read("two.rgba8888"), "rgbaRGBA");
+}
+
+// Whatever is done on the way, no road leads through 16 bits, grey or 4:2:2 unless one of its ends is that;
+// one that leads through 4:2:0 says so.
+TEST(road, keeps_what_both_ends_hold) {
+    std::vector<tools::edits> wishes;
+    for (int turn = SIMGP_ROT_NONE; turn <= SIMGP_ROT_VERT; ++turn)
+        for (const auto &[width, height] : {std::pair(0, 0), {20, 11}, {101, 60}})
+            for (int deblock : {0, 4}) wishes.push_back({deblock, width, height, turn, false});
+    wishes.push_back({.thumbnail = true});
+    const auto try_all = [&](const pixel_format &from, const pixel_format &to, bool dither,
+                             int width, int32_t colour) {
+        const int chroma = std::min(from.chroma(), to.chroma());
+        for (const tools::edits &wish : wishes) {
+            if (wish.deblock && from.is_rgb()) continue;
+            tools::road r({&from, width, 17}, to, dither, wish, colour);
+            for (const tools::step &s : r.steps()) {
+                const pixel_format &f = *s.out().format;
+                const bool noted = r.loss() == "4:2:0 chroma" && f.chroma() == 1;
+                EXPECT_TRUE(f.chroma() >= chroma || noted) << r.text() << r.loss();
+                EXPECT_TRUE(!f.is_rgb16() || from.is_rgb16() || to.is_rgb16()) << r.text();
+            }
+        }
+    };
+    for (const pixel_format &from : tools::formats())
+        for (const pixel_format &to : tools::formats()) {
+            try_all(from, to, false, 33, SIMGP_COLOUR_BT601);
+            try_all(from, to, false, 32, SIMGP_COLOUR_BT709);
+            if (to.is_rgb16()) try_all(from, to, true, 33, SIMGP_COLOUR_BT601);
+        }
 }
 
 TEST_F(convert_test, resized_pictures_keep_the_bars) {

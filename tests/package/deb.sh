@@ -33,6 +33,8 @@ has() { # PACKAGE PATTERN: a file whose path from the root on matches
 }
 for package in $packages; do
     [ "$(field $package Maintainer | sed 's/ <.*//')" = "the simgp authors" ] || fault "$package has another maintainer."
+    # What is indented further is set as it stands.
+    ! field "$package" Description | grep -nE '^  |^$' || fault "The lines of the description of $package are askew."
     has $package "usr/share/doc/$package/copyright"
     has $package "usr/share/doc/$package/changelog\.gz"
     others=$(dpkg-deb -c "$made/${package}_${version}_$architecture.deb" | awk '$2 != "root/root" || $1 ~ /^.....w|^........w/' |
