@@ -19,6 +19,7 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
     write("huge.png", png.substr(0, 16) + std::string("\x7f\xff\xff\xff", 4) + png.substr(20));
     write("empty", "");
     write("text", "This is no picture at all.");
+    write("stream", std::string("\0\0\0\1\x67", 5));
     write("photo.jpg", "\xFF\xD8\xFF\xE0 JFIF");
     write("odd0.png", "P6 2 1 255 " + std::string(6, 'x'));
     write("odd1.png", "P6 4 1 255 " + std::string(12, 'x'));
@@ -94,6 +95,9 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
          "--size: impossible size 4294967297x4294967297", 1},
         {"good.nv21 -s 64by48 -o o.png", "--size: '64by48' is not a size", 1},
         {"text -s 64x48 -o o.png", "text: raw frames need --format", 1},
+        {"good.nv21 -o o.png", "good.nv21: raw frames of nv21 need --size", 1},
+        {"good.png -s 64x48 -o o.png", "good.png: --size is for raw frames; this file says", 1},
+        {"stream -o o.png", "stream: an H.264 or H.265 file; ffmpeg reads it", 1},
         {"good.nv21 -f i999999 -s 64x48 -o o.png", "unknown format 'i999999'; there are yuv400", 1},
         {"good.y4m -f nv12 -o o.png", "good.y4m: holds yuv420, not nv12", 1},
         {"good.png -t nv12 -o o.png", "png files hold RGB pictures, not nv12", 1},
@@ -116,7 +120,10 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.y4m -o o.y4m --rotate 45", "--rotate: 45 not in {90l,90r,180,hori,vert}", 2},
         {"good.y4m -o o.y4m --rotate 90l --thumbnail", "--rotate excludes --thumbnail", 2},
         {"testcard:64x48@0 -o o.png", "testcard:64x48@0: '0' is not a number of frames", 1},
-        {"good.y4m -o o.png --frames 0", "0 is not a number of frames from 1 on; leave it out", 2},
+        {"good.y4m -o o.png --frames 0", "0 is not a number from 1 on; leave it out", 2},
+        {"good.y4m -o o.png --columns 2", "--columns requires --sheet", 2},
+        {"good.y4m -o o.png --sheet --columns 0", "0 is not a number from 1 on", 2},
+        {"good.y4m -o o.png --demo o", "--demo excludes --output", 2},
         {"good.y4m", "--output is required", 2},
         {"--nonsense", "--nonsense", 2},
     };

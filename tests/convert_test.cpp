@@ -560,7 +560,7 @@ TEST_F(convert_test, colours_are_named_noted_and_guessed) {
         good("card.y4m -o noted.png -v");
         EXPECT_NE(got.err.find("96x64, " + name + "\n"), std::string::npos) << got.err;
         EXPECT_EQ(difference(png("noted.png"), png("card.png")), 0) << name;
-        good("card.y4m -o wrong.png --colour " + std::string(name == "bt709" ? "bt601" : "bt709"));
+        good("card.y4m -o wrong.png --color " + std::string(name == "bt709" ? "bt601" : "bt709"));
         EXPECT_GT(difference(png("wrong.png"), png("card.png")), 10) << name;
         good("card.y4m -o dithered.png --to rgb565 --dither");
         expect_bars(png("dithered.png"), 16, false, name + ", dithered");

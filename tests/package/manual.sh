@@ -33,6 +33,7 @@ for tool in $tools $player; do
 done
 case " $tools " in *" simgp-convert "*)
     [ "$(answers simgp-convert --rotate 90 | xargs)" = "90l 90r" ] || fault "The turns are not completed."
+    [ "$(answers simgp-convert --color bt709 | xargs)" = "bt709 bt709-full" ] || fault "The colours are not completed."
     [ "$(answers simgp-convert -t rgb | xargs)" = "rgb565 rgb888 rgba8888" ] || fault "The formats are not completed."
     [ "$(answers simgp-convert --format = nv | xargs)" = "nv12 nv21" ] || fault "--format=nv is not completed."
     touch "$scratch/some picture.png"
