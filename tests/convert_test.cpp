@@ -275,19 +275,24 @@ TEST_F(convert_test, several_frames_become_numbered_files_or_a_sheet) {
             expect_on(strip, 8 + k * (64 + 8), strip.height() - 8 - 48,
                       png("b" + std::to_string(k * every) + ".png"));
     }
-    // Large pictures are reduced to the means of squares, the last of which may be smaller.
-    good("testcard:650x100 -o large.png && $C testcard:650x100 -o reduced.png --sheet");
-    const picture large = png("large.png"), reduced = png("reduced.png");
-    ASSERT_EQ(reduced.width(), 650 / 3 + 16);
-    int wrong = 0;
-    for (int y = 0; y < 33; ++y)
-        for (int x = 0; x < 216; ++x)
-            for (int c = 0; c < 3; ++c) {
-                int sum = 0;
-                for (int k = 0; k < 9; ++k) sum += *large.sample(c, 3 * x + k % 3, 3 * y + k / 3);
-                wrong += *reduced.sample(c, 8 + x, reduced.height() - 8 - 33 + y) != (sum + 4) / 9;
-            }
-    EXPECT_EQ(wrong, 0);
+    // Wide and high pictures are reduced to the means of squares of 3 x 3, the last of which may be smaller.
+    for (const std::string card : {"testcard:650x100", "testcard:300x500"}) {
+        good(card + " -o large.png && $C " + card + " -o reduced.png --sheet");
+        const picture large = png("large.png"), reduced = png("reduced.png");
+        const int width = large.width() / 3, height = large.height() / 3;
+        ASSERT_EQ(reduced.width(), width + 16) << card;
+        int wrong = 0;
+        for (int y = 0; y < height; ++y)
+            for (int x = 0; x < width; ++x)
+                for (int c = 0; c < 3; ++c) {
+                    int sum = 0;
+                    for (int k = 0; k < 9; ++k)
+                        sum += *large.sample(c, 3 * x + k % 3, 3 * y + k / 3);
+                    wrong += *reduced.sample(c, 8 + x, reduced.height() - 8 - height + y) !=
+                             (sum + 4) / 9;
+                }
+        EXPECT_EQ(wrong, 0) << card;
+    }
 }
 
 // Where pixel (x, y) of a picture of w x h goes (simgp/rotate.h).
@@ -432,6 +437,11 @@ TEST_F(convert_test, one_pass_gives_what_several_give) {
     same("-f yuv422n -t yuv420 --rotate 90l", "yuv422n -> yuv420 144x192 (simgp_csc_rot 90l)\n",
          "-f yuv422n" + then + "192x144 --rotate 90l");
     same("--resize 192x144", "yuv420\n", "");
+    // What grows is resized as it came, what shrinks with all the chroma that it is to have.
+    same("-t rgb888 --resize 400x300", "yuv420 -> yuv420 400x300 (simgp_rsz) -> rgb888\n",
+         "-q --resize 400x300" + then + "400x300 -t rgb888");
+    same("-t rgb888 --resize 100x76", "yuv420 -> rgb888 -> rgb888 100x76 (simgp_rsz)\n",
+         "-o all.rgb888 && $C all.rgb888 -q --size 192x144 --resize 100x76");
     same("--rotate 90r --resize 144x192", "yuv420 -> yuv420 144x192 (simgp_rot 90r)\n",
          "--rotate 90r");
 }
