@@ -22,6 +22,11 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
     write("photo.jpg", "\xFF\xD8\xFF\xE0 JFIF");
     write("odd0.png", "P6 2 1 255 " + std::string(6, 'x'));
     write("odd1.png", "P6 4 1 255 " + std::string(12, 'x'));
+    write("word.ppm", "P6 4 x 255 ");
+    write("comment.ppm", "P6 4 # 4");
+    write("deep.ppm", "P6 4 4 65535 ");
+    write("zero.ppm", "P6 0 4 255 ");
+    write("cut.pgm", "P5 4 4 255 " + std::string(15, 'x'));
     const size_t second = y4m.find("FRAME", y4m.find("FRAME") + 5);
     write("lost.y4m", y4m.substr(0, second) + "x" + y4m.substr(second));
     auto header = [&](const std::string &name, const std::string &tags) {
@@ -67,6 +72,11 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.nv21 -f nv2l -s 64x48 -o o.png", "unknown format 'nv2l'; did you mean 'nv21'?", 1},
         {"odd%d.png -o o.y4m", "odd1.png: rgb888 4x1 among pictures of rgb888 2x1", 1},
         {"odd%d.ppm -o o.y4m", "odd1.ppm: No such file", 1},
+        {"word.ppm -o o.png", "word.ppm: byte 5: not a number in the PPM header", 1},
+        {"comment.ppm -o o.png", "comment.ppm: byte 8: the PPM header has no end", 1},
+        {"deep.ppm -o o.png", "deep.ppm: byte 13: PPM with values up to 65535; only", 1},
+        {"zero.ppm -o o.png", "zero.ppm: byte 2: PPM header: impossible size 0x4", 1},
+        {"cut.pgm -o o.png", "cut.pgm: byte 26: the input ends within the picture", 1},
         {"lost.y4m -o o.raw", "lost.y4m: frame 1, byte 4655: no FRAME line", 1},
         {"deep.y4m -o o.png", "deep.y4m: byte 16: colour space C420p10 has more than 8 bits", 1},
         {"tag.y4m -o o.png", "tag.y4m: byte 16: unknown tag 'Z7'", 1},

@@ -32,7 +32,7 @@ SOURCE = pathlib.Path(__file__).resolve().parent.parent
 
 # Which tests belong to which sources, the narrowest first: (names of files, test programs).
 TESTS = [
-    ("tools/probe.cpp tools/stream.* tools/h264.*", "probe"),
+    ("tools/probe.cpp tools/stream.* tools/h264.* tools/description.*", "probe"),
     ("tools/main.h tools/text.* tools/fault.h tools/progress.*", "convert probe"),
     ("tools/*", "convert"),
     ("simgp/vector/any*.h simgp/any.cpp simgp/csc_any.cpp rows/any.h", "csc_any"),
@@ -254,10 +254,20 @@ def tests_of(name):
     return first_match(TESTS, name)
 
 
+def place(fault, lines):
+    """Where the line of a fault is now, or None: the file may have changed since."""
+    number, before = fault["line"], fault["before"]
+    if lines[number:number + 1] == [before]:
+        return number
+    return lines.index(before) if lines.count(before) == 1 else None
+
+
 def show(fault):
-    name, number = fault["file"], fault["line"]
+    name = fault["file"]
     lines = (SOURCE / name).read_text().split("\n")
-    at = lines.index(fault["before"]) if lines[number:number + 1] != [fault["before"]] else number
+    at = place(fault, lines)
+    if at is None:
+        return f"{name}: no longer there: {fault['before'].strip()}"
     faulty = lines[:at] + [fault["after"]] + lines[at + 1:]
     return "\n".join(difflib.unified_diff(lines, faulty, name, name, n=2, lineterm=""))
 
@@ -276,11 +286,9 @@ def run_in(copy, fault):
     name, tests = fault["file"], tests_of(fault["file"])
     original = copy.cut(name, (SOURCE / name).read_bytes())
     lines = original.decode().split("\n")
-    number = fault["line"]
-    if lines[number:number + 1] != [fault["before"]]:  # the file has changed since
-        if lines.count(fault["before"]) != 1:
-            return "nothing"
-        number = lines.index(fault["before"])
+    number = place(fault, lines)
+    if number is None:
+        return "nothing"
     lines[number] = fault["after"]
     start = time.time() - 1
     copy.put(name, "\n".join(lines).encode())
