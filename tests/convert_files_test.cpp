@@ -102,6 +102,7 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.nv21 -s 65536x1 -o o.png", "--size: impossible size 65536x1", 1},
         {"good.nv21 -s 4294967297x4294967297 -o o.png",
          "--size: impossible size 4294967297x4294967297", 1},
+        {"good.nv21 -s 4294967297x48 -o o.png", "--size: impossible size 4294967297x48", 1},
         {"good.nv21 -s 64by48 -o o.png", "--size: '64by48' is not a size", 1},
         {"text -s 64x48 -o o.png", "text: raw frames need --format", 1},
         {"good.nv21 -f i999999 -s 64x48 -o o.png", "unknown format 'i999999'; there are yuv400", 1},
