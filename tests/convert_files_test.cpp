@@ -105,6 +105,7 @@ TEST_F(convert_test, bad_input_ends_in_one_clear_line_and_no_file) {
         {"good.nv21 -s 4294967297x48 -o o.png", "--size: impossible size 4294967297x48", 1},
         {"good.nv21 -s 64by48 -o o.png", "--size: '64by48' is not a size", 1},
         {"text -s 64x48 -o o.png", "text: raw frames need --format", 1},
+        {"good.nv21 -f xy12 -s 64x48 -o o.png", "unknown format 'xy12'; there are yuv400", 1},
         {"good.nv21 -f i999999 -s 64x48 -o o.png", "unknown format 'i999999'; there are yuv400", 1},
         {"good.y4m -f nv12 -o o.png", "good.y4m: holds yuv420, not nv12", 1},
         {"good.png -t nv12 -o o.png", "png files hold RGB pictures, not nv12", 1},
