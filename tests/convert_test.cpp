@@ -499,6 +499,11 @@ TEST_F(convert_test, thumbnails_are_every_second_pixel_turned_right) {
             }
         EXPECT_EQ(wrong, 0) << format;
     }
+    // Samples of several bytes take as many calls: pairs of U and V are taken apart before.
+    for (const std::string road : {"yuv420 -> yuv420 24x32", "nv12 -> yuv420 -> yuv420 24x32"}) {
+        good("testcard:64x48 -v -o road.png --thumbnail -f " + road.substr(0, road.find(' ')));
+        EXPECT_NE(got.err.find("\n" + road + " ("), std::string::npos) << got.err;
+    }
 }
 
 // What Y4M says of its pictures stays true; the format is one that loses nothing.
