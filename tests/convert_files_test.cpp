@@ -68,6 +68,11 @@ TEST_F(refusal_test, bad_files) {
         {frame("H4"), "byte 0: the Y4M header lacks W"},
         {frame("W4x H4"), "byte 10: '4x' is not a number"},
         {frame("W H4"), "byte 10: '' is not a number"},
+        {"P6 4 x 255 ", "byte 5: not a number in the PPM header"},
+        {"P6 4 # 4", "byte 8: the PPM header has no end"},
+        {"P6 4 4 65535 ", "byte 13: PPM with values up to 65535; only"},
+        {"P6 0 4 255 ", "byte 2: PPM header: impossible size 0x4"},
+        {"P5 4 4 255 " + std::string(15, 'x'), "byte 26: the input ends within the picture"},
     };
     for (const auto &c : cases) {
         write("in", c.bytes);
@@ -86,11 +91,13 @@ TEST_F(refusal_test, wishes_that_cannot_be_met) {
     refuse("good.nv21 -s 0x48 -o o.png", "--size: impossible size 0x48");
     refuse("good.nv21 -s 65536x1 -o o.png", "--size: impossible size 65536x1");
     refuse("good.nv21 -s 4294967297x1 -o o.png", "--size: impossible size 4294967297x1");
+    refuse("good.nv21 -s 4294967297x48 -o o.png", "--size: impossible size 4294967297x48");
     refuse("good.nv21 -s 64by48 -o o.png", "--size: '64by48' is not a size");
     refuse("good.png -s 64x48 -o o.png", "good.png: --size is for raw frames; this file says");
     refuse("testcard:64x48@0 -o o.png", "testcard:64x48@0: '0' is not a number of frames");
     refuse("good.nv21 -f nv2l -s 64x48 -o o.png", "format 'nv2l'; did you mean 'nv21'?");
     refuse("good.nv21 -f i999999 -s 64x48 -o o.png", "format 'i999999'; there are yuv400");
+    refuse("good.nv21 -f xy12 -s 64x48 -o o.png", "format 'xy12'; there are yuv400");
     refuse("good.y4m -f nv12 -o o.png", "good.y4m: holds yuv420, not nv12");
     refuse("good.png -f yuv420 -o o.raw", "good.png: a PNG picture comes as rgb888 or rgba8888");
     refuse("good.png -t nv12 -o o.png", "png files hold RGB pictures, not nv12");

@@ -1,7 +1,10 @@
 // simgp-convert as its users meet it: the program is run on files and pipes in a folder of its own.
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <stdlib.h>
 #include <string.h>
+#include <sys/ioctl.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <array>
@@ -12,6 +15,7 @@
 #include "tests/convert_program.h"
 #include "tools/colour.h"
 #include "tools/picture.h"
+#include "tools/progress.h"
 #include "tools/road.h"
 
 namespace {
@@ -111,16 +115,17 @@ TEST_F(convert_test, raw_files_of_every_format_come_back_at_every_size) {
 
 // What the two matrices allow: a PNG goes to every YUV format and comes back. The picture has soft
 // colours, of which subsampling takes little, and odd sizes, so that the last column and line need
-// chroma of their own; at a height of 65 that line is more than the chroma tiles hold.
+// chroma of their own; at a height of 65 that line is more than the chroma tiles hold, which lie
+// otherwise if there is one more row of them, from a third tile column on.
 TEST_F(convert_test, pictures_go_into_every_yuv_format_and_come_back) {
-    constexpr int width = 75;
+    constexpr int width = 139;
     for (int height : {67, 65}) {
-        const std::string size = "75x" + std::to_string(height);
+        const std::string size = std::to_string(width) + "x" + std::to_string(height);
         picture soft({&tools::format_named("rgb888"), width, height});
         std::string bytes;
         for (int y = 0; y < height; ++y) {
             for (int x = 0; x < width; ++x) {
-                *soft.sample(0, x, y) = uint8_t(60 + x * 2);
+                *soft.sample(0, x, y) = uint8_t(60 + x);
                 *soft.sample(1, x, y) = uint8_t(200 - y);
                 *soft.sample(2, x, y) = uint8_t(90 + x / 2 + y / 2);
             }
@@ -511,6 +516,11 @@ TEST_F(convert_test, thumbnails_are_every_second_pixel_turned_right) {
             }
         EXPECT_EQ(wrong, 0) << format;
     }
+    // Samples of several bytes take as many calls: pairs of U and V are taken apart before.
+    for (const std::string road : {"yuv420 -> yuv420 24x32", "nv12 -> yuv420 -> yuv420 24x32"}) {
+        good("testcard:64x48 -v -o road.png --thumbnail -f " + road.substr(0, road.find(' ')));
+        EXPECT_NE(got.err.find("\n" + road + " ("), std::string::npos) << got.err;
+    }
 }
 
 // What Y4M says of its pictures stays true; the format is one that loses nothing.
@@ -626,6 +636,38 @@ TEST_F(convert_test, the_list_names_formats_colours_and_dithered_conversions) {
     // What it says of all others.
     good("testcard:64x48 -f bgr565 -o one.uyvy -v");
     EXPECT_NE(got.err.find("bgr565 -> uyvy\n"), std::string::npos) << got.err;
+}
+
+// Nothing in the first half second, and not twice at once; a bar that fills the line but for its last
+// place, half of it done.
+TEST(progress, is_a_bar_as_wide_as_the_terminal) {
+    const int terminal = posix_openpt(O_RDWR | O_NOCTTY);
+    ASSERT_TRUE(terminal >= 0 && grantpt(terminal) == 0 && unlockpt(terminal) == 0);
+    const int line = open(ptsname(terminal), O_RDWR | O_NOCTTY), kept = dup(STDERR_FILENO);
+    const winsize size = {.ws_row = 24, .ws_col = 40, .ws_xpixel = 0, .ws_ypixel = 0};
+    ASSERT_EQ(ioctl(line, TIOCSWINSZ, &size), 0);
+    dup2(line, STDERR_FILENO);
+    {
+        tools::progress bar(true);
+        bar.show(1, 0.1);
+        usleep(600'000);
+        bar.show(10, 0.5);
+        bar.show(11, 0.6);
+    }
+    dup2(kept, STDERR_FILENO);
+    char said[256] = {};
+    ASSERT_GT(read(terminal, said, sizeof said - 1), 0);
+    for (int descriptor : {terminal, line, kept}) close(descriptor);
+    const std::string text = said, end = "/s\033[K\r\033[K";
+    const auto count = [&](char c) { return std::count(text.begin(), text.end(), c); };
+    const size_t bar_end = text.find("]  50%  10 frames  ");
+    ASSERT_NE(bar_end, std::string::npos) << text;
+    EXPECT_EQ(text.substr(0, 2), "\r[");
+    EXPECT_EQ(text.substr(2, bar_end - 2), std::string(size_t(count('#')), '#') +
+                                               std::string(bar_end - 2 - size_t(count('#')), '.'));
+    EXPECT_EQ(count('#'), (bar_end - 2) / 2);
+    EXPECT_EQ(text.size(), 1 + 39 + end.size() - 2) << text;
+    EXPECT_EQ(text.substr(text.size() - end.size()), end);
 }
 
 }  // namespace
