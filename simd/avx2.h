@@ -542,6 +542,10 @@ inline u8v even_dwords(u8v a, u8v b) {
     return _mm256_castps_si256(
         _mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), 0x88));
 }
+template <class... Bytes>
+inline u8v set_blocks(Bytes... of) {
+    return _mm256_broadcastsi128_si256(_mm_setr_epi8(static_cast<char>(of)...));
+}
 inline u8v unpack_order(u8v v) {
     return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
 }

@@ -576,6 +576,10 @@ inline u8v even_dwords(u8v a, u8v b) {
     return _mm512_castps_si512(
         _mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), 0x88));
 }
+template <class... Bytes>
+inline u8v set_blocks(Bytes... of) {
+    return _mm512_broadcast_i32x4(_mm_setr_epi8(static_cast<char>(of)...));
+}
 inline u8v unpack_order(u8v v) {
     return _mm512_permutexvar_epi32(
         _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15), v);

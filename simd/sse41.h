@@ -465,6 +465,10 @@ inline u8v pack_bytes(s16v a, s16v b) { return _mm_packs_epi16(a, b); }
 inline u8v even_dwords(u8v a, u8v b) {
     return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), 0x88));
 }
+template <class... Bytes>
+inline u8v set_blocks(Bytes... of) {
+    return _mm_setr_epi8(static_cast<char>(of)...);
+}
 inline u8v unpack_order(u8v v) { return v; }
 
 }  // namespace simgp::sse41

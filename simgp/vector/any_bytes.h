@@ -169,9 +169,11 @@ static void any_split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t
     in_steps<bytes / 2>(
         pairs,
         [&](ptrdiff_t i) {
-            const pair_u8 p = load_split_natural(src + 4 * i);
-            store(y + 2 * i, luma_first ? p.even : p.odd);
-            store_split(u + i, v + i, luma_first ? p.odd : p.even);
+            const pairs_v p = load_pairs(src + 4 * i);
+            u8v luma = evens(p), chroma = odds(p);
+            if (!luma_first) luma = odds(p), chroma = evens(p);
+            store(y + 2 * i, luma);
+            store_split(u + i, v + i, chroma);
         },
         [&](ptrdiff_t i) {
             const uint8_t *const luma = src + 4 * i + !luma_first;
@@ -202,36 +204,41 @@ static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v
         });
 }
 
-template <bool LumaFirst, bool Pairs>
-static void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
-                          uint8_t *u, uint8_t *v, ptrdiff_t pairs) {
+template <bool LumaFirst>
+static void groups_to_planes(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                             uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool mean) {
+    const auto luma = [](const pairs_v &p) { return LumaFirst ? evens(p) : odds(p); };
+    const auto chroma = [](const pairs_v &p) { return LumaFirst ? odds(p) : evens(p); };
     in_steps<bytes / 2>(
         pairs,
         [&](ptrdiff_t i) {
-            const pair_u8 p = load_split(src0 + 4 * i);
-            const pair_u8 q = load_split(src1 + 4 * i);
-            const u8v chroma = by8_to_natural(LumaFirst ? p.odd : p.even);
-            store(y0 + 2 * i, by8_to_natural(LumaFirst ? p.even : p.odd));
-            store(y1 + 2 * i, by8_to_natural(LumaFirst ? q.even : q.odd));
-            if constexpr (Pairs)
-                store(u + 2 * i, chroma);
+            const pairs_v p = load_pairs(src0 + 4 * i), q = load_pairs(src1 + 4 * i);
+            store(y0 + 2 * i, luma(p));
+            store(y1 + 2 * i, luma(q));
+            const u8v of_both = chroma(mean ? avg_u8(p, q) : p);
+            if (v)
+                store_split(u + i, v + i, of_both);
             else
-                store_split(u + i, v + i, chroma);
+                store(u + 2 * i, of_both);
         },
         [&](ptrdiff_t i) {
-            constexpr int luma = LumaFirst ? 0 : 1, chroma = 1 - luma;
+            constexpr int of_luma = LumaFirst ? 0 : 1, of_chroma = 1 - of_luma;
             for (int k = 0; k < 2; k++) {
-                y0[2 * i + k] = src0[4 * i + 2 * k + luma];
-                y1[2 * i + k] = src1[4 * i + 2 * k + luma];
-                *(Pairs ? u + 2 * i + k : k ? v + i : u + i) = src0[4 * i + 2 * k + chroma];
+                const uint8_t *const p = src0 + 4 * i + 2 * k, *const q = src1 + 4 * i + 2 * k;
+                y0[2 * i + k] = p[of_luma];
+                y1[2 * i + k] = q[of_luma];
+                *(!v  ? u + 2 * i + k
+                  : k ? v + i
+                      : u + i) = static_cast<uint8_t>(mean ? (p[of_chroma] + q[of_chroma] + 1) >> 1
+                                                           : p[of_chroma]);
             }
         });
 }
-template <bool Pairs>
-static void any_groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
-                              uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool luma_first) {
-    (luma_first ? groups_to_420<true, Pairs> : groups_to_420<false, Pairs>)(src0, src1, y0, y1, u,
-                                                                            v, pairs);
+static void any_groups_to_planes(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
+                                 uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool luma_first,
+                                 bool mean) {
+    (luma_first ? groups_to_planes<true> : groups_to_planes<false>)(src0, src1, y0, y1, u, v, pairs,
+                                                                    mean);
 }
 
 static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
@@ -239,28 +246,9 @@ static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, 
         count, [&](ptrdiff_t x) { store(dst + x, avg_u8(load(a + x), load(b + x))); },
         [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[x] + b[x] + 1) >> 1); });
 }
-static void any_mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
-    in_steps(
-        count,
-        [&](ptrdiff_t x) {
-            const pair_u8 p = load_split_natural(a + 2 * x);
-            store(dst + x, avg_u8(p.even, p.odd));
-        },
-        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[2 * x] + a[2 * x + 1] + 1) >> 1); });
-}
 static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    const s16v two = as_s16(set_u16(2));
     in_steps(
-        count,
-        [&](ptrdiff_t x) {
-            const auto sums = [&](ptrdiff_t at) {
-                const u8v of_a = load(a + at), of_b = load(b + at);
-                const s16v of_even = add(as_s16(even(of_a)), as_s16(even(of_b)));
-                const s16v of_odd = add(as_s16(odd(of_a)), as_s16(odd(of_b)));
-                return sar<2>(add(add(of_even, of_odd), two));
-            };
-            store(dst + x, by8_to_natural(narrow(sums(2 * x), sums(2 * x + bytes))));
-        },
+        count, [&](ptrdiff_t x) { store(dst + x, load_block_means(a + 2 * x, b + 2 * x)); },
         [&](ptrdiff_t x) {
             const int sum = a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1];
             dst[x] = static_cast<uint8_t>((sum + 2) >> 2);
@@ -270,7 +258,7 @@ static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst,
 // What follows the last sample may lie behind the line.
 static void any_every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
     in_steps(
-        count - 1, [&](ptrdiff_t x) { store(dst + x, load_split_natural(a + 2 * x).even); },
+        count - 1, [&](ptrdiff_t x) { store(dst + x, evens(load_pairs(a + 2 * x))); },
         [&](ptrdiff_t x) { dst[x] = a[2 * x]; });
     dst[count - 1] = a[2 * (count - 1)];
 }
