@@ -74,12 +74,13 @@ CALL(call_any_to_means, any_to_yuv_row, to_yuv_means, a, a + second, d, d + seco
 CALL(call_chroma, chroma_row, to_yuv_how, channels_in, d, e, n)
 CALL(call_split_pixels, split_pixels_row, a, channels, n)
 CALL(call_repack, repack_row, order, a, d, n)
-CALL(call_split_groups, split_groups_row, a, d, e, f, n, true)
 CALL(call_join_groups, join_groups_row, a, b, c, d, n, true)
-CALL(call_to_planes, groups_to_planes_row, a, a + second, d, d + second, e, f, n, true, false)
-CALL(call_to_pairs, groups_to_planes_row, a, a + second, d, d + second, e, nullptr, n, true, false)
-CALL(call_to_means, groups_to_planes_row, a, a + second, d, d + second, e, nullptr, n, true, true)
+CALL(call_split_groups, split_groups_row, a, nullptr, d, e, f, n, true)
+CALL(call_split_luma, split_groups_row, a, nullptr, d, nullptr, nullptr, n, true)
+CALL(call_split_to_pairs, split_groups_row, a, nullptr, d, e, nullptr, n, true)
+CALL(call_split_means, split_groups_row, a, b, d, e, f, n, true)
 CALL(call_mean, mean_row, a, b, d, n)
+CALL(call_mean_of_blocks, mean_of_blocks_rows, a, b, 0, d, 0, n, 1)
 CALL(call_resample, resample_row, a, d, n)
 CALL(call_detile, detile_rows, a, d, 256, n)
 CALL(call_entile, entile_rows, a, 256, d, n)
@@ -187,12 +188,12 @@ void list_any(const any_rows &n, const any_rows &s) {
             call_split_pixels);
     add("any chroma", n.chroma, s.chroma, call_chroma);
     add("any split groups", n.split_groups, s.split_groups, call_split_groups, 2);
+    add("any split groups, luma alone", n.split_groups, s.split_groups, call_split_luma, 2);
+    add("any split groups, pairs", n.split_groups, s.split_groups, call_split_to_pairs, 2);
+    add("any split groups, means", n.split_groups, s.split_groups, call_split_means, 2);
     add("any join groups", n.join_groups, s.join_groups, call_join_groups, 2);
-    add("any groups to planes, two", n.groups_to_planes, s.groups_to_planes, call_to_planes, 4);
-    add("any groups to pairs, two", n.groups_to_planes, s.groups_to_planes, call_to_pairs, 4);
-    add("any groups to means, two", n.groups_to_planes, s.groups_to_planes, call_to_means, 4);
     add("any mean of lines", n.mean_of_lines, s.mean_of_lines, call_mean);
-    add("any mean of blocks", n.mean_of_blocks, s.mean_of_blocks, call_mean);
+    add("any mean of blocks", n.mean_of_blocks, s.mean_of_blocks, call_mean_of_blocks);
     add("any every second", n.every_second, s.every_second, call_resample);
     add("any twice", n.twice, s.twice, call_resample);
 }

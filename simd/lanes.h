@@ -439,17 +439,16 @@ inline pair_u8 load_split(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by8(v.even), natural_to_by8(v.odd)};
 }
+// load_split, or the same with even and odd exchanged.
+using split_moves = bool;
+inline split_moves set_split_moves(bool exchange) { return exchange; }
+inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
+    const pair_u8 v = load_split(p);
+    return exchange ? pair_u8{v.odd, v.even} : v;
+}
 inline pair_u8 load_split_by4(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by4(v.even), natural_to_by4(v.odd)};
-}
-// The same, not split yet: each half in natural order, and the mean of two, as that of bytes.
-using pairs_v = pair_u8;
-inline pairs_v load_pairs(const uint8_t *p) { return load_split_natural(p); }
-inline u8v evens(pairs_v v) { return v.even; }
-inline u8v odds(pairs_v v) { return v.odd; }
-inline pairs_v avg_u8(pairs_v a, pairs_v b) {
-    return {avg_u8(a.even, b.even), avg_u8(a.odd, b.odd)};
 }
 // The rounded means of blocks of four in two lines of twice `bytes` bytes, (sum + 2) >> 2.
 inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {

@@ -264,6 +264,13 @@ inline pair_u8 load_split(const uint8_t *p) {
     const uint8x16x2_t v = vld2q_u8(p);
     return {v.val[0], v.val[1]};
 }
+// All bits, or none.
+using split_moves = u8v;
+inline split_moves set_split_moves(bool exchange) { return set_u8(exchange ? 255 : 0); }
+inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
+    const pair_u8 v = load_split(p);
+    return {vbslq_u8(exchange, v.odd, v.even), vbslq_u8(exchange, v.even, v.odd)};
+}
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     const uint8x8x2_t split = vuzp_u8(vget_low_u8(v), vget_high_u8(v));
     vst1_u8(p, split.val[0]);
@@ -272,13 +279,6 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
 
-using pairs_v = pair_u8;
-inline pairs_v load_pairs(const uint8_t *p) { return load_split(p); }
-inline u8v evens(const pairs_v &v) { return v.even; }
-inline u8v odds(const pairs_v &v) { return v.odd; }
-inline pairs_v avg_u8(const pairs_v &a, const pairs_v &b) {
-    return {avg_u8(a.even, b.even), avg_u8(a.odd, b.odd)};
-}
 inline u16v sums_of_four(u8v a, u8v b) { return vpadalq_u8(vpaddlq_u8(a), b); }
 inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
     return vcombine_u8(vrshrn_n_u16(sums_of_four(load(a), load(b)), 2),

@@ -4,8 +4,7 @@
 // Besides the vocabulary, a layer gives
 //   add_pairs(a, b)      16-bit lanes: the sums of two neighbours each, of a and of b, block by block
 //   pack_bytes(a, b)     signed 16-bit lanes to bytes, block by block
-//   even_dwords(a, b)    dwords 0 and 2 of each block of a, then of b
-//   set_blocks(...)      a constant block, over and over
+//   even_dwords(a, b)    dwords 0 and 2 of each block of a, then of b; odd_dwords 1 and 3
 //   unpack_order(v)      what two steps of packing leave, put in order: granule k of block j belongs to
 //                        vector k
 #ifndef SIMD_X86_H
@@ -52,16 +51,6 @@ inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, 
 inline u16v sums_of_pairs(u8v v) { return dot_pairs(v, set_u8(1)); }
 inline u16v quarter(u16v v) { return mul_round(v, set_u16(8192)); }
 
-// What two loads give.
-struct pairs_v {
-    u8v v[2];
-};
-inline pairs_v load_pairs(const uint8_t *p) { return {{load(p), load(p + bytes)}}; }
-inline u8v evens(const pairs_v &p) { return by8_to_natural(narrow(even(p.v[0]), even(p.v[1]))); }
-inline u8v odds(const pairs_v &p) { return by8_to_natural(narrow(odd(p.v[0]), odd(p.v[1]))); }
-inline pairs_v avg_u8(const pairs_v &a, const pairs_v &b) {
-    return {{avg_u8(a.v[0], b.v[0]), avg_u8(a.v[1], b.v[1])}};
-}
 inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
     const auto means = [&](int at) {
         return quarter(add(sums_of_pairs(load(a + at)), sums_of_pairs(load(b + at))));
@@ -125,14 +114,12 @@ struct half_quads_v {
 inline half_quads_v even_quads(const quads_v &v) {
     return {even_dwords(v.v[0], v.v[1]), even_dwords(v.v[2], v.v[3])};
 }
-// The channels of two neighbours are brought together for the multiply-add, which sums them up.
 inline half_quads_v block_means(const quads_v &a, const quads_v &b) {
-    const u8v together = set_blocks(0, 4, 1, 5, 2, 6, 3, 7, 8, 12, 9, 13, 10, 14, 11, 15);
     const auto means = [&](int k) {
-        return quarter(add(sums_of_pairs(shuffle(a.v[k], together)),
-                           sums_of_pairs(shuffle(b.v[k], together))));
+        return mean_of_four(even_dwords(a.v[k], a.v[k + 1]), odd_dwords(a.v[k], a.v[k + 1]),
+                            even_dwords(b.v[k], b.v[k + 1]), odd_dwords(b.v[k], b.v[k + 1]));
     };
-    return {narrow(means(0), means(1)), narrow(means(2), means(3))};
+    return {means(0), means(2)};
 }
 inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
     const auto dot = [&](u8v k) {

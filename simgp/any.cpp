@@ -146,14 +146,18 @@ void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t 
     }
 }
 
-void split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
-                  bool luma_first) {
+void split_groups(const uint8_t *src, const uint8_t *other, uint8_t *y, uint8_t *u, uint8_t *v,
+                  ptrdiff_t pairs, bool luma_first) {
     const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
+    const auto sample = [=](ptrdiff_t at) {
+        return other ? uint8_t((src[at] + other[at] + 1) >> 1) : src[at];
+    };
     for (ptrdiff_t i = 0; i < pairs; i++) {
         y[2 * i] = src[4 * i + luma];
         y[2 * i + 1] = src[4 * i + luma + 2];
-        u[i] = src[4 * i + of_u];
-        v[i] = src[4 * i + of_u + 2];
+        if (!u) continue;
+        u[v ? i : 2 * i] = sample(4 * i + of_u);
+        (v ? v[i] : u[2 * i + 1]) = sample(4 * i + of_u + 2);
     }
 }
 void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
@@ -167,28 +171,17 @@ void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *
     }
 }
 
-void groups_to_planes(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
-                      uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool luma_first, bool mean) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    for (ptrdiff_t x = 0; x < 2 * pairs; x++) {
-        y0[x] = src0[2 * x + luma];
-        y1[x] = src1[2 * x + luma];
-    }
-    const auto sample = [=](ptrdiff_t at) {
-        return uint8_t(mean ? (src0[at] + src1[at] + 1) >> 1 : src0[at]);
-    };
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        u[v ? i : 2 * i] = sample(4 * i + of_u);
-        (v ? v[i] : u[2 * i + 1]) = sample(4 * i + of_u + 2);
-    }
-}
-
 void mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[x] + b[x] + 1) >> 1);
 }
-void mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++)
-        dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1] + 2) >> 2);
+void mean_of_blocks(const uint8_t *a, const uint8_t *b, ptrdiff_t step, uint8_t *dst,
+                    ptrdiff_t dst_step, ptrdiff_t count, ptrdiff_t rows) {
+    for (ptrdiff_t y = 0; y < rows; y++) {
+        const uint8_t *const p = a + y * step, *const q = b + y * step;
+        for (ptrdiff_t x = 0; x < count; x++)
+            dst[y * dst_step + x] =
+                uint8_t((p[2 * x] + p[2 * x + 1] + q[2 * x] + q[2 * x + 1] + 2) >> 2);
+    }
 }
 void every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) dst[x] = a[2 * x];
@@ -233,7 +226,6 @@ void fill_any(any_rows &t) {
     t.chroma = chroma;
     t.split_groups = split_groups;
     t.join_groups = join_groups;
-    t.groups_to_planes = groups_to_planes;
     t.mean_of_lines = mean_of_lines;
     t.mean_of_blocks = mean_of_blocks;
     t.every_second = every_second;

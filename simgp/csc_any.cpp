@@ -119,7 +119,7 @@ void read_groups(const job &j, const strip_rows &b, yuv_strip &s) {
     for (ptrdiff_t r = 0; r < b.rows; r++) {
         const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x;
         const ptrdiff_t whole = b.width / 2;
-        if (whole) j.rows.split_groups(src, s.y[r], s.u[r], s.v[r], whole, luma_first);
+        if (whole) j.rows.split_groups(src, nullptr, s.y[r], s.u[r], s.v[r], whole, luma_first);
         if (!(b.width & 1)) continue;
         // The V of a half group would lie behind the line.
         const uint8_t *const group = src + 4 * whole;
@@ -186,6 +186,17 @@ planar_band read_band(const job &j, const strip_rows &b, yuv_strip &s) {
 // YUV destinations
 // ------------------------------------------------------------------------------------------
 
+// The means of blocks of four in `rows` lines of a and of b, which may be the same, of `width` pixels
+// each. In both, lines are `step` bytes apart.
+void means_of_blocks(const job &j, const uint8_t *a, const uint8_t *b, ptrdiff_t step,
+                     const lines &dst, ptrdiff_t width, ptrdiff_t rows) {
+    const ptrdiff_t whole = width / 2, last = width - 1;
+    if (whole) j.rows.mean_of_blocks(a, b, step, dst.first, dst.stride, whole, rows);
+    if (width & 1)
+        for (ptrdiff_t y = 0; y < rows; y++)
+            dst.line(y)[whole] = uint8_t((a[y * step + last] + b[y * step + last] + 1) >> 1);
+}
+
 // A line of chroma of the destination, for `width` pixels, from one or two lines (b may be null) of
 // the source. Averages the lines if there are two, and drops or repeats or averages samples. The
 // result lies in the source or in `room`.
@@ -205,10 +216,7 @@ const uint8_t *chroma_line(const job &j, bool from_across, bool to_across, const
     } else if (!j.mean) {
         j.rows.every_second(a, room, count);
     } else {
-        const ptrdiff_t whole = width / 2;
-        if (whole) j.rows.mean_of_blocks(a, b ? b : a, room, whole);
-        if (whole < count)  // of the last pixels across
-            room[whole] = b ? uint8_t((a[width - 1] + b[width - 1] + 1) >> 1) : a[width - 1];
+        means_of_blocks(j, a, b ? b : a, 0, lines{room, 0}, width, 1);
     }
     return room;
 }
@@ -292,21 +300,21 @@ void groups_to_420(const job &j) {
     const const_lines in = j.in(0);
     const lines luma = j.out(0), of_u = j.out(j.to.u), of_v = j.out(j.to.v);
     const ptrdiff_t whole = j.width & ~ptrdiff_t(1);
-    for (ptrdiff_t line = 0; line < j.height; line += 2) {
-        // A last row alone is done twice.
-        const ptrdiff_t below = line + 1 < j.height ? line + 1 : line;
-        uint8_t *const u = of_u.line(line >> 1), *const v = of_v.line(line >> 1) + pairs;
+    for (ptrdiff_t y = 0; y < j.height; y++) {
+        // Chroma comes with the first line of two, or, as a mean, with the second.
+        const bool gives = y & 1 ? j.mean : !j.mean || y + 1 == j.height;
+        const uint8_t *const line = in.line(y), *const other = y & 1 ? in.line(y - 1) : nullptr;
+        uint8_t *const u = gives ? of_u.line(y >> 1) : nullptr;
+        uint8_t *const v = gives ? of_v.line(y >> 1) + pairs : nullptr;
         if (whole)
-            j.rows.groups_to_planes(in.line(line), in.line(below), luma.line(line),
-                                    luma.line(below), u, pairs ? nullptr : v, whole / 2, luma_first,
-                                    j.mean);
+            j.rows.split_groups(line, other, luma.line(y), u, pairs ? nullptr : v, whole / 2,
+                                luma_first);
         if (whole == j.width) continue;
-        const uint8_t *const last = in.line(line) + 2 * whole;
-        const uint8_t *const last_below = in.line(below) + 2 * whole;
-        luma.line(line)[whole] = last[!luma_first];
-        luma.line(below)[whole] = last_below[!luma_first];
+        const uint8_t *const last = line + 2 * whole;
+        luma.line(y)[whole] = last[!luma_first];
+        if (!gives) continue;
         const auto sample = [&](int at) {
-            return uint8_t(j.mean ? (last[at] + last_below[at] + 1) >> 1 : last[at]);
+            return other ? uint8_t((last[at] + other[2 * whole + at] + 1) >> 1) : last[at];
         };
         const ptrdiff_t at = pairs ? whole : whole / 2;
         u[at] = sample(luma_first);
@@ -321,14 +329,21 @@ bool has_planes_alone(const format &f) {
 void planes_to_planes(const job &j) {
     copy_lines(j.in(0), j.out(0), j.width, j.height);
     const sharing from = sharing_of(j.from), to = sharing_of(j.to);
+    const bool across = j.mean && to.across && !from.across, down = j.mean && to.down && !from.down;
     const ptrdiff_t count = (j.width + to.across) >> to.across;
     const auto plane = [&](const const_lines &in, const lines &out) {
-        for (ptrdiff_t y = 0; y < j.height; y += 1 + to.down) {
-            const bool two = j.mean && to.down && !from.down && y + 1 < j.height;
+        ptrdiff_t y = 0;  // with means of blocks, a last line may remain
+        const ptrdiff_t rows = down ? j.height >> 1 : (j.height + to.down) >> to.down;
+        if (across && rows && (to.down || !from.down)) {
+            means_of_blocks(j, in.first, in.line(down), in.stride * (1 + down), out, j.width, rows);
+            y = rows << to.down;
+        }
+        for (; y < j.height; y += 1 + to.down) {
             uint8_t *const dst = out.line(y >> to.down);
-            copy_line(chroma_line(j, from.across, to.across, in.line(y >> from.down),
-                                  two ? in.line(y + 1) : nullptr, dst, j.width),
-                      dst, count);
+            copy_line(
+                chroma_line(j, from.across, to.across, in.line(y >> from.down),
+                            down && y + 1 < j.height ? in.line(y + 1) : nullptr, dst, j.width),
+                dst, count);
         }
     };
     plane(j.in(j.from.u), j.out(j.to.u));

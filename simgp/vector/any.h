@@ -341,9 +341,9 @@ inline auto load_pixels(const uint8_t *p) {
     if (v) copy_few(v + x / 2, to_v, samples);
 }
 
-template <pixel_kind Kind>
-static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+template <pixel_kind Kind, bool Mean>
+static void any_yuv_row_of(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
+                           uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     constexpr int size = int(Kind) + 2;
     const any_yuv_matrix<Kind> m(w);
     row_of_steps<true>(
@@ -351,53 +351,62 @@ static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t
         [&](ptrdiff_t x, ptrdiff_t) {
             const auto p = load_pixels<Kind>(src0 + size * x);
             store(y0 + x, m.luma(p));
+            const auto put_chroma = [&](const auto &pixels) {
+                const u8v chroma = m.chroma(pixels);
+                if (v)
+                    store_split(u + x / 2, v + x / 2, chroma);
+                else
+                    store(u + x, chroma);
+            };
+            if (!Mean && u) put_chroma(m.even_pixels(p));
             auto below = p;
             if (src1) {
                 below = load_pixels<Kind>(src1 + size * x);
                 store(y1 + x, m.luma(below));
             }
-            if (!u) return;
-            const u8v chroma = m.chroma(w.mean ? block_means(p, below) : m.even_pixels(p));
-            if (v)
-                store_split(u + x / 2, v + x / 2, chroma);
-            else
-                store(u + x, chroma);
+            if (Mean) put_chroma(block_means(p, below));
         },
         [&](ptrdiff_t x, int count) {
-            any_yuv_part(any_yuv_row<Kind>, size, w, src0, src1, y0, y1, u, v, x, count);
+            any_yuv_part(any_yuv_row_of<Kind, Mean>, size, w, src0, src1, y0, y1, u, v, x, count);
         });
 }
+template <pixel_kind Kind>
+static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    (w.mean && u ? any_yuv_row_of<Kind, true> : any_yuv_row_of<Kind, false>)(w, src0, src1, y0, y1,
+                                                                             u, v, width);
+}
 
+[[gnu::noinline]] static void chroma_plane(const int16_t *of, const uint8_t *const channels[3],
+                                           uint8_t *dst, ptrdiff_t count) {
+    u16v f[3];
+    for (int k = 0; k < 3; k++) f[k] = set_u16(static_cast<uint16_t>(of[k]));
+    const s16v half = as_s16(set_u16(128));
+    const u8v sign = set_u8(128);
+    in_steps(
+        count,
+        [&](ptrdiff_t x) {
+            const u8v c[3] = {load(channels[0] + x), load(channels[1] + x), load(channels[2] + x)};
+            const auto high = [&](u16v c0, u16v c1, u16v c2) {
+                const s16v sum =
+                    add(add(as_s16(mul(c0, f[0])), as_s16(mul(c1, f[1]))), as_s16(mul(c2, f[2])));
+                return as_u16(add_sat(sum, half));
+            };
+            store(dst + x, bit_xor(join_high(high(even(c[0]), even(c[1]), even(c[2])),
+                                             high(odd(c[0]), odd(c[1]), odd(c[2]))),
+                                   sign));
+        },
+        [&](ptrdiff_t x) {
+            const int sum =
+                (of[0] * channels[0][x] + of[1] * channels[1][x] + of[2] * channels[2][x] + 128) >>
+                8;
+            dst[x] = static_cast<uint8_t>(sum > 127 ? 255 : sum + 128);
+        });
+}
 static void any_chroma_row(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
                            uint8_t *v, ptrdiff_t count) {
-    const auto plane = [&](const int16_t(&of)[3], uint8_t *dst) {
-        u16v f[3];
-        for (int k = 0; k < 3; k++) f[k] = set_u16(static_cast<uint16_t>(of[k]));
-        const s16v half = as_s16(set_u16(128));
-        const u8v sign = set_u8(128);
-        in_steps(
-            count,
-            [&](ptrdiff_t x) {
-                const u8v c[3] = {load(channels[0] + x), load(channels[1] + x),
-                                  load(channels[2] + x)};
-                const auto high = [&](u16v c0, u16v c1, u16v c2) {
-                    const s16v sum = add(add(as_s16(mul(c0, f[0])), as_s16(mul(c1, f[1]))),
-                                         as_s16(mul(c2, f[2])));
-                    return as_u16(add_sat(sum, half));
-                };
-                store(dst + x, bit_xor(join_high(high(even(c[0]), even(c[1]), even(c[2])),
-                                                 high(odd(c[0]), odd(c[1]), odd(c[2]))),
-                                       sign));
-            },
-            [&](ptrdiff_t x) {
-                const int sum = (of[0] * channels[0][x] + of[1] * channels[1][x] +
-                                 of[2] * channels[2][x] + 128) >>
-                                8;
-                dst[x] = static_cast<uint8_t>(sum > 127 ? 255 : sum + 128);
-            });
-    };
-    plane(w.u, u);
-    plane(w.v, v);
+    chroma_plane(w.u, channels, u, count);
+    chroma_plane(w.v, channels, v, count);
 }
 
 template <pixel_kind Kind>
@@ -443,7 +452,6 @@ void fill_any(any_rows &t) {
     t.chroma = any_chroma_row;
     t.split_groups = any_split_groups;
     t.join_groups = any_join_groups;
-    t.groups_to_planes = any_groups_to_planes;
     t.mean_of_lines = any_mean_of_lines;
     t.mean_of_blocks = any_mean_of_blocks;
     t.every_second = any_every_second;
