@@ -327,7 +327,9 @@ inline auto load_pixels(const uint8_t *p) {
     uint8_t pixels[2][bytes * 4], to_y[2][bytes], to_u[bytes], to_v[bytes];
     const auto stage = [&](uint8_t *to, const uint8_t *src) {
         stage_few(to, size, src + size * x, count, size);
-        if (w.mean && (count & 1)) copy_few(to + size * count, src + size * (x + count - 1), size);
+        // One pixel of four bytes is staged over and over.
+        if (w.mean && (count & 1) && (count > 1 || size < 4))
+            copy_few(to + size * count, src + size * (x + count - 1), size);
     };
     stage(pixels[0], src0);
     if (src1) stage(pixels[1], src1);
