@@ -39,12 +39,42 @@ void fill_yuv2rgb(yuv2rgb_rows &t) {
 }
 
 }  // namespace scalar
+
+namespace {
+
+struct rows_to_rgb {
+    yuv_to_rgb_row *one;
+    yuv_to_rgb_row_pair *two;
+};
+
+}  // namespace
+
+void convert_planes_to_rgb(const csc_args &a, const format &from, const format &to, yuv_rule rule) {
+    const size_t m = size_t(matrix_of(rule)), l = size_t(from.layout), k = size_t(to.packing);
+    planes_to_rgb p{from.layout,
+                    serves_two_rows(from),
+                    src_lines(a, 0),
+                    src_lines(a, plane_of_u(from)),
+                    src_lines(a, plane_of_v(from)),
+                    dst_lines(a, 0),
+                    to.bytes[0],
+                    a.src_widths[0],
+                    a.src_heights[0],
+                    lead_of(rule, a.src_widths[0], a.src_heights[0])};
+    if (from.planes == 1 && p.width % 2 == 0 && p.height > 0 &&
+        p.y.stride == p.width * from.bytes[0] && p.dst.stride == p.width * p.pixel_bytes) {
+        p.width *= p.height;
+        p.height = 1;
+    }
+    const row_table &live = live_rows(p.width);
+    convert_planes(live, rows_to_rgb{live.yuv2rgb.row[m][l][k], live.yuv2rgb.pair[m][l][k]}, p);
+}
+
 }  // namespace simgp
 
 using namespace simgp;
 
-#define DEFINE(name, from, to, rule)                                                   \
-    SIMGP_CSC_KERNEL(name, convert_to_rgb<formats::from, formats::to, yuv_rule::rule>( \
-                               args, src_lines(args, 0)))
+#define DEFINE(name, from, to, rule) \
+    SIMGP_CSC_KERNEL(name, planes_kernel<formats::from, formats::to, yuv_rule::rule>(args))
 SIMGP_YUV_TO_RGB_KERNELS(DEFINE)
 #undef DEFINE
