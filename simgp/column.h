@@ -1,8 +1,8 @@
-// The last pixels of lines of an odd width.
+// Columns of pixels that fill no vector, laid side by side.
 //
-// A vector row of an odd width ends with a pixel that fills no vector, and takes as long for it as for a
-// vector or two. Walks leave it out of their rows, and have the last pixels of many lines made by the
-// same row, side by side in a line of their own.
+// A vector row takes as long for the last pixel of an odd width as for a vector or two. Walks leave that
+// pixel out of their rows, and have those of many lines made by one row, in a line of their own. Narrow
+// pictures are such columns as a whole.
 #ifndef SIMGP_COLUMN_H
 #define SIMGP_COLUMN_H
 
@@ -12,15 +12,23 @@
 
 namespace simgp {
 
-// As many pixels lie side by side, one vector of the widest.
-inline constexpr ptrdiff_t column_pixels = 64;
+// Columns x ... x + width - 1 of a picture; of width 0: none.
+struct column {
+    ptrdiff_t x = 0, width = 0;
+    ptrdiff_t end() const { return x + width; }
+};
 
-// Whether a walk over lines of such a size leaves the last pixel of each to a column. Rows whose steps may
-// begin at any pixel do one more at no cost, unless nothing else is left for their last step.
-inline bool leaves_column(const row_table &rows, bool steps_of_pairs, ptrdiff_t width,
-                          ptrdiff_t height) {
-    const ptrdiff_t step = rows.short_below ? rows.short_below : 16;
-    return height >= 8 && width > step && width % (steps_of_pairs ? 2 : step) == 1;
+// As many pixels lie side by side at most.
+inline constexpr ptrdiff_t column_pixels = 128;
+
+// The column that a walk over a picture leaves out of its rows. Steps that may begin at any pixel do one
+// more at no cost, unless nothing else is left for the last of them.
+inline column column_of(const row_table &rows, bool steps_of_pairs, ptrdiff_t width,
+                        ptrdiff_t height) {
+    if (rows.vector <= 1 || height < 4) return {};
+    if (width < rows.vector) return {0, width};
+    if ((width & 1) == 0 || (!steps_of_pairs && width % rows.vector != 1)) return {};
+    return {width - 1, 1};
 }
 
 // Whether lines of a destination lie apart, so that the order in which they are written is not seen.
@@ -28,11 +36,11 @@ inline bool lie_apart(const lines &dst, ptrdiff_t bytes) {
     return dst.stride >= bytes || dst.stride <= -bytes;
 }
 
-// Copies `count` lines of 1 ... 4 bytes.
-void copy_column(const const_lines &from, const lines &to, int bytes, ptrdiff_t count);
+// Copies `count` short lines.
+void copy_column(const const_lines &from, const lines &to, ptrdiff_t bytes, ptrdiff_t count);
 
-// Calls f(first, count) for blocks of a column of `height` pixels. The last one ends at the last pixel and
-// may do some again.
+// Calls f(first, count) for blocks of `height` lines. The last one ends at the last line and may do some
+// again.
 template <class F>
 void in_column_blocks(ptrdiff_t height, ptrdiff_t block, F f) {
     const ptrdiff_t count = height < block ? height : block;
@@ -57,25 +65,34 @@ struct planes_to_rgb {
 constexpr bool chroma_is_shared(yuv_layout layout) {
     return layout != yuv_layout::grey && layout != yuv_layout::full;
 }
+constexpr bool is_packed(yuv_layout layout) {
+    return layout == yuv_layout::uyvy || layout == yuv_layout::yuyv;
+}
+constexpr bool has_chroma_planes(yuv_layout layout) {
+    return layout != yuv_layout::grey && !is_packed(layout);
+}
 
-// The last pixels of rows or pairs of rows, at most column_pixels / 2 of them: each is the first of two,
-// whose second has no meaning, as it takes a pair to have chroma of its own.
+// A column of rows or of pairs of rows, `pitch` pixels from one to the next: an even number, as it takes a
+// pair to have chroma of its own. What is between them has no meaning.
 struct pixel_column {
     uint8_t y[2][2 * column_pixels], u[column_pixels], v[column_pixels], rgb[2][4 * column_pixels];
 };
-void gather_column(const planes_to_rgb &p, ptrdiff_t first, ptrdiff_t count, pixel_column &to);
-void scatter_column(const pixel_column &c, const planes_to_rgb &p, ptrdiff_t first,
-                    ptrdiff_t count);
+inline ptrdiff_t pitch_of(const column &c) { return (c.width + 1) & ~ptrdiff_t(1); }
+void gather_column(const planes_to_rgb &p, const column &c, ptrdiff_t first, ptrdiff_t count,
+                   pixel_column &to);
+void scatter_column(const pixel_column &from, const planes_to_rgb &p, const column &c,
+                    ptrdiff_t first, ptrdiff_t count);
 
-// Converts the pixels at the first bytes of `height` lines by row(in, out, count).
+// Converts a column of pixels by row(in, out, count), where they have so many bytes.
 template <class Row>
 void convert_column(const const_lines &in, int in_bytes, const lines &out, int out_bytes,
-                    ptrdiff_t height, Row row) {
+                    const column &c, ptrdiff_t height, Row row) {
     uint8_t from[column_pixels * 4], to[column_pixels * 4];
-    in_column_blocks(height, column_pixels, [&](ptrdiff_t y, ptrdiff_t count) {
-        copy_column(in.from(0, y), {from, in_bytes}, in_bytes, count);
-        row(from, to, count);
-        copy_column(const_lines{to, out_bytes}, out.from(0, y), out_bytes, count);
+    const ptrdiff_t in_line = in_bytes * c.width, out_line = out_bytes * c.width;
+    in_column_blocks(height, column_pixels / c.width, [&](ptrdiff_t y, ptrdiff_t count) {
+        copy_column(in.from(in_bytes * c.x, y), {from, in_line}, in_line, count);
+        row(from, to, c.width * count);
+        copy_column(const_lines{to, out_line}, out.from(out_bytes * c.x, y), out_line, count);
     });
 }
 

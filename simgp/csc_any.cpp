@@ -361,15 +361,18 @@ void yuv_to_rgb_pictures(const job &j) {
                          j.from.layout == yuv_layout::yuyv, is_blue_first(j.to.packing),
                          is_alpha_first(j.to.packing)};
     const size_t in = size_t(chroma_in_of(j.from)), kind = size_t(kind_of(j.to.packing));
-    const rows_to_any rows{how, j.rows.to_rgb[in][kind], j.rows.to_rgb_pair[in][kind]};
+    const auto rows_in = [&](const row_table &t) {
+        return rows_to_any{how, t.any.to_rgb[in][kind], t.any.to_rgb_pair[in][kind]};
+    };
     const lines out = j.out(0);
     if (j.from.kind != format_kind::tiled && j.from.u >= 0) {
         // Rows read what lies in linear planes, whole lines of it.
         const planes_to_rgb p{
             j.from.layout, sharing_of(j.from).down, j.in(0), j.in(j.from.u), j.in(j.from.v),
             out,           j.to.bytes[0],           j.width, j.height,       0};
-        return convert_planes(j.live, rows, p);
+        return convert_planes(p, rows_in);
     }
+    const rows_to_any rows = rows_in(j.live);
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
         const planar_band p = read_band(j, b, strip);
@@ -471,8 +474,8 @@ void rgb_to_yuv_pictures(const job &j) {
         const lines luma = j.out(0), u = j.out(of_u), v = j.out(of_v);
         const ptrdiff_t chroma_bytes = !by_rows ? 0 : pairs ? 2 : 1;
         const ptrdiff_t chroma_line = chroma_bytes * ((j.width + 1) / 2);
-        const bool column = leaves_column(j.live, by_rows, j.width, j.height) &&
-                            lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
+        const bool column = column_of(j.live, by_rows, j.width, j.height).width == 1 &&
+                            j.width > 1 && lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
                             lie_apart(v, chroma_line);
         for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
             const bool two = to.down && y + 1 < j.height;

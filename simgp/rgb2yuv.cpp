@@ -73,15 +73,15 @@ void rgb_to_yuv(const csc_args &a, const format &from, const format &to) {
     const const_lines in = whole_pixel_lines(src_lines(a, 0), size);
     const lines luma = dst_lines(a, 0), u = dst_lines(a, to.u), v = dst_lines(a, to.v);
     // The last pixel of an odd row has no chroma.
-    const bool column = leaves_column(live, true, width, height) && lie_apart(luma, width);
-    const ptrdiff_t whole = width - column;
+    column c = column_of(live, true, width, height);
+    if (c.x == 0 || !lie_apart(luma, width)) c = {};
     for (ptrdiff_t y = 0; y < height; y++) {
         const bool chroma = !(y & 1) && y + 1 < height;
         (chroma ? with_chroma : luma_only)(in.line(y), luma.line(y), u.line(y >> 1), v.line(y >> 1),
-                                           whole);
+                                           width - c.width);
     }
-    if (!column) return;
-    convert_column(in.from(size * whole, 0), size, luma.from(whole, 0), 1, height,
+    if (c.width == 0) return;
+    convert_column(in, size, luma, 1, c, height,
                    [=](const uint8_t *src, uint8_t *y, ptrdiff_t count) {
                        luma_only(src, y, nullptr, nullptr, count);
                    });

@@ -100,30 +100,76 @@ void convert_to_rgb(const csc_args &a, Luma &&luma) {
                                     {0, width, height}, lead_of(Rule, width, height));
 }
 
-// Converts a picture of planes: rows.one(y, u, v, dst, width) one row, rows.two(y0, y1, u, v, dst0,
-// dst1, width) two.
+// Converts the first `width` pixels of rows, but all of those that have a chroma line to themselves.
 template <class Rows>
-void convert_planes(const row_table &live, const Rows &rows, const planes_to_rgb &p) {
+[[gnu::noinline]] void walk_planes(const planes_to_rgb &p, const Rows &rows, ptrdiff_t width) {
+    const const_lines y = p.y, u = p.u, v = p.v;
+    const lines dst = p.dst;
+    const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
+    // Offsets are added up: in small pictures, products for every line would be seen.
+    ptrdiff_t at_y = p.lead * y.stride, at_u = p.lead * u.stride, at_v = p.lead * v.stride,
+              at_dst = p.lead * dst.stride;
+    if (width > 0 && p.two_rows) {
+        for (ptrdiff_t k = units; k > 0; k--) {
+            const uint8_t *const luma = y.first + at_y;
+            uint8_t *const out = dst.first + at_dst;
+            rows.two(luma, luma + y.stride, u.first + at_u, v.first + at_v, out, out + dst.stride,
+                     width);
+            at_y += 2 * y.stride;
+            at_u += u.stride;
+            at_v += v.stride;
+            at_dst += 2 * dst.stride;
+        }
+    } else if (width > 0 && !has_chroma_planes(p.layout)) {
+        for (ptrdiff_t k = units; k > 0; k--) {
+            rows.one(y.first + at_y, nullptr, nullptr, dst.first + at_dst, width);
+            at_y += y.stride;
+            at_dst += dst.stride;
+        }
+    } else if (width > 0) {
+        for (ptrdiff_t k = units; k > 0; k--) {
+            rows.one(y.first + at_y, u.first + at_u, v.first + at_v, dst.first + at_dst, width);
+            at_y += y.stride;
+            at_u += u.stride;
+            at_v += v.stride;
+            at_dst += dst.stride;
+        }
+    }
+    if (!p.two_rows || p.height < 1) return;
+    const auto alone = [&](ptrdiff_t row, ptrdiff_t chroma) {
+        rows.two(y.line(row), y.line(row), u.line(chroma), v.line(chroma), dst.line(row),
+                 dst.line(row), p.width);
+    };
+    if (p.lead) alone(0, 0);
+    if ((p.height - p.lead) % 2) alone(p.height - 1, p.lead + units);
+}
+
+// Converts a picture of planes. rows_of(table) gives rows.one(y, u, v, dst, width) for one row and
+// rows.two(y0, y1, u, v, dst0, dst1, width) for two.
+template <class RowsOf>
+void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_of) {
+    const ptrdiff_t block = column_pixels / pitch_of(c);
+    const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
+    const auto rows = rows_of(live_rows(pitch_of(c) * (units < block ? units : block)));
+    pixel_column at;
+    in_column_blocks(units, block, [&](ptrdiff_t first, ptrdiff_t count) {
+        gather_column(p, c, first, count, at);
+        if (p.two_rows)
+            rows.two(at.y[0], at.y[1], at.u, at.v, at.rgb[0], at.rgb[1], pitch_of(c) * count);
+        else
+            rows.one(at.y[0], at.u, at.v, at.rgb[0], pitch_of(c) * count);
+        scatter_column(at, p, c, first, count);
+    });
+}
+template <class RowsOf>
+void convert_planes(const planes_to_rgb &p, const RowsOf &rows_of) {
     if (p.width < 1) return;
-    const ptrdiff_t left_out = leaves_column(live, chroma_is_shared(p.layout), p.width, p.height) &&
-                               lie_apart(p.dst, p.width * p.pixel_bytes);
-    const auto one = [&](auto... a) __attribute__((always_inline)) { rows.one(a...); };
-    const auto two = [&](auto... a) __attribute__((always_inline)) { rows.two(a...); };
-    if (p.two_rows)
-        walk_row_pairs(two, p.y, p.u, p.v, p.dst, p.width, p.height, p.lead, left_out);
-    else
-        walk_rows(one, p.y, p.u, p.v, p.dst, p.width - left_out, p.height);
-    if (!left_out) return;
-    pixel_column c{};
-    in_column_blocks(p.two_rows ? (p.height - p.lead) / 2 : p.height, column_pixels / 2,
-                     [&](ptrdiff_t first, ptrdiff_t count) {
-                         gather_column(p, first, count, c);
-                         if (p.two_rows)
-                             two(c.y[0], c.y[1], c.u, c.v, c.rgb[0], c.rgb[1], 2 * count);
-                         else
-                             one(c.y[0], c.u, c.v, c.rgb[0], 2 * count);
-                         scatter_column(c, p, first, count);
-                     });
+    const row_table &live = live_rows(p.width);
+    const auto rows = rows_of(live);
+    column c = column_of(live, chroma_is_shared(p.layout), p.width, p.height);
+    if (!lie_apart(p.dst, p.width * p.pixel_bytes)) c = {};
+    walk_planes(p, rows, p.width - c.width);
+    if (c.width > 0) convert_column(p, c, rows_of);
 }
 
 // The same by the rows of fixed weights: the kernels between two formats. Of one plane, lines of an even
@@ -143,13 +189,10 @@ void walk_one_plane(const row_table &live, const const_lines &in, int in_bytes, 
     if (width < 1 || height < 1) return;
     if (in.stride == width * in_bytes && out.stride == width * out_bytes)
         return row(in.first, out.first, width * height);
-    const bool column =
-        leaves_column(live, false, width, height) && lie_apart(out, width * out_bytes);
-    const ptrdiff_t whole = width - column;
-    for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), whole);
-    if (column)
-        convert_column(in.from(in_bytes * whole, 0), in_bytes, out.from(out_bytes * whole, 0),
-                       out_bytes, height, row);
+    column c = column_of(live, false, width, height);
+    if (c.x == 0 || !lie_apart(out, width * out_bytes)) c = {};
+    for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), width - c.width);
+    if (c.width > 0) convert_column(in, in_bytes, out, out_bytes, c, height, row);
 }
 
 }  // namespace simgp

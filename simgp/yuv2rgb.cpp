@@ -66,8 +66,9 @@ void convert_planes_to_rgb(const csc_args &a, const format &from, const format &
         p.width *= p.height;
         p.height = 1;
     }
-    const row_table &live = live_rows(p.width);
-    convert_planes(live, rows_to_rgb{live.yuv2rgb.row[m][l][k], live.yuv2rgb.pair[m][l][k]}, p);
+    convert_planes(p, [=](const row_table &t) {
+        return rows_to_rgb{t.yuv2rgb.row[m][l][k], t.yuv2rgb.pair[m][l][k]};
+    });
 }
 
 }  // namespace simgp
