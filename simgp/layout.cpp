@@ -24,11 +24,18 @@ void unpack(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
     }
 }
 
+void copy(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst, ptrdiff_t dst_stride,
+          ptrdiff_t size, ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        memcpy(dst + y * dst_stride, src + y * src_stride, size_t(size));
+}
+
 }  // namespace
 
 void fill_layout(layout_rows &t) {
     t.pack = pack;
     t.unpack = unpack;
+    t.copy = copy;
 }
 
 }  // namespace scalar
