@@ -60,7 +60,7 @@ format_shape shape_of(int code) {
     return shape;
 }
 
-std::string name_of(int code) { return shape_of(code).format->name; }
+std::string name_of(int code) { return shape_of(code).format->name.text; }
 bool blue_is_high(int code) {
     const simgp::pixel_bytes at = simgp::pixels_of[size_t(simgp::find_format(code)->packing)];
     return at.b > at.r;

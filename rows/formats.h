@@ -51,10 +51,19 @@ static_assert(pixels_of[size_t(rgb_packing::count) - 1].size != 0, "a packing ha
 
 enum class format_kind : uint8_t { planar, tiled, packed, rgb };
 
+// A name, in place: a pointer would have to be set when the library is loaded.
+struct short_name {
+    char text[12];
+
+    consteval short_name(const char *s) : text() {
+        for (int i = 0; (text[i] = s[i]) != 0;) i++;  // no constant where the name is too long
+    }
+};
+
 // Planes of samples: of one byte, or of two where a sample is a pair of U and V; of whole pixels in
 // the formats of a single plane. A sample of plane k stands for 2^x_shift x 2^y_shift pixels.
 struct format {
-    const char *name;  // as functions are named
+    short_name name;  // as functions are named
     format_kind kind;
     uint8_t planes;
     uint8_t bytes[3], x_shift[3], y_shift[3];  // by plane
@@ -64,11 +73,11 @@ struct format {
 };
 
 // What the table is made with.
-consteval format grey_format(const char *name) {
+consteval format grey_format(short_name name) {
     return {
         name, format_kind::planar, 1, {1}, {}, {}, -1, -1, yuv_layout::grey, rgb_packing::count};
 }
-consteval format planar_format(const char *name, uint8_t x_shift, uint8_t y_shift, int8_t u,
+consteval format planar_format(short_name name, uint8_t x_shift, uint8_t y_shift, int8_t u,
                                int8_t v) {
     return {name,
             format_kind::planar,
@@ -81,13 +90,13 @@ consteval format planar_format(const char *name, uint8_t x_shift, uint8_t y_shif
             x_shift ? yuv_layout::half : yuv_layout::full,
             rgb_packing::count};
 }
-consteval format pair_format(const char *name, format_kind kind, yuv_layout layout) {
+consteval format pair_format(short_name name, format_kind kind, yuv_layout layout) {
     return {name, kind, 2, {1, 2}, {0, 1}, {0, 1}, 1, 1, layout, rgb_packing::count};
 }
-consteval format packed_format(const char *name, yuv_layout layout) {
+consteval format packed_format(short_name name, yuv_layout layout) {
     return {name, format_kind::packed, 1, {2}, {}, {}, 0, 0, layout, rgb_packing::count};
 }
-consteval format rgb_format(const char *name, rgb_packing packing) {
+consteval format rgb_format(short_name name, rgb_packing packing) {
     return {name, format_kind::rgb,  1,      {uint8_t(pixels_of[size_t(packing)].size)}, {}, {}, -1,
             -1,   yuv_layout::count, packing};
 }

@@ -23,12 +23,11 @@ struct irsz_format {
 
 // Lines that become words wait in a part of the stack, as many as the resampler makes at once, which
 // strips of so many columns leave for them.
-constexpr ptrdiff_t lines_packed = 2, most_packed = 512;
-constexpr ptrdiff_t most_columns(const irsz_format &f) {
-    return f.packs ? most_packed : PTRDIFF_MAX;
-}
-constexpr ptrdiff_t strip_memory(const irsz_format &f) {
-    return resample_stack - (f.packs ? lines_packed * most_packed * f.src_bytes : 0);
+constexpr ptrdiff_t lines_packed = 2, most_packed = 512,
+                    packed_memory = lines_packed * most_packed * 3;
+constexpr ptrdiff_t most_columns(bool packs) { return packs ? most_packed : PTRDIFF_MAX; }
+constexpr ptrdiff_t strip_memory(bool packs) {
+    return resample_stack - (packs ? packed_memory : 0);
 }
 
 // Packs a line. The two lines below come next: a strip's short lines are too many streams for the
@@ -42,13 +41,29 @@ void pack_line(rgb_to_rgb_row *pack, const uint8_t *src, const lines &dst, ptrdi
     pack(src, dst.line(y), columns);
 }
 
+// The lines of a band, and the one that was kept before.
+struct band {
+    const_lines given;
+    ptrdiff_t first;
+    const uint8_t *kept;
+};
+// The same as a source of lines, while bands come and go.
+struct band_source {
+    const band *now;
+    ptrdiff_t stride;
+
+    const uint8_t *fetch(ptrdiff_t y) const {
+        return y < now->first ? now->kept : now->given.line(y - now->first);
+    }
+};
+
 // Writes lines first ... first + count - 1 of a strip.
-template <const irsz_format &F, class Lines>
-void write_lines(Lines &made, ptrdiff_t columns, ptrdiff_t first, ptrdiff_t count,
-                 const lines &dst) {
-    if constexpr (F.packs) {
-        const ptrdiff_t stride = columns * F.src_bytes;
-        uint8_t some[lines_packed * most_packed * F.src_bytes];
+template <bool Packs>
+void write_lines(resampled_lines<band_source> &made, ptrdiff_t columns, ptrdiff_t first,
+                 ptrdiff_t count, const lines &dst) {
+    if constexpr (Packs) {
+        const ptrdiff_t stride = columns * 3;
+        uint8_t some[packed_memory];
         const auto pack = live_rows().rgb2yuv.to_rgb565[size_t(rgb_packing::rgb888)];
         for (ptrdiff_t y = 0; y < count;) {
             const ptrdiff_t end = y + made.make_some(first + y, first + count, some, stride);
@@ -60,42 +75,39 @@ void write_lines(Lines &made, ptrdiff_t columns, ptrdiff_t first, ptrdiff_t coun
     }
 }
 
-// From a source of lines.
-template <const irsz_format &F, class Source>
-void resize(const resampling &r, const Source &src, ptrdiff_t width, ptrdiff_t first,
-            ptrdiff_t count, const lines &dst) {
-    resample_plane<strip_memory(F)>(
-        r, src, width,
+template <bool Packs>
+void resize_as(const irsz_format &f, const resampling &r, const band &src, ptrdiff_t width,
+               ptrdiff_t first, ptrdiff_t count, const lines &dst) {
+    resample_plane<strip_memory(Packs)>(
+        r, band_source{&src, src.given.stride}, width,
         [&](auto &made, ptrdiff_t x, ptrdiff_t columns) {
-            write_lines<F>(made, columns, first, count, dst.from(x * F.dst_bytes, 0));
+            write_lines<Packs>(made, columns, first, count, dst.from(x * f.dst_bytes, 0));
         },
-        most_columns(F));
+        most_columns(Packs));
+}
+void resize(const irsz_format &f, const resampling &r, const band &src, ptrdiff_t width,
+            ptrdiff_t first, ptrdiff_t count, const lines &dst) {
+    (f.packs ? resize_as<true> : resize_as<false>)(f, r, src, width, first, count, dst);
 }
 
-template <const irsz_format &F>
-void resize_whole(const void *src, int32_t src_line, int32_t width, int32_t height,
-                  int32_t dst_line, void *dst, int32_t step_x, int32_t step_y) {
+void resize_whole(const irsz_format &f, const void *src, int32_t src_line, int32_t width,
+                  int32_t height, int32_t dst_line, void *dst, int32_t step_x, int32_t step_y) {
     if (width < 1 || height < 1) return;
-    resize<F>(resampling(F.kind, step_x, step_y), lines_of(src, ptrdiff_t(src_line) * F.unit),
-              width, 0, height, lines_of(dst, ptrdiff_t(dst_line) * F.unit));
+    const const_lines whole = lines_of(src, ptrdiff_t(src_line) * f.unit);
+    resize(f, resampling(f.kind, step_x, step_y), {whole, 0, nullptr}, width, 0, height,
+           lines_of(dst, ptrdiff_t(dst_line) * f.unit));
 }
 
-// The two lines of a row, as lines 2 and 3 of a plane.
-struct line_pair {
-    const void *const *of;
-    const uint8_t *fetch(ptrdiff_t y) const { return static_cast<const uint8_t *>(of[y & 1]); }
-};
-
-template <const irsz_format &F>
-void resize_row(const void *const *of, const uint8_t *wrow, int32_t width, int32_t shift_x,
-                int32_t inc_x, void *dst) {
+void resize_row(const irsz_format &f, const void *const *of, const uint8_t *wrow, int32_t width,
+                int32_t shift_x, int32_t inc_x, void *dst) {
     if (width < 1) return;
     // Of phase 0 across, the weight of the lower line is 8 times the phase down. Row 1, with a step
     // of two lines and this phase, lies where it should; with a step as long no row is kept.
     const int32_t phase = wrow[2] >> 3 & 7, step_y = 2 << 18 | phase << 15;
     const int32_t step_x = int32_t(uint32_t(inc_x) << 3 | uint32_t(shift_x));
-    resize<F>(resampling(F.kind, step_x, step_y << 3), line_pair{of}, width, 1, 1,
-              lines_of(dst, 0));
+    // Its two lines are those before line 3, and line 3.
+    const band two = {lines_of(of[1], 0), 3, static_cast<const uint8_t *>(of[0])};
+    resize(f, resampling(f.kind, step_x, step_y << 3), two, width, 1, 1, lines_of(dst, 0));
 }
 
 // Bands ---------------------------------------------------------------------------------------
@@ -107,22 +119,6 @@ void resize_row(const void *const *of, const uint8_t *wrow, int32_t width, int32
 // last below E, is as close: they all wait with the same upper line, which is the only one of the
 // past that is ever needed. It stays the one to keep until a band brings line U + e, however many
 // bands come between.
-
-// The lines of a band, and the one that was kept before.
-struct band {
-    const_lines given;
-    ptrdiff_t first;
-    const uint8_t *kept;
-
-    const uint8_t *line(ptrdiff_t y) const { return y < first ? kept : given.line(y - first); }
-};
-// The same as a source of lines, while bands come and go.
-struct band_source {
-    const band *now;
-    ptrdiff_t stride;
-
-    const uint8_t *fetch(ptrdiff_t y) const { return now->line(y); }
-};
 
 // A strip stays through all bands, and with it the rows that are kept for its lines.
 struct band_strip {
@@ -156,13 +152,13 @@ ptrdiff_t rows_before(const band_resizer &b, int64_t end) {
     return rows < b.dst_h ? rows : b.dst_h;
 }
 
-template <const irsz_format &F>
-void resize_band(band_resizer &b, const uint8_t *src, int32_t first, int32_t count) {
+void resize_band(const irsz_format &f, band_resizer &b, const uint8_t *src, int32_t first,
+                 int32_t count) {
     if (first < 0 || count < 1) return;
     const int64_t end = int64_t(first) + count;
-    const ptrdiff_t stride = ptrdiff_t(b.dst_line) * F.unit;
+    const ptrdiff_t stride = ptrdiff_t(b.dst_line) * f.unit;
     const resize_axis &y = b.r.y;
-    b.now.given = {src, ptrdiff_t(b.src_line) * F.unit};
+    b.now.given = {src, ptrdiff_t(b.src_line) * f.unit};
     b.now.first = first;
 
     const ptrdiff_t next = b.row - b.carry, ready = rows_before(b, end);
@@ -171,14 +167,16 @@ void resize_band(band_resizer &b, const uint8_t *src, int32_t first, int32_t cou
         const lines dst = lines_of(b.dst, stride).from(0, next);
         for (ptrdiff_t k = 0; k < b.count; k++) {
             band_strip &s = b.strips[k];
-            write_lines<F>(s.made, s.plan.columns, next, row - next,
-                           dst.from(s.x * F.dst_bytes, 0));
+            (f.packs ? write_lines<true> : write_lines<false>)(s.made, s.plan.columns, next,
+                                                               row - next,
+                                                               dst.from(s.x * f.dst_bytes, 0));
         }
     }
 
     const ptrdiff_t upper = y.cell(row);
     const bool waits = row < b.dst_h && upper < end;
-    if (waits && upper >= first) memcpy(b.line_buf, b.now.line(upper), size_t(b.row_bytes));
+    if (waits && upper >= first)
+        memcpy(b.line_buf, b.now.given.line(upper - first), size_t(b.row_bytes));
     b.carry = waits;
     b.row = int32_t(row + waits);
     b.y_pos = int32_t(y.at(b.row));
@@ -186,35 +184,32 @@ void resize_band(band_resizer &b, const uint8_t *src, int32_t first, int32_t cou
     b.reuse = waits && row + 1 < b.dst_h && y.cell(row + 1) == upper;
 }
 
-template <const irsz_format &F>
-int32_t run(scmn_irsz_ctx *ctx, const void *src, int32_t first, int32_t count) {
+int32_t run(const irsz_format &f, scmn_irsz_ctx *ctx, const void *src, int32_t first,
+            int32_t count) {
     const auto packed = [](int32_t step, int32_t shift) { return step << 3 | shift; };
     if (ctx->mode == SCMN_IRSZ_FULL)
-        resize_whole<F>(src, ctx->src_line, ctx->dst_w, ctx->dst_h, ctx->dst_line, ctx->dst,
-                        packed(ctx->inc_x, ctx->shift_x), packed(ctx->inc_y, ctx->shift_y));
+        resize_whole(f, src, ctx->src_line, ctx->dst_w, ctx->dst_h, ctx->dst_line, ctx->dst,
+                     packed(ctx->inc_x, ctx->shift_x), packed(ctx->inc_y, ctx->shift_y));
     else
-        resize_band<F>(*static_cast<band_resizer *>(ctx), static_cast<const uint8_t *>(src), first,
-                       count);
+        resize_band(f, *static_cast<band_resizer *>(ctx), static_cast<const uint8_t *>(src), first,
+                    count);
     return 0;
 }
 
-constexpr irsz_format bytes_1 = {SCMN_IRSZ_8B, scmn_irsz8b, resize_kind::bytes1, false, 1, 1, 1};
-constexpr irsz_format bytes_3 = {
-    SCMN_IRSZ_8B8B8B, scmn_irsz8b8b8b, resize_kind::bytes3, false, 3, 3, 1};
-constexpr irsz_format bytes_3_to_565 = {
-    SCMN_IRSZ_8B8B8B_5B6B5B, scmn_irsz8b8b8b_5b6b5b, resize_kind::bytes3, true, 3, 2, 1};
-constexpr irsz_format words_565 = {
-    SCMN_IRSZ_5B6B5B, scmn_irsz5b6b5b, resize_kind::word565, false, 2, 2, 2};
-constexpr irsz_format bytes_4 = {
-    SCMN_IRSZ_8B8B8B8B, scmn_irsz8b8b8b8b, resize_kind::bytes4, false, 4, 4, 1};
-
-const irsz_format *find_irsz_format(int32_t code) {
-    constexpr const irsz_format *all[] = {&bytes_1, &bytes_3, &bytes_3_to_565, &words_565,
-                                          &bytes_4};
-    for (const irsz_format *f : all)
-        if (f->code == code) return f;
+constexpr irsz_format irsz_formats[] = {
+    {SCMN_IRSZ_8B, scmn_irsz8b, resize_kind::bytes1, false, 1, 1, 1},
+    {SCMN_IRSZ_8B8B8B, scmn_irsz8b8b8b, resize_kind::bytes3, false, 3, 3, 1},
+    {SCMN_IRSZ_8B8B8B_5B6B5B, scmn_irsz8b8b8b_5b6b5b, resize_kind::bytes3, true, 3, 2, 1},
+    {SCMN_IRSZ_5B6B5B, scmn_irsz5b6b5b, resize_kind::word565, false, 2, 2, 2},
+    {SCMN_IRSZ_8B8B8B8B, scmn_irsz8b8b8b8b, resize_kind::bytes4, false, 4, 4, 1},
+};
+constexpr const irsz_format *find_irsz_format(int32_t code) {
+    for (const irsz_format &f : irsz_formats)
+        if (f.code == code) return &f;
     return nullptr;
 }
+template <int32_t Code>
+constexpr const irsz_format &irsz_format_of = *find_irsz_format(Code);
 
 // Creation ------------------------------------------------------------------------------------
 
@@ -266,7 +261,7 @@ scmn_irsz_ctx *make_whole(const scmn_irsz_ctx &c) {
 scmn_irsz_ctx *make_for_bands(const scmn_irsz_ctx &c, const irsz_format &f, int32_t src_w) {
     const resampling r(f.kind, c.inc_x << 3 | c.shift_x, c.inc_y << 3 | c.shift_y);
     // As wide as those of the kernels are, so that what a strip works on stays in the cache.
-    const ptrdiff_t columns = r.strip_width(c.dst_w, strip_memory(f), most_columns(f));
+    const ptrdiff_t columns = r.strip_width(c.dst_w, strip_memory(f.packs), most_columns(f.packs));
     const ptrdiff_t count = (c.dst_w + columns - 1) / columns;
     const ptrdiff_t strip_bytes = r.plan_bytes(columns) + r.ring_bytes(columns);
     const uint64_t size = sizeof(band_resizer) + resize_alignment +
@@ -333,32 +328,33 @@ void scmn_irsz_delete(scmn_irsz_ctx *ctx) {
 
 #define SCMN_IRSZ_ENTRY(name, format)                                                       \
     int32_t name(scmn_irsz_ctx *ctx, const void *src, int32_t first_line, int32_t nlines) { \
-        return run<format>(ctx, src, first_line, nlines);                                   \
+        return run(irsz_format_of<format>, ctx, src, first_line, nlines);                   \
     }
-SCMN_IRSZ_ENTRY(scmn_irsz8b, bytes_1)
-SCMN_IRSZ_ENTRY(scmn_irsz8b8b8b, bytes_3)
-SCMN_IRSZ_ENTRY(scmn_irsz8b8b8b_5b6b5b, bytes_3_to_565)
-SCMN_IRSZ_ENTRY(scmn_irsz5b6b5b, words_565)
-SCMN_IRSZ_ENTRY(scmn_irsz8b8b8b8b, bytes_4)
+SCMN_IRSZ_ENTRY(scmn_irsz8b, SCMN_IRSZ_8B)
+SCMN_IRSZ_ENTRY(scmn_irsz8b8b8b, SCMN_IRSZ_8B8B8B)
+SCMN_IRSZ_ENTRY(scmn_irsz8b8b8b_5b6b5b, SCMN_IRSZ_8B8B8B_5B6B5B)
+SCMN_IRSZ_ENTRY(scmn_irsz5b6b5b, SCMN_IRSZ_5B6B5B)
+SCMN_IRSZ_ENTRY(scmn_irsz8b8b8b8b, SCMN_IRSZ_8B8B8B8B)
 
 #define SCMN_IRSZ_LINE_KERNEL(name, format)                                                  \
     void name(const void *const *lines, const uint8_t *wrow, int32_t dst_w, int32_t shift_x, \
               int32_t, int32_t inc_x, void *dst_row) {                                       \
-        resize_row<format>(lines, wrow, dst_w, shift_x, inc_x, dst_row);                     \
+        resize_row(irsz_format_of<format>, lines, wrow, dst_w, shift_x, inc_x, dst_row);     \
     }
-SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b_line, bytes_1)
-SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b8b8b_line, bytes_3)
-SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b8b8b_5b6b5b_line, bytes_3_to_565)
-SCMN_IRSZ_LINE_KERNEL(scmn_irsz5b6b5b_line, words_565)
-SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b8b8b8b_line, bytes_4)
+SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b_line, SCMN_IRSZ_8B)
+SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b8b8b_line, SCMN_IRSZ_8B8B8B)
+SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b8b8b_5b6b5b_line, SCMN_IRSZ_8B8B8B_5B6B5B)
+SCMN_IRSZ_LINE_KERNEL(scmn_irsz5b6b5b_line, SCMN_IRSZ_5B6B5B)
+SCMN_IRSZ_LINE_KERNEL(scmn_irsz8b8b8b8b_line, SCMN_IRSZ_8B8B8B8B)
 
 #define SCMN_IRSZ_FULL_KERNEL(name, format)                                                      \
     void name(const void *src, int32_t src_line, int32_t dst_w, int32_t dst_h, int32_t dst_line, \
               void *dst, int32_t step_x, int32_t step_y) {                                       \
-        resize_whole<format>(src, src_line, dst_w, dst_h, dst_line, dst, step_x, step_y);        \
+        resize_whole(irsz_format_of<format>, src, src_line, dst_w, dst_h, dst_line, dst, step_x, \
+                     step_y);                                                                    \
     }
-SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b_full, bytes_1)
-SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b8b8b_full, bytes_3)
-SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b8b8b_5b6b5b_full, bytes_3_to_565)
-SCMN_IRSZ_FULL_KERNEL(scmn_irsz5b6b5b_full, words_565)
-SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b8b8b8b_full, bytes_4)
+SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b_full, SCMN_IRSZ_8B)
+SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b8b8b_full, SCMN_IRSZ_8B8B8B)
+SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b8b8b_5b6b5b_full, SCMN_IRSZ_8B8B8B_5B6B5B)
+SCMN_IRSZ_FULL_KERNEL(scmn_irsz5b6b5b_full, SCMN_IRSZ_5B6B5B)
+SCMN_IRSZ_FULL_KERNEL(scmn_irsz8b8b8b8b_full, SCMN_IRSZ_8B8B8B8B)

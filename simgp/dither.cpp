@@ -115,31 +115,25 @@ constexpr yuv_rule rule_between() {
     return found;
 }
 
-template <const format &From, const format &To, class Luma>
-void luma_to_rgb(const csc_args &a, Luma &&luma) {
-    convert_to_rgb<From, To, rule_between<From, To>()>(a, luma);
-}
-
 // Grey is dithered in full height. Of other pictures the last 4 rows, the tail, are converted like a
 // picture of their own, without dithering; so is what has less than 4 rows.
-template <const format &From, const format &To>
-void dither_and_convert(const csc_args &a) {
+void dither_and_convert(const yuv_to_rgb_conversion &c, const csc_args &a) {
     if (a.src_widths[0] < 1) return;  // there are no last rows to point to
-    if constexpr (From.u < 0) return luma_to_rgb<From, To>(a, dithered_luma(a, a.src_heights[0]));
+    if (c.from.u < 0) return convert_to_rgb(c, a, dithered_luma(a, a.src_heights[0]));
 
     constexpr int32_t tail = 4;
-    if (a.src_heights[0] < tail) return luma_to_rgb<From, To>(a, src_lines(a, 0));
+    if (a.src_heights[0] < tail) return convert_planes_to_rgb(c, a);
 
     const int32_t body = a.src_heights[0] - tail;
     csc_args top = a;
     top.src_heights = &body;
-    luma_to_rgb<From, To>(top, dithered_luma(a, body));
+    convert_to_rgb(c, top, dithered_luma(a, body));
 
     const auto last_lines = [&](int plane, int32_t height) {
         return lines_of(a.src_planes[plane], a.src_strides[plane])
             .line(ptrdiff_t(a.src_heights[plane]) - height);
     };
-    constexpr int32_t tail_chroma = tail >> From.y_shift[1];
+    const int32_t tail_chroma = tail >> c.from.y_shift[1];
     uint8_t *const src_planes[] = {last_lines(0, tail), last_lines(1, tail_chroma),
                                    last_lines(2, tail_chroma)};
     uint8_t *const dst_planes[] = {dst_lines(a, 0).line(body)};
@@ -147,11 +141,14 @@ void dither_and_convert(const csc_args &a) {
     bottom.src_planes = src_planes;
     bottom.src_heights = &tail;
     bottom.dst_planes = dst_planes;
-    luma_to_rgb<From, To>(bottom, src_lines(bottom, 0));
+    convert_planes_to_rgb(c, bottom);
 }
 
-#define DEFINE(name, from, to) \
-    SIMGP_CSC_KERNEL(name, dither_and_convert<formats::from, formats::to>(args))
+#define DEFINE(name, source, target)                                                              \
+    SIMGP_CSC_KERNEL(name, dither_and_convert(                                                    \
+                               conversion_of<formats::source, formats::target,                    \
+                                             rule_between<formats::source, formats::target>()>(), \
+                               args))
 
 // Offered by format alone, not by name.
 #define YV12_KERNELS(X)                    \

@@ -6,7 +6,7 @@ namespace simgp {
 namespace {
 
 struct other_name {
-    const char *name;
+    short_name name;
     int32_t code;
 };
 constexpr other_name other_names[] = {
@@ -51,14 +51,14 @@ const char *simgp_result_text(int32_t result) {
 
 const char *simgp_format_name(int32_t format) {
     const simgp::format *const known = find_format(format);
-    return known ? known->name : nullptr;
+    return known ? known->name.text : nullptr;
 }
 
 int32_t simgp_format_of_name(const char *name) {
     if (!name) return -1;
     for (const coded_format &f : coded_formats)
-        if (is_name(name, f.is->name)) return f.code;
+        if (is_name(name, f.is->name.text)) return f.code;
     for (const other_name &other : other_names)
-        if (is_name(name, other.name)) return other.code;
+        if (is_name(name, other.name.text)) return other.code;
     return -1;
 }

@@ -5,7 +5,8 @@
 
 using namespace simgp;
 
-#define DEFINE(name, from, to, rule) \
-    SIMGP_CSC_KERNEL(name, planes_kernel<formats::from, formats::to, yuv_rule::rule>(args))
+#define DEFINE(name, from, to, rule)              \
+    SIMGP_CSC_KERNEL(name, convert_planes_to_rgb( \
+                               conversion_of<formats::from, formats::to, yuv_rule::rule>(), args))
 SIMGP_PACKED_TO_RGB_KERNELS(DEFINE)
 #undef DEFINE

@@ -97,19 +97,8 @@ class resampling {
   public:
     // Where the step from a line to the next is short, most rows are wanted for several lines:
     // they are blended across once, and the two latest kept. The other way, two rows are blended at
-    // once for each line, and a source must be able to hand over four rows at a time; `keep` rules
-    // that out.
-    resampling(resize_kind kind, int32_t step_x, int32_t step_y, bool keep = false)
-        : pixel_bytes(resized_pixel_bytes[size_t(kind)]),
-          loops(live_rows().resize.of[size_t(kind)]),
-          x(step_x),
-          y(step_y),
-          strip_() {
-        strip_.step = x.step;
-        strip_.shift = x.shift;
-        strip_.keeps = keep || (y.shift == 0 && y.step < short_step);
-        loops.measure(strip_);
-    }
+    // once for each line, and a source must be able to hand over four rows at a time.
+    resampling(resize_kind kind, int32_t step_x, int32_t step_y);
 
     const ptrdiff_t pixel_bytes;
     const resize_loops &loops;
@@ -123,23 +112,9 @@ class resampling {
     ptrdiff_t ring_bytes(ptrdiff_t columns) const {
         return keeps() ? 2 * whole(columns, strip_.kept_bytes) : 0;
     }
-    // How many columns a strip may have whose plan and whose lines' rows, of so many sources that
-    // share the plan, fit the memory.
-    ptrdiff_t columns_in(ptrdiff_t memory, int sources = 1) const {
-        const ptrdiff_t step =
-            strip_.plan_bytes + (keeps() ? 2 * sources * ptrdiff_t(strip_.kept_bytes) : 0);
-        const ptrdiff_t loss = (1 + 2 * sources) * (resize_alignment - 1);
-        return step == 0 ? PTRDIFF_MAX : (memory - loss) / step * strip_.step_bytes / pixel_bytes;
-    }
-    // The width of strips that fit the memory, of about the same width all, and of `most` columns.
-    ptrdiff_t strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t most = PTRDIFF_MAX) const {
-        const ptrdiff_t fit = columns_in(memory);
-        if (fit < most) most = fit;
-        if (width <= most) return width;
-        const ptrdiff_t strips = (width + most - 1) / most;
-        const ptrdiff_t columns = round_up((width + strips - 1) / strips, strip_.step_bytes);
-        return columns < most ? columns : most;
-    }
+    // The width of strips whose plan and lines' rows fit the memory, of about the same width all, and
+    // of at most `most` columns.
+    ptrdiff_t strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t most = PTRDIFF_MAX) const;
     // Calls f(x, columns) for each of them.
     template <class F>
     void for_each_strip(ptrdiff_t width, ptrdiff_t columns, F f) const {
@@ -149,16 +124,7 @@ class resampling {
 
     // Makes the plan of a strip, which lies in the memory given.
     resize_strip plan(ptrdiff_t at, ptrdiff_t columns, const source_span &span,
-                      uint8_t *memory) const {
-        resize_strip s = strip_;
-        s.x = int32_t(at);
-        s.columns = int32_t(columns);
-        s.first = int32_t(span.first);
-        s.row_bytes = int32_t(span.columns * pixel_bytes);
-        s.plan = memory;
-        loops.plan(s);
-        return s;
-    }
+                      uint8_t *memory) const;
 
     // Whole rows, of a plane from which `width` columns are made.
     source_span whole_rows(ptrdiff_t width) const { return {0, x.extent(width)}; }
@@ -173,8 +139,6 @@ class resampling {
     }
 
   private:
-    static constexpr uint32_t short_step = (5 << 18) / 4;
-
     static ptrdiff_t round_up(ptrdiff_t n, ptrdiff_t unit) { return (n + unit - 1) / unit * unit; }
     ptrdiff_t whole(ptrdiff_t columns, ptrdiff_t bytes) const {
         const ptrdiff_t steps = (columns * pixel_bytes + strip_.step_bytes - 1) / strip_.step_bytes;

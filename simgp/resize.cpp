@@ -132,10 +132,9 @@ void fill_resize(resize_rows &t) {
 
 namespace {
 
-template <resize_kind Kind>
-void resize(const resize_args &a) {
+void resize(resize_kind kind, const resize_args &a) {
     if (a.width < 1 || a.height < 1) return;
-    const resampling r(Kind, a.step_x, a.step_y);
+    const resampling r(kind, a.step_x, a.step_y);
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
@@ -181,11 +180,11 @@ using namespace simgp;
 
 const uint8_t simgp_tbl_rsz_weight[256] = SIMGP_RESIZE_WEIGHTS;
 
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b, resize<resize_kind::bytes1>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b, resize<resize_kind::bytes2>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b8b, resize<resize_kind::bytes3>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b8b8b, resize<resize_kind::bytes4>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_5b6b5b, resize<resize_kind::word565>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b, resize(resize_kind::bytes1, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b, resize(resize_kind::bytes2, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b8b, resize(resize_kind::bytes3, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b8b8b, resize(resize_kind::bytes4, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_5b6b5b, resize(resize_kind::word565, args))
 
 void simgp_rsz_get_step(int32_t src_width, int32_t src_height, int32_t dst_width,
                         int32_t dst_height, int32_t mode, int32_t *step_x, int32_t *step_y) {

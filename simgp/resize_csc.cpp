@@ -107,7 +107,7 @@ class untiled_rows {
           stride_(stride),
           detile_(live_rows().tile.detile) {}
 
-    const uint8_t *fetch(ptrdiff_t y) {
+    [[gnu::noinline]] const uint8_t *fetch(ptrdiff_t y) {
         if (y >= part_.height && y % tile_height == 0) y = part_.height - 1;
         const ptrdiff_t band = y < 0 ? 0 : y / band_ * band_;
         int at = 0;
@@ -149,7 +149,8 @@ class untiled_rows {
 struct plane_memory {
     uint8_t *plan, *ring[2], *lines[2];
 
-    plane_memory(memory_pieces &from, const resampling &r, ptrdiff_t columns, int planes)
+    [[gnu::noinline]] plane_memory(memory_pieces &from, const resampling &r, ptrdiff_t columns,
+                                   int planes)
         : plan(from.take(r.plan_bytes(columns))), ring(), lines() {
         for (int k = 0; k < planes; k++) {
             ring[k] = from.take(r.ring_bytes(columns));

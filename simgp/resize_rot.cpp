@@ -8,9 +8,16 @@
 namespace simgp {
 namespace {
 
-constexpr resize_kind kind_of(sample_kind s) {
-    return s == sample_kind::words ? resize_kind::bytes2 : resize_kind::bytes1;
-}
+// What is turned: bytes or words.
+struct turned_samples {
+    sample_kind kind;
+    resize_kind resized_as;
+    ptrdiff_t size, block_side;
+};
+template <sample_kind S>
+constexpr turned_samples samples_of = {
+    S, S == sample_kind::words ? resize_kind::bytes2 : resize_kind::bytes1, sample_size<S>,
+    block_side<S>};
 
 resize_args whole_samples(const resize_args &a, int size) {
     resize_args b = a;
@@ -56,15 +63,15 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
 // Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
 // Of large planes the lines of the destination are asked for meanwhile, some whenever lines have been
 // made: they lie far apart, and no processor foresees them.
-template <sample_kind S, bool Right>
-void quarter_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size<S>, side = block_side<S>, band = 32;
+void quarter_turn(const turned_samples &of, bool right, const resize_args &args) {
+    constexpr ptrdiff_t band = 32;
+    const ptrdiff_t size = of.size, side = of.block_side;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
-    const lines dst = Right ? a.dst : a.dst.upside_down(width);
-    transpose_block *const transpose = live_rows().rotate.transpose[size_t(S)];
-    const resampling r(kind_of(S), a.step_x, a.step_y);
+    const lines dst = right ? a.dst : a.dst.upside_down(width);
+    transpose_block *const transpose = live_rows().rotate.transpose[size_t(of.kind)];
+    const resampling r(of.resized_as, a.step_x, a.step_y);
     const bool fetch = int64_t(width) * height * size >= fetch_from;
     for_each_block_of_lines(
         r, a.src, width, band,
@@ -72,8 +79,8 @@ void quarter_turn(const resize_args &args) {
             for (ptrdiff_t y = 0; y < height; y += band) {
                 const ptrdiff_t rows = height - y < band ? height - y : band;
                 const lines in{block.first, block.stride};
-                const lines to = Right ? in.upside_down(rows) : in;
-                const ptrdiff_t column = Right ? height - y - rows : y;
+                const lines to = right ? in.upside_down(rows) : in;
+                const ptrdiff_t column = right ? height - y - rows : y;
                 uintptr_t ahead = reinterpret_cast<uintptr_t>(dst.line(x) + column * size);
                 const ptrdiff_t each = (columns + rows - 1) / rows;
                 for (ptrdiff_t k = 0; k < rows;) {
@@ -90,14 +97,14 @@ void quarter_turn(const resize_args &args) {
         });
 }
 
-template <sample_kind S>
-void half_turn(const resize_args &args) {
-    constexpr ptrdiff_t size = sample_size<S>, band = 2;
+void half_turn(const turned_samples &of, const resize_args &args) {
+    constexpr ptrdiff_t band = 2;
+    const ptrdiff_t size = of.size;
     if (args.width < 1 || args.height < 1) return;
     const resize_args a = whole_samples(args, int(size));
     const lines dst = a.dst.upside_down(a.height);
-    reverse_row *const reverse = live_rows().rotate.reverse[size_t(S)];
-    const resampling r(kind_of(S), a.step_x, a.step_y);
+    reverse_row *const reverse = live_rows().rotate.reverse[size_t(of.kind)];
+    const resampling r(of.resized_as, a.step_x, a.step_y);
     for_each_block_of_lines(
         r, a.src, a.width, band,
         [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
@@ -115,12 +122,14 @@ void half_turn(const resize_args &args) {
 
 using namespace simgp;
 
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn<sample_kind::bytes, false>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn<sample_kind::bytes, true>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn<sample_kind::bytes>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l, quarter_turn<sample_kind::words, false>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r, quarter_turn<sample_kind::words, true>(args))
-SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn<sample_kind::words>(args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90l, quarter_turn(samples_of<sample_kind::bytes>, false, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_90r, quarter_turn(samples_of<sample_kind::bytes>, true, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b_rot_180, half_turn(samples_of<sample_kind::bytes>, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90l,
+                    quarter_turn(samples_of<sample_kind::words>, false, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_90r,
+                    quarter_turn(samples_of<sample_kind::words>, true, args))
+SIMGP_RESIZE_KERNEL(simgp_rsz_8b8b_rot_180, half_turn(samples_of<sample_kind::words>, args))
 
 simgp_rsz_fn *const simgp_tbl_fn_rsz_8b_rot[6] = {
     simgp_rsz_8b, simgp_rsz_8b_rot_90l, simgp_rsz_8b_rot_90r, simgp_rsz_8b_rot_180, nullptr,

@@ -28,16 +28,13 @@ constexpr bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, 
     return found;
 }
 
-template <const format &From, const format &To, yuv_rule Rule>
-constexpr bool has_yuv_to_rgb_row = is_needed(From.layout, serves_two_rows(From), To.packing,
-                                              matrix_of(Rule));
-
 // The row, or the row for a pair of rows, from YUV to RGB.
 template <const format &From, const format &To, yuv_rule Rule>
 auto *yuv_to_rgb_row_of(const row_table &live) {
-    static_assert(has_yuv_to_rgb_row<From, To, Rule>,
+    constexpr yuv_matrix matrix = matrix_of(Rule);
+    static_assert(is_needed(From.layout, serves_two_rows(From), To.packing, matrix),
                   "rows/conversions.h has no kernel with such a row");
-    const size_t m = size_t(matrix_of(Rule)), l = size_t(From.layout), p = size_t(To.packing);
+    const size_t m = size_t(matrix), l = size_t(From.layout), p = size_t(To.packing);
     if constexpr (serves_two_rows(From))
         return live.yuv2rgb.pair[m][l][p];
     else
@@ -49,55 +46,69 @@ constexpr int lead_of(yuv_rule rule, ptrdiff_t width, ptrdiff_t height) {
     return rule == yuv_rule::first_line_alone && width & 3 ? int(height & 1) : 0;
 }
 
-// Converts rows of `width` pixels from top to bottom, each with chroma lines of its own.
-template <class Row, class Luma, class U, class V>
-void walk_rows(Row row, Luma &&luma, U &&u, V &&v, const lines &dst, ptrdiff_t width,
-               ptrdiff_t height) {
-    for (ptrdiff_t y = 0; y < height; y++)
-        row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y), width);
-}
-
-// The same in pairs, whose rows share chroma lines: row y takes line (y + lead) >> 1. Pairs leave out
-// the last `left_out` pixels; a row that has its chroma line to itself does not.
-template <class RowPair, class Luma, class U, class V>
-void walk_row_pairs(RowPair row, Luma &&luma, U &&u, V &&v, const lines &dst, ptrdiff_t width,
-                    ptrdiff_t height, int lead, ptrdiff_t left_out = 0) {
-    for (ptrdiff_t y = 0; y < height;) {
-        const ptrdiff_t chroma = (y + lead) >> 1;
-        // The row below, or the row again where it has its chroma line to itself.
-        const ptrdiff_t below = y + 1 < height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
-        const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
-        row(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y), dst.line(below),
-            below == y ? width : width - left_out);
-        y = below + 1;
-    }
-}
-
 // Columns x ... x + width - 1 of a picture of `height` rows, as a walk sees them: the sources' lines
 // begin at column x, those of the destination at column 0.
 struct walk_span {
     ptrdiff_t x, width, height;
 };
 
-// Converts a span, its lines from whatever sources there are.
+// Converts the rows of a span from top to bottom, by a row for each of them or by one for pairs, where
+// chroma lines serve two. Row y then takes chroma line (y + lead) >> 1. `at` is the way in bytes from the
+// destination's column 0 to its first pixel.
+template <class Luma, class U, class V>
+void walk_rows(yuv_to_rgb_row *row, Luma &luma, U &u, V &v, const lines &dst, ptrdiff_t at,
+               const walk_span &span, int) {
+    for (ptrdiff_t y = 0; y < span.height; y++)
+        row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y) + at, span.width);
+}
+template <class Luma, class U, class V>
+void walk_rows(yuv_to_rgb_row_pair *rows, Luma &luma, U &u, V &v, const lines &dst, ptrdiff_t at,
+               const walk_span &span, int lead) {
+    for (ptrdiff_t y = 0; y < span.height;) {
+        const ptrdiff_t chroma = (y + lead) >> 1;
+        // The row below, or the row again where it has its chroma line to itself.
+        const ptrdiff_t below = y + 1 < span.height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
+        const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
+        rows(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y) + at,
+             dst.line(below) + at, span.width);
+        y = below + 1;
+    }
+}
 template <const format &From, const format &To, yuv_rule Rule, class Luma, class U, class V>
 void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_span &span, int lead) {
     auto *const row = yuv_to_rgb_row_of<From, To, Rule>(live_rows(span.width));
     if (span.width < 1) return;
-    const lines from_x{dst.first + span.x * To.bytes[0], dst.stride};
-    if constexpr (serves_two_rows(From))
-        walk_row_pairs(row, luma, u, v, from_x, span.width, span.height, lead);
-    else
-        walk_rows(row, luma, u, v, from_x, span.width, span.height);
+    walk_rows(row, luma, u, v, dst, span.x * To.bytes[0], span, lead);
 }
 
-// The same for the whole picture of a kernel, its luma from wherever it comes.
-template <const format &From, const format &To, yuv_rule Rule, class Luma>
-void convert_to_rgb(const csc_args &a, Luma &&luma) {
+// A conversion of whole pictures, as an argument: one walk serves them all.
+struct yuv_to_rgb_conversion {
+    const format &from, &to;
+    yuv_rule rule;
+};
+template <const format &From, const format &To, yuv_rule Rule>
+constexpr yuv_to_rgb_conversion conversion_of() {
+    static_assert(is_needed(From.layout, serves_two_rows(From), To.packing, matrix_of(Rule)),
+                  "rows/conversions.h has no kernel with such a row");
+    return {From, To, Rule};
+}
+
+// Converts the picture of a kernel, its luma from wherever it comes.
+template <class Luma>
+void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&luma) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
-    walk_yuv_to_rgb<From, To, Rule>(luma, src_lines(a, plane_of_u(From)),
-                                    src_lines(a, plane_of_v(From)), dst_lines(a, 0),
-                                    {0, width, height}, lead_of(Rule, width, height));
+    if (width < 1) return;
+    const const_lines u = src_lines(a, plane_of_u(c.from)), v = src_lines(a, plane_of_v(c.from));
+    const lines dst = dst_lines(a, 0);
+    const yuv2rgb_rows &live = live_rows(width).yuv2rgb;
+    const size_t m = size_t(matrix_of(c.rule)), l = size_t(c.from.layout);
+    const size_t p = size_t(c.to.packing);
+    const walk_span span{0, width, height};
+    const int lead = lead_of(c.rule, width, height);
+    if (serves_two_rows(c.from))
+        walk_rows(live.pair[m][l][p], luma, u, v, dst, 0, span, lead);
+    else
+        walk_rows(live.row[m][l][p], luma, u, v, dst, 0, span, lead);
 }
 
 // Converts the first `width` pixels of rows, but all of those that have a chroma line to themselves.
@@ -172,14 +183,9 @@ void convert_planes(const planes_to_rgb &p, const RowsOf &rows_of) {
     if (c.width > 0) convert_column(p, c, rows_of);
 }
 
-// The same by the rows of fixed weights: the kernels between two formats. Of one plane, lines of an even
-// width that lie end to end are one long row.
-void convert_planes_to_rgb(const csc_args &a, const format &from, const format &to, yuv_rule rule);
-template <const format &From, const format &To, yuv_rule Rule>
-void planes_kernel(const csc_args &a) {
-    static_assert(has_yuv_to_rgb_row<From, To, Rule>);
-    convert_planes_to_rgb(a, From, To, Rule);
-}
+// The same for the picture of a kernel. Of one plane, lines of an even width that lie end to end are one
+// long row.
+void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a);
 
 // Converts a picture of one plane on either side, whose pixels have so many bytes, by row(in, out,
 // width). Lines that lie end to end are one long row.

@@ -49,8 +49,9 @@ struct rows_to_rgb {
 
 }  // namespace
 
-void convert_planes_to_rgb(const csc_args &a, const format &from, const format &to, yuv_rule rule) {
-    const size_t m = size_t(matrix_of(rule)), l = size_t(from.layout), k = size_t(to.packing);
+void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a) {
+    const format &from = c.from, &to = c.to;
+    const size_t m = size_t(matrix_of(c.rule)), l = size_t(from.layout), k = size_t(to.packing);
     planes_to_rgb p{from.layout,
                     serves_two_rows(from),
                     src_lines(a, 0),
@@ -60,7 +61,7 @@ void convert_planes_to_rgb(const csc_args &a, const format &from, const format &
                     to.bytes[0],
                     a.src_widths[0],
                     a.src_heights[0],
-                    lead_of(rule, a.src_widths[0], a.src_heights[0])};
+                    lead_of(c.rule, a.src_widths[0], a.src_heights[0])};
     if (from.planes == 1 && p.width % 2 == 0 && p.height > 0 &&
         p.y.stride == p.width * from.bytes[0] && p.dst.stride == p.width * p.pixel_bytes) {
         p.width *= p.height;
@@ -75,7 +76,8 @@ void convert_planes_to_rgb(const csc_args &a, const format &from, const format &
 
 using namespace simgp;
 
-#define DEFINE(name, from, to, rule) \
-    SIMGP_CSC_KERNEL(name, planes_kernel<formats::from, formats::to, yuv_rule::rule>(args))
+#define DEFINE(name, from, to, rule)              \
+    SIMGP_CSC_KERNEL(name, convert_planes_to_rgb( \
+                               conversion_of<formats::from, formats::to, yuv_rule::rule>(), args))
 SIMGP_YUV_TO_RGB_KERNELS(DEFINE)
 #undef DEFINE

@@ -274,10 +274,10 @@ TEST(resize, lines_in_pieces) {
         resize_by_formula(k, src, expected, x, y);
         rig::for_each_target([&, x = x, y = y](const rig::target_rows &) {
             got.fill_pattern(1);
-            const bool keep = random.below(2);
-            const simgp::resampling r(k.kind, x, y, keep);
+            const simgp::resampling r(k.kind, x, y);
+            const bool keep = r.keeps() && random.below(3);
             simgp::resample_memory<4096> memory;
-            const ptrdiff_t most = std::min<ptrdiff_t>(r.columns_in(memory.size, 1), 300);
+            const ptrdiff_t most = r.strip_width(300, memory.size);
             ASSERT_GE(most, 16);
             for (ptrdiff_t at = 0; at < width;) {
                 const ptrdiff_t columns =

@@ -19,7 +19,7 @@ constexpr pixel_format described(const simgp::coded_format &coded) {
     using simgp::format_kind;
     using simgp::yuv_layout;
     const simgp::format &f = *coded.is;
-    pixel_format d{coded.code, f.name, family::planar, f.planes, {}, {}};
+    pixel_format d{coded.code, f.name.text, family::planar, f.planes, {}, {}};
     for (int k = 0; k < f.planes; ++k) d.planes[k] = {f.bytes[k], f.x_shift[k], f.y_shift[k]};
     if (f.kind == format_kind::rgb) {
         const simgp::pixel_bytes at = simgp::pixels_of[size_t(f.packing)];
