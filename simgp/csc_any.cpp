@@ -112,7 +112,7 @@ void point_to_chroma(const format &f, const strip_rows &b, Band &to, Plane plane
 // Takes chroma pairs apart.
 void split_pairs(const job &j, bool v_first, const uint8_t *src, uint8_t *u, uint8_t *v,
                  ptrdiff_t pairs) {
-    j.layout.unpack(src, v_first ? v : u, v_first ? u : v, pairs);
+    j.layout.unpack(src, 0, v_first ? v : u, 0, v_first ? u : v, 0, pairs, 1);
 }
 
 void read_groups(const job &j, const strip_rows &b, yuv_strip &s) {
@@ -251,7 +251,7 @@ void write_groups(const job &j, const strip_rows &b, const planar_band &p) {
 
 void write_pairs(const job &j, const planar_band &p, uint8_t *dst, ptrdiff_t pairs) {
     const bool v_first = j.to.layout == yuv_layout::vu;
-    j.layout.pack(v_first ? p.v[0] : p.u[0], v_first ? p.u[0] : p.v[0], dst, pairs);
+    j.layout.pack(v_first ? p.v[0] : p.u[0], 0, v_first ? p.u[0] : p.v[0], 0, dst, 0, pairs, 1);
 }
 
 // Brings the samples of a band, which are as many as the destination has, from where they are to

@@ -35,6 +35,17 @@ static void unpack_pairs(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t p
         });
 }
 
+static void pack_lines(const uint8_t *a, ptrdiff_t stride_a, const uint8_t *b, ptrdiff_t stride_b,
+                       uint8_t *dst, ptrdiff_t dst_stride, ptrdiff_t pairs, ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        pack_pairs(a + y * stride_a, b + y * stride_b, dst + y * dst_stride, pairs);
+}
+static void unpack_lines(const uint8_t *src, ptrdiff_t src_stride, uint8_t *a, ptrdiff_t stride_a,
+                         uint8_t *b, ptrdiff_t stride_b, ptrdiff_t pairs, ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        unpack_pairs(src + y * src_stride, a + y * stride_a, b + y * stride_b, pairs);
+}
+
 // Planes, as far as a copy knows them.
 struct copied_lines {
     const uint8_t *src;
@@ -93,8 +104,8 @@ static void copy_vectors(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst,
 }
 
 void fill_layout(layout_rows &t) {
-    t.pack = pack_pairs;
-    t.unpack = unpack_pairs;
+    t.pack = pack_lines;
+    t.unpack = unpack_lines;
     t.copy = copy_vectors;
 }
 
