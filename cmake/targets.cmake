@@ -60,7 +60,7 @@ set(SIMGP_AREAS
   simgp/tile
   simgp/yuv2rgb)
 # Areas whose rows gain nothing by -O3: their loops are written out, and it only makes copies of them.
-set(SIMGP_SMALL_AREAS simgp/any simgp/resize simgp/rgb2yuv simgp/yuv2rgb)
+set(SIMGP_SMALL_AREAS simgp/any simgp/layout simgp/resize simgp/rgb2yuv simgp/yuv2rgb)
 set(area_macro "#define SIMGP_AREAS(X)")
 foreach(area IN LISTS SIMGP_AREAS)
   get_filename_component(stem ${area} NAME)

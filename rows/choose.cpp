@@ -94,17 +94,18 @@ target best = target::scalar;
 
 // The rows of a target take the place of the scalar ones.
 row_table &add_table(target t) {
+    constexpr ptrdiff_t vectors[] = {1, 16, 16, 32, 64};
     available[size_t(t)] = true;
     best = t;
-    return tables[size_t(t)] = tables[size_t(target::scalar)];
+    row_table &table = tables[size_t(t)] = tables[size_t(target::scalar)];
+    table.vector = vectors[size_t(t)];
+    return table;
 }
 
 // Rows shorter than the vectors of `wide` are left to those of `narrow`, if there are such.
-void leave_short_rows(target wide, target narrow, ptrdiff_t bytes) {
-    if (!available[size_t(wide)] || !available[size_t(narrow)]) return;
-    row_table &table = tables[size_t(wide)];
-    table.for_short = &tables[size_t(narrow)];
-    table.short_below = bytes;
+void leave_short_rows(target wide, target narrow) {
+    if (available[size_t(wide)] && available[size_t(narrow)])
+        tables[size_t(wide)].for_short = &tables[size_t(narrow)];
 }
 
 // Rows that suit the processor better than those of its instruction set in general.
@@ -137,8 +138,8 @@ void fill_tables() {
 #ifdef SIMGP_HAVE_avx512
     if (has.avx512) OFFER(avx512)
 #endif
-    leave_short_rows(target::avx2, target::sse41, 32);
-    leave_short_rows(target::avx512, target::avx2, 64);
+    leave_short_rows(target::avx2, target::sse41);
+    leave_short_rows(target::avx512, target::avx2);
     live_table.store(&tables[size_t(best)], std::memory_order_release);
 }
 #undef FILL
@@ -191,7 +192,7 @@ const row_table &choose_rows() {
 
 const row_table &live_rows(ptrdiff_t width) {
     const row_table *rows = &live_rows();
-    while (rows->for_short && width < rows->short_below) rows = rows->for_short;
+    while (rows->for_short && width < rows->vector) rows = rows->for_short;
     return *rows;
 }
 

@@ -1,4 +1,4 @@
-// Inner loops between layouts of YUV.
+// Inner loops between layouts of YUV, and the copy.
 #ifndef ROWS_LAYOUT_H
 #define ROWS_LAYOUT_H
 
@@ -7,14 +7,21 @@
 
 namespace simgp {
 
-// Interleaves and takes apart `pairs` >= 1 byte pairs: byte 2i is byte i of a, the next
-// byte i of b.
-using pack_row = void(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs);
-using unpack_row = void(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs);
+// Interleaves and takes apart `pairs` >= 1 byte pairs in each of `height` lines, which are so many bytes
+// apart: byte 2i is byte i of a, the next byte i of b.
+using pack_rows = void(const uint8_t *a, ptrdiff_t stride_a, const uint8_t *b, ptrdiff_t stride_b,
+                       uint8_t *dst, ptrdiff_t dst_stride, ptrdiff_t pairs, ptrdiff_t height);
+using unpack_rows = void(const uint8_t *src, ptrdiff_t src_stride, uint8_t *a, ptrdiff_t stride_a,
+                         uint8_t *b, ptrdiff_t stride_b, ptrdiff_t pairs, ptrdiff_t height);
+
+// Copies `height` lines of `size` >= 1 bytes, which must not overlap.
+using copy_rows = void(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst, ptrdiff_t dst_stride,
+                       ptrdiff_t size, ptrdiff_t height);
 
 struct layout_rows {
-    pack_row *pack;
-    unpack_row *unpack;
+    pack_rows *pack;
+    unpack_rows *unpack;
+    copy_rows *copy;
 };
 
 }  // namespace simgp

@@ -31,10 +31,10 @@ struct row_table {
     tile_rows tile;
     yuv2rgb_rows yuv2rgb;
 
-    // Rows of less than `short_below` samples are those of `for_short`, whose vectors are shorter;
-    // null: none are.
+    // The samples of a vector of bytes; 1 for scalar rows. Rows of less are those of `for_short`, whose
+    // vectors are shorter; null: none are.
+    ptrdiff_t vector;
     const row_table *for_short;
-    ptrdiff_t short_below;
 };
 
 }  // namespace simgp

@@ -1,8 +1,26 @@
-// Plane copy. The row is the memcpy() of the C library, which is as fast as libyuv's copies or
-// faster, in cache and out of it.
+// Plane copy. Lines without gaps are one, and that and long lines are left to the memcpy() of the C library,
+// which is as fast as libyuv's copies or faster, in cache and out of it. Calls of it for short lines are not.
 #include "simgp/copy.h"
 
+#include "rows/choose.h"
 #include "simgp/kernel.h"
+
+namespace simgp {
+
+void copy_lines(const const_lines &src, const lines &dst, ptrdiff_t width, ptrdiff_t height) {
+    constexpr ptrdiff_t long_line = 2048;
+    if (width < 1 || height < 1) return;
+    if (height == 1 || (src.stride == width && dst.stride == width)) {
+        memcpy(dst.first, src.first, size_t(width * height));
+        return;
+    }
+    if (width < long_line)
+        return live_rows(width).layout.copy(src.first, src.stride, dst.first, dst.stride, width,
+                                            height);
+    for (ptrdiff_t y = 0; y < height; y++) memcpy(dst.line(y), src.line(y), size_t(width));
+}
+
+}  // namespace simgp
 
 using namespace simgp;
 

@@ -37,6 +37,7 @@ struct job {
     int32_t colour;
     bool mean;
     ptrdiff_t width, height;
+    const row_table &live;
     const any_rows &rows;
     const layout_rows &layout;
 
@@ -111,7 +112,7 @@ void point_to_chroma(const format &f, const strip_rows &b, Band &to, Plane plane
 // Takes chroma pairs apart.
 void split_pairs(const job &j, bool v_first, const uint8_t *src, uint8_t *u, uint8_t *v,
                  ptrdiff_t pairs) {
-    j.layout.unpack(src, v_first ? v : u, v_first ? u : v, pairs);
+    j.layout.unpack(src, 0, v_first ? v : u, 0, v_first ? u : v, 0, pairs, 1);
 }
 
 void read_groups(const job &j, const strip_rows &b, yuv_strip &s) {
@@ -261,7 +262,7 @@ void write_groups(const job &j, const strip_rows &b, const planar_band &p) {
 
 void write_pairs(const job &j, const planar_band &p, uint8_t *dst, ptrdiff_t pairs) {
     const bool v_first = j.to.layout == yuv_layout::vu;
-    j.layout.pack(v_first ? p.v[0] : p.u[0], v_first ? p.u[0] : p.v[0], dst, pairs);
+    j.layout.pack(v_first ? p.v[0] : p.u[0], 0, v_first ? p.u[0] : p.v[0], 0, dst, 0, pairs, 1);
 }
 
 // Brings the samples of a band, which are as many as the destination has, from where they are to
@@ -383,38 +384,47 @@ chroma_in chroma_in_of(const format &f) {
     return f.layout == yuv_layout::full ? chroma_in::full : chroma_in::half;
 }
 
+// Rows with the weights that they take.
+struct rows_to_any {
+    const yuv_to_rgb &how;
+    any_to_rgb_row *row;
+    any_to_rgb_row_pair *row_pair;
+
+    void one(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+             ptrdiff_t width) const {
+        row(how, y, u, v, dst, width);
+    }
+    void two(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
+             uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) const {
+        row_pair(how, y0, y1, u, v, dst0, dst1, width);
+    }
+};
+
 void yuv_to_rgb_pictures(const job &j) {
     const yuv_to_rgb how{to_rgb_weights[j.colour], j.from.layout == yuv_layout::vu,
                          j.from.layout == yuv_layout::yuyv, is_blue_first(j.to.packing),
                          is_alpha_first(j.to.packing)};
     const size_t in = size_t(chroma_in_of(j.from)), kind = size_t(kind_of(j.to.packing));
-    any_to_rgb_row *const row = j.rows.to_rgb[in][kind];
-    any_to_rgb_row_pair *const row_pair = j.rows.to_rgb_pair[in][kind];
-    const bool shared_down = sharing_of(j.from).down;
+    const auto rows_in = [&](const row_table &t) {
+        return rows_to_any{how, t.any.to_rgb[in][kind], t.any.to_rgb_pair[in][kind]};
+    };
     const lines out = j.out(0);
     if (j.from.kind != format_kind::tiled && j.from.u >= 0) {
         // Rows read what lies in linear planes, whole lines of it.
-        const const_lines luma = j.in(0), u = j.in(j.from.u), v = j.in(j.from.v);
-        for (ptrdiff_t y = 0; y < j.height; y++) {
-            const ptrdiff_t line = y >> shared_down;
-            if (!shared_down || y + 1 == j.height) {
-                row(how, luma.line(y), u.line(line), v.line(line), out.line(y), j.width);
-                continue;
-            }
-            row_pair(how, luma.line(y), luma.line(y + 1), u.line(line), v.line(line), out.line(y),
-                     out.line(y + 1), j.width);
-            y++;
-        }
-        return;
+        const planes_to_rgb p{
+            j.from.layout, sharing_of(j.from).down, j.in(0), j.in(j.from.u), j.in(j.from.v),
+            out,           j.to.bytes[0],           j.width, j.height,       0};
+        return convert_planes(p, rows_in);
     }
+    const rows_to_any rows = rows_in(j.live);
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
         const planar_band p = read_band(j, b, strip);
         uint8_t *const dst = out.line(b.y) + b.x * j.to.bytes[0];
         if (b.rows == 2)
-            row_pair(how, p.y[0], p.y[1], p.u[0], p.v[0], dst, dst + out.stride, b.width);
+            rows.two(p.y[0], p.y[1], p.u[0], p.v[0], dst, dst + out.stride, b.width);
         else
-            row(how, p.y[0], p.u[0], p.v[0], dst, b.width);
+            rows.one(p.y[0], p.u[0], p.v[0], dst, b.width);
     });
 }
 
@@ -459,6 +469,36 @@ void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, cons
     j.rows.chroma(w, channels, u, v, width);
 }
 
+// The last pixels of lines, or of pairs of them, each as the first of two, whose second has no meaning.
+void convert_rgb_column(const job &j, const rgb_weights &w, any_to_yuv_row *row, int chroma_bytes,
+                        ptrdiff_t rows_at_once) {
+    const ptrdiff_t last = j.width - 1, at_once = rows_at_once;
+    const int size = j.from.bytes[0];
+    uint8_t pixels[2][4 * column_pixels] = {}, y[2][column_pixels], u[column_pixels],
+                          v[column_pixels];
+    const auto lines_of_plane = [&](int plane, ptrdiff_t x, ptrdiff_t row_at, ptrdiff_t apart) {
+        const lines of = j.out(plane);
+        return lines{of.line(row_at) + x, apart * of.stride};
+    };
+    in_column_blocks(j.height / at_once, column_pixels / 2, [&](ptrdiff_t first, ptrdiff_t count) {
+        const const_lines in = j.in(0);
+        for (ptrdiff_t r = 0; r < at_once; r++)
+            copy_column({in.line(at_once * first + r) + size * last, at_once * in.stride},
+                        {pixels[r], 2 * size}, size, count);
+        row(w, pixels[0], at_once == 2 ? pixels[1] : nullptr, y[0], y[1],
+            chroma_bytes ? u : nullptr, chroma_bytes == 1 ? v : nullptr, 2 * count);
+        for (ptrdiff_t r = 0; r < at_once; r++)
+            copy_column(const_lines{y[r], 2}, lines_of_plane(0, last, at_once * first + r, at_once),
+                        1, count);
+        if (!chroma_bytes) return;
+        const ptrdiff_t x = chroma_bytes * (last / 2);
+        copy_column(const_lines{u, chroma_bytes}, lines_of_plane(j.to.u, x, first, 1), chroma_bytes,
+                    count);
+        if (chroma_bytes == 1)
+            copy_column(const_lines{v, 1}, lines_of_plane(j.to.v, x, first, 1), 1, count);
+    });
+}
+
 void rgb_to_yuv_pictures(const job &j) {
     rgb_weights w = in_memory_order(to_yuv_weights[j.colour], j.from.packing);
     w.mean = averages(j);
@@ -475,13 +515,22 @@ void rgb_to_yuv_pictures(const job &j) {
         const int of_u = by_rows ? j.to.u : 0, of_v = by_rows ? j.to.v : 0;
         const const_lines in = j.in(0);
         const lines luma = j.out(0), u = j.out(of_u), v = j.out(of_v);
+        const ptrdiff_t chroma_bytes = !by_rows ? 0 : pairs ? 2 : 1;
+        const ptrdiff_t chroma_line = chroma_bytes * ((j.width + 1) / 2);
+        // Means would take the second of two.
+        const bool column = !w.mean && column_of(j.live, by_rows, j.width, j.height).width == 1 &&
+                            j.width > 1 && lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
+                            lie_apart(v, chroma_line);
         for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
             const bool two = to.down && y + 1 < j.height;
             const ptrdiff_t line = y >> to.down;
+            // The column has no row that is alone in its pair.
             row(w, in.line(y), two ? in.line(y + 1) : nullptr, luma.line(y),
                 two ? luma.line(y + 1) : nullptr, by_rows ? u.line(line) : nullptr,
-                planes ? v.line(line) : nullptr, j.width);
+                planes ? v.line(line) : nullptr,
+                column && (two || !to.down) ? j.width - 1 : j.width);
         }
+        if (column) convert_rgb_column(j, w, row, int(chroma_bytes), rows_at_once);
         return;
     }
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
@@ -505,11 +554,9 @@ void rgb_to_rgb(const job &j) {
                           is_alpha_first(j.from.packing), is_alpha_first(j.to.packing)};
     repack_row *const row =
         j.rows.repack[size_t(kind_of(j.from.packing))][size_t(kind_of(j.to.packing))];
-    const const_lines in = j.in(0);
-    const lines out = j.out(0);
-    if (in.stride == j.width * j.from.bytes[0] && out.stride == j.width * j.to.bytes[0])
-        return row(order, in.first, out.first, j.width * j.height);
-    for (ptrdiff_t y = 0; y < j.height; y++) row(order, in.line(y), out.line(y), j.width);
+    walk_one_plane(
+        j.live, j.in(0), j.from.bytes[0], j.out(0), j.to.bytes[0], j.width, j.height,
+        [&](const uint8_t *src, uint8_t *dst, ptrdiff_t count) { row(order, src, dst, count); });
 }
 
 // Equal formats.
@@ -537,7 +584,7 @@ int32_t simgp_csc_any(const simgp_img *src, const simgp_img *dst, int32_t colour
     if (colour == SIMGP_COLOUR_BT601 && simgp_csc(src, dst) == SIMGP_OK) return SIMGP_OK;
 
     const row_table &live = live_rows(width);
-    const job j{*from, *to, *src, *dst, matrix, mean, width, height, live.any, live.layout};
+    const job j{*from, *to, *src, *dst, matrix, mean, width, height, live, live.any, live.layout};
     if (from == to)
         copy_picture(j);
     else if (is_rgb(*from))

@@ -122,7 +122,7 @@ void dither_and_convert(const yuv_to_rgb_conversion &c, const csc_args &a) {
     if (c.from.u < 0) return convert_to_rgb(c, a, dithered_luma(a, a.src_heights[0]));
 
     constexpr int32_t tail = 4;
-    if (a.src_heights[0] < tail) return convert_to_rgb(c, a, src_lines(a, 0));
+    if (a.src_heights[0] < tail) return convert_planes_to_rgb(c, a);
 
     const int32_t body = a.src_heights[0] - tail;
     csc_args top = a;
@@ -141,7 +141,7 @@ void dither_and_convert(const yuv_to_rgb_conversion &c, const csc_args &a) {
     bottom.src_planes = src_planes;
     bottom.src_heights = &tail;
     bottom.dst_planes = dst_planes;
-    convert_to_rgb(c, bottom, src_lines(bottom, 0));
+    convert_planes_to_rgb(c, bottom);
 }
 
 #define DEFINE(name, source, target)                                                              \

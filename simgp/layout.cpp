@@ -10,18 +10,28 @@ namespace simgp {
 namespace scalar {
 namespace {
 
-void pack(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs) {
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        dst[2 * i] = a[i];
-        dst[2 * i + 1] = b[i];
-    }
+void pack(const uint8_t *a, ptrdiff_t stride_a, const uint8_t *b, ptrdiff_t stride_b, uint8_t *dst,
+          ptrdiff_t dst_stride, ptrdiff_t pairs, ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        for (ptrdiff_t i = 0; i < pairs; i++) {
+            dst[y * dst_stride + 2 * i] = a[y * stride_a + i];
+            dst[y * dst_stride + 2 * i + 1] = b[y * stride_b + i];
+        }
 }
 
-void unpack(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        a[i] = src[2 * i];
-        b[i] = src[2 * i + 1];
-    }
+void unpack(const uint8_t *src, ptrdiff_t src_stride, uint8_t *a, ptrdiff_t stride_a, uint8_t *b,
+            ptrdiff_t stride_b, ptrdiff_t pairs, ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        for (ptrdiff_t i = 0; i < pairs; i++) {
+            a[y * stride_a + i] = src[y * src_stride + 2 * i];
+            b[y * stride_b + i] = src[y * src_stride + 2 * i + 1];
+        }
+}
+
+void copy(const uint8_t *src, ptrdiff_t src_stride, uint8_t *dst, ptrdiff_t dst_stride,
+          ptrdiff_t size, ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        memcpy(dst + y * dst_stride, src + y * src_stride, size_t(size));
 }
 
 }  // namespace
@@ -29,6 +39,7 @@ void unpack(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
 void fill_layout(layout_rows &t) {
     t.pack = pack;
     t.unpack = unpack;
+    t.copy = copy;
 }
 
 }  // namespace scalar
@@ -47,8 +58,8 @@ void pack_plane(const const_lines &a, const const_lines &b, const lines &dst, pt
                 ptrdiff_t height) {
     if (pairs < 1 || height < 1) return;
     join_rows(pairs, height, a.stride, b.stride, dst.stride);
-    pack_row *const row = live_rows(2 * pairs).layout.pack;
-    for (ptrdiff_t y = 0; y < height; y++) row(a.line(y), b.line(y), dst.line(y), pairs);
+    live_rows(2 * pairs).layout.pack(a.first, a.stride, b.first, b.stride, dst.first, dst.stride,
+                                     pairs, height);
 }
 
 // `bytes` of a source row; the last of an odd number belongs to a.
@@ -57,11 +68,10 @@ void unpack_plane(const const_lines &src, const lines &a, const lines &b, ptrdif
     if (bytes < 1 || height < 1) return;
     ptrdiff_t pairs = bytes / 2;
     if (bytes % 2 == 0) join_rows(pairs, height, a.stride, b.stride, src.stride);
-    unpack_row *const row = live_rows(2 * pairs).layout.unpack;
-    for (ptrdiff_t y = 0; y < height; y++) {
-        if (pairs > 0) row(src.line(y), a.line(y), b.line(y), pairs);
-        if (bytes % 2) a.line(y)[pairs] = src.line(y)[2 * pairs];
-    }
+    if (pairs > 0)
+        live_rows(2 * pairs).layout.unpack(src.first, src.stride, a.first, a.stride, b.first,
+                                           b.stride, pairs, height);
+    if (bytes % 2) copy_lines(src.from(2 * pairs, 0), a.from(pairs, 0), 1, height);
 }
 
 void keep_every_second_row(const plane_args &a) {

@@ -35,16 +35,8 @@ inline lines lines_of(void *plane, ptrdiff_t stride) {
     return {static_cast<uint8_t *>(plane), stride};
 }
 
-// Copies `height` lines of `width` bytes, which must not overlap. Lines without gaps are one.
-inline void copy_lines(const const_lines &src, const lines &dst, ptrdiff_t width,
-                       ptrdiff_t height) {
-    if (width < 1 || height < 1) return;
-    if (src.stride == width && dst.stride == width) {
-        width *= height;
-        height = 1;
-    }
-    for (ptrdiff_t y = 0; y < height; y++) memcpy(dst.line(y), src.line(y), size_t(width));
-}
+// Copies `height` lines of `width` bytes, which must not overlap.
+void copy_lines(const const_lines &src, const lines &dst, ptrdiff_t width, ptrdiff_t height);
 
 }  // namespace simgp
 

@@ -62,27 +62,36 @@ void fill_rgb2yuv(rgb2yuv_rows &t) {
 namespace {
 
 // Even rows give luma and the chroma of their even pixels, if a row follows; the others luma.
-template <const format &From, const format &To>
-void rgb_to_yuv(const csc_args &a) {
+void rgb_to_yuv(const csc_args &a, const format &from, const format &to) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
-    const auto &to_layout = live_rows(width).rgb2yuv.row[size_t(From.packing)];
-    rgb_to_yuv_row *const with_chroma = to_layout[size_t(To.layout)];
+    const row_table &live = live_rows(width);
+    const auto &to_layout = live.rgb2yuv.row[size_t(from.packing)];
+    rgb_to_yuv_row *const with_chroma = to_layout[size_t(to.layout)];
     rgb_to_yuv_row *const luma_only = to_layout[size_t(yuv_layout::grey)];
-    const const_lines in = whole_pixel_lines(src_lines(a, 0), From.bytes[0]);
-    const lines luma = dst_lines(a, 0), u = dst_lines(a, To.u), v = dst_lines(a, To.v);
+    const int size = from.bytes[0];
+    const const_lines in = whole_pixel_lines(src_lines(a, 0), size);
+    const lines luma = dst_lines(a, 0), u = dst_lines(a, to.u), v = dst_lines(a, to.v);
+    // The last pixel of an odd row has no chroma.
+    column c = column_of(live, true, width, height);
+    if (c.x == 0 || !lie_apart(luma, width)) c = {};
     for (ptrdiff_t y = 0; y < height; y++) {
         const bool chroma = !(y & 1) && y + 1 < height;
         (chroma ? with_chroma : luma_only)(in.line(y), luma.line(y), u.line(y >> 1), v.line(y >> 1),
-                                           width);
+                                           width - c.width);
     }
+    if (c.width == 0) return;
+    convert_column(in, size, luma, 1, c, height,
+                   [=](const uint8_t *src, uint8_t *y, ptrdiff_t count) {
+                       luma_only(src, y, nullptr, nullptr, count);
+                   });
 }
 
-template <const format &From, const format &To>
-void rgb_to_rgb565(const csc_args &a) {
-    walk_one_plane(a, whole_pixel_lines(src_lines(a, 0), From.bytes[0]), From.bytes[0],
-                   whole_pixel_lines(dst_lines(a, 0), To.bytes[0]), To.bytes[0],
-                   live_rows(a.src_widths[0]).rgb2yuv.to_rgb565[size_t(From.packing)]);
+void rgb_to_rgb565(const csc_args &a, const format &from, const format &to) {
+    const row_table &live = live_rows(a.src_widths[0]);
+    walk_one_plane(live, whole_pixel_lines(src_lines(a, 0), from.bytes[0]), from.bytes[0],
+                   whole_pixel_lines(dst_lines(a, 0), to.bytes[0]), to.bytes[0], a.src_widths[0],
+                   a.src_heights[0], live.rgb2yuv.to_rgb565[size_t(from.packing)]);
 }
 
 }  // namespace
@@ -90,10 +99,10 @@ void rgb_to_rgb565(const csc_args &a) {
 
 using namespace simgp;
 
-#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, rgb_to_yuv<formats::from, formats::to>(args))
+#define DEFINE(name, from, to) SIMGP_CSC_KERNEL(name, rgb_to_yuv(args, formats::from, formats::to))
 SIMGP_RGB_TO_YUV_KERNELS(DEFINE)
 #undef DEFINE
 #define DEFINE(name, from, to) \
-    SIMGP_CSC_KERNEL(name, rgb_to_rgb565<formats::from, formats::to>(args))
+    SIMGP_CSC_KERNEL(name, rgb_to_rgb565(args, formats::from, formats::to))
 SIMGP_RGB_TO_RGB565_KERNELS(DEFINE)
 #undef DEFINE

@@ -104,11 +104,11 @@ void unpack_to_linear(const uint8_t *src, ptrdiff_t width, ptrdiff_t height, con
             return table.tile.detile_unpack(tile, to_u.first, u.stride, to_v.first, v.stride,
                                             b.height);
         const ptrdiff_t pairs = b.width / 2;
-        for (ptrdiff_t r = 0; r < b.height; r++) {
-            const uint8_t *const from = tile + tile_width * r;
-            if (pairs > 0) table.layout.unpack(from, to_u.line(r), to_v.line(r), pairs);
-            if (b.width & 1) to_u.line(r)[pairs] = from[2 * pairs];
-        }
+        if (pairs > 0)
+            table.layout.unpack(tile, tile_width, to_u.first, u.stride, to_v.first, v.stride, pairs,
+                                b.height);
+        if (b.width & 1)
+            copy_lines({tile + 2 * pairs, tile_width}, to_u.from(pairs, 0), 1, b.height);
     });
 }
 
@@ -121,9 +121,8 @@ void pack_from_linear(const const_lines &u, const const_lines &v, ptrdiff_t widt
         if (is_whole(b))
             return table.tile.entile_pack(from_u.first, u.stride, from_v.first, v.stride, tile,
                                           b.height);
-        for (ptrdiff_t r = 0; r < b.height; r++)
-            table.layout.pack(from_u.line(r), from_v.line(r), tile + tile_width * r,
-                              (b.width + 1) / 2);
+        table.layout.pack(from_u.first, u.stride, from_v.first, v.stride, tile, tile_width,
+                          (b.width + 1) / 2, b.height);
     });
 }
 

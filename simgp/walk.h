@@ -7,9 +7,14 @@
 #define SIMGP_WALK_H
 
 #include "rows/choose.h"
+#include "simgp/column.h"
 #include "simgp/kernel.h"
 
 namespace simgp {
+
+// Rows do not look at the planes that their layout does not use.
+constexpr int plane_of_u(const format &f) { return f.u < 0 ? 0 : f.u; }
+constexpr int plane_of_v(const format &f) { return f.v < 0 ? 0 : f.v; }
 
 // Whether some kernel needs a row, so that the tables have it.
 constexpr bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, yuv_matrix matrix) {
@@ -93,9 +98,7 @@ template <class Luma>
 void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&luma) {
     const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
     if (width < 1) return;
-    // Rows do not look at the planes that their layout does not use.
-    const const_lines u = src_lines(a, c.from.u < 0 ? 0 : c.from.u);
-    const const_lines v = src_lines(a, c.from.v < 0 ? 0 : c.from.v);
+    const const_lines u = src_lines(a, plane_of_u(c.from)), v = src_lines(a, plane_of_v(c.from));
     const lines dst = dst_lines(a, 0);
     const yuv2rgb_rows &live = live_rows(width).yuv2rgb;
     const size_t m = size_t(matrix_of(c.rule)), l = size_t(c.from.layout);
@@ -108,16 +111,94 @@ void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&lu
         walk_rows(live.row[m][l][p], luma, u, v, dst, 0, span, lead);
 }
 
-// Calls row(in, out, width) for every row of a picture of one plane on either side, whose pixels
-// have so many bytes. Lines of an even width that lie end to end are one long row.
+// Converts the first `width` pixels of rows, but all of those that have a chroma line to themselves.
+template <class Rows>
+[[gnu::noinline]] void walk_planes(const planes_to_rgb &p, const Rows &rows, ptrdiff_t width) {
+    const const_lines y = p.y, u = p.u, v = p.v;
+    const lines dst = p.dst;
+    const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
+    // Offsets are added up: in small pictures, products for every line would be seen.
+    ptrdiff_t at_y = p.lead * y.stride, at_u = p.lead * u.stride, at_v = p.lead * v.stride,
+              at_dst = p.lead * dst.stride;
+    if (width > 0 && p.two_rows) {
+        for (ptrdiff_t k = units; k > 0; k--) {
+            const uint8_t *const luma = y.first + at_y;
+            uint8_t *const out = dst.first + at_dst;
+            rows.two(luma, luma + y.stride, u.first + at_u, v.first + at_v, out, out + dst.stride,
+                     width);
+            at_y += 2 * y.stride;
+            at_u += u.stride;
+            at_v += v.stride;
+            at_dst += 2 * dst.stride;
+        }
+    } else if (width > 0 && !has_chroma_planes(p.layout)) {
+        for (ptrdiff_t k = units; k > 0; k--) {
+            rows.one(y.first + at_y, nullptr, nullptr, dst.first + at_dst, width);
+            at_y += y.stride;
+            at_dst += dst.stride;
+        }
+    } else if (width > 0) {
+        for (ptrdiff_t k = units; k > 0; k--) {
+            rows.one(y.first + at_y, u.first + at_u, v.first + at_v, dst.first + at_dst, width);
+            at_y += y.stride;
+            at_u += u.stride;
+            at_v += v.stride;
+            at_dst += dst.stride;
+        }
+    }
+    if (!p.two_rows || p.height < 1) return;
+    const auto alone = [&](ptrdiff_t row, ptrdiff_t chroma) {
+        rows.two(y.line(row), y.line(row), u.line(chroma), v.line(chroma), dst.line(row),
+                 dst.line(row), p.width);
+    };
+    if (p.lead) alone(0, 0);
+    if ((p.height - p.lead) % 2) alone(p.height - 1, p.lead + units);
+}
+
+// Converts a picture of planes. rows_of(table) gives rows.one(y, u, v, dst, width) for one row and
+// rows.two(y0, y1, u, v, dst0, dst1, width) for two.
+template <class RowsOf>
+void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_of) {
+    const ptrdiff_t block = column_pixels / pitch_of(c);
+    const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
+    const auto rows = rows_of(live_rows(pitch_of(c) * (units < block ? units : block)));
+    pixel_column at;
+    in_column_blocks(units, block, [&](ptrdiff_t first, ptrdiff_t count) {
+        gather_column(p, c, first, count, at);
+        if (p.two_rows)
+            rows.two(at.y[0], at.y[1], at.u, at.v, at.rgb[0], at.rgb[1], pitch_of(c) * count);
+        else
+            rows.one(at.y[0], at.u, at.v, at.rgb[0], pitch_of(c) * count);
+        scatter_column(at, p, c, first, count);
+    });
+}
+template <class RowsOf>
+void convert_planes(const planes_to_rgb &p, const RowsOf &rows_of) {
+    if (p.width < 1) return;
+    const row_table &live = live_rows(p.width);
+    const auto rows = rows_of(live);
+    column c = column_of(live, chroma_is_shared(p.layout), p.width, p.height);
+    if (!lie_apart(p.dst, p.width * p.pixel_bytes)) c = {};
+    walk_planes(p, rows, p.width - c.width);
+    if (c.width > 0) convert_column(p, c, rows_of);
+}
+
+// The same for the picture of a kernel. Of one plane, lines of an even width that lie end to end are one
+// long row.
+void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a);
+
+// Converts a picture of one plane on either side, whose pixels have so many bytes, by row(in, out,
+// width). Lines that lie end to end are one long row.
 template <class Row>
-void walk_one_plane(const csc_args &a, const const_lines &in, int in_bytes, const lines &out,
-                    int out_bytes, Row row) {
-    const ptrdiff_t width = a.src_widths[0], height = a.src_heights[0];
+void walk_one_plane(const row_table &live, const const_lines &in, int in_bytes, const lines &out,
+                    int out_bytes, ptrdiff_t width, ptrdiff_t height, Row row) {
     if (width < 1 || height < 1) return;
-    if (width % 2 == 0 && in.stride == width * in_bytes && out.stride == width * out_bytes)
+    if (in.stride == width * in_bytes && out.stride == width * out_bytes)
         return row(in.first, out.first, width * height);
-    for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), width);
+    column c = column_of(live, false, width, height);
+    if (c.x == 0 || !lie_apart(out, width * out_bytes)) c = {};
+    for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), width - c.width);
+    if (c.width > 0) convert_column(in, in_bytes, out, out_bytes, c, height, row);
 }
 
 }  // namespace simgp

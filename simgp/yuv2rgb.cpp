@@ -39,13 +39,45 @@ void fill_yuv2rgb(yuv2rgb_rows &t) {
 }
 
 }  // namespace scalar
+
+namespace {
+
+struct rows_to_rgb {
+    yuv_to_rgb_row *one;
+    yuv_to_rgb_row_pair *two;
+};
+
+}  // namespace
+
+void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a) {
+    const format &from = c.from, &to = c.to;
+    const size_t m = size_t(matrix_of(c.rule)), l = size_t(from.layout), k = size_t(to.packing);
+    planes_to_rgb p{from.layout,
+                    serves_two_rows(from),
+                    src_lines(a, 0),
+                    src_lines(a, plane_of_u(from)),
+                    src_lines(a, plane_of_v(from)),
+                    dst_lines(a, 0),
+                    to.bytes[0],
+                    a.src_widths[0],
+                    a.src_heights[0],
+                    lead_of(c.rule, a.src_widths[0], a.src_heights[0])};
+    if (from.planes == 1 && p.width % 2 == 0 && p.height > 0 &&
+        p.y.stride == p.width * from.bytes[0] && p.dst.stride == p.width * p.pixel_bytes) {
+        p.width *= p.height;
+        p.height = 1;
+    }
+    convert_planes(p, [=](const row_table &t) {
+        return rows_to_rgb{t.yuv2rgb.row[m][l][k], t.yuv2rgb.pair[m][l][k]};
+    });
+}
+
 }  // namespace simgp
 
 using namespace simgp;
 
-#define DEFINE(name, from, to, rule)                                                            \
-    SIMGP_CSC_KERNEL(                                                                           \
-        name, convert_to_rgb(conversion_of<formats::from, formats::to, yuv_rule::rule>(), args, \
-                             src_lines(args, 0)))
+#define DEFINE(name, from, to, rule)              \
+    SIMGP_CSC_KERNEL(name, convert_planes_to_rgb( \
+                               conversion_of<formats::from, formats::to, yuv_rule::rule>(), args))
 SIMGP_YUV_TO_RGB_KERNELS(DEFINE)
 #undef DEFINE

@@ -109,7 +109,7 @@ inline void in_pair_steps(ptrdiff_t pairs, Whole whole, Half half, One one) {
         return;
     }
     if (pairs < bytes) {
-        half(0);
+        if (pairs > bytes / 2) half(0);
         return half(pairs - bytes / 2);
     }
     ptrdiff_t i = 0;
