@@ -91,6 +91,7 @@ inline const std::vector<std::string> small_operations = {"yuv420_to_rgb565",
                                                           "nv12_to_yuv420",
                                                           "cpy_8b",
                                                           "cpy_32b",
+                                                          "any_yuv420_to_rgba8888",
                                                           "any_rgba8888_to_nv12",
                                                           "any_yuyv_to_yuv420",
                                                           "any_rgb888_to_bgra8888"};

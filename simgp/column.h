@@ -21,13 +21,15 @@ struct column {
 // As many pixels lie side by side at most.
 inline constexpr ptrdiff_t column_pixels = 128;
 
-// The column that a walk over a picture leaves out of its rows. Steps that may begin at any pixel do one
-// more at no cost, unless nothing else is left for the last of them.
-inline column column_of(const row_table &rows, bool steps_of_pairs, ptrdiff_t width,
-                        ptrdiff_t height) {
+// The column that a walk over a picture leaves out of its rows: the whole picture, if it has less than
+// `narrow` pixels across; or the last pixel. Steps that may begin at any pixel do one more at no cost, unless
+// nothing else is left for the last of them.
+inline column column_of(const row_table &rows, bool steps_of_pairs, ptrdiff_t narrow,
+                        ptrdiff_t width, ptrdiff_t height) {
     if (rows.vector <= 1 || height < 4) return {};
-    if (width < rows.vector) return {0, width};
-    if ((width & 1) == 0 || (!steps_of_pairs && width % rows.vector != 1)) return {};
+    if (width < narrow) return {0, width};
+    if (width < rows.vector || (width & 1) == 0 || (!steps_of_pairs && width % rows.vector != 1))
+        return {};
     return {width - 1, 1};
 }
 

@@ -414,7 +414,8 @@ void yuv_to_rgb_pictures(const job &j) {
         const planes_to_rgb p{
             j.from.layout, sharing_of(j.from).down, j.in(0), j.in(j.from.u), j.in(j.from.v),
             out,           j.to.bytes[0],           j.width, j.height,       0};
-        return convert_planes(p, rows_in);
+        // A row makes vectors of the weights first, which takes as long as half of the widest one.
+        return convert_planes(p, live_rows().vector > 32 ? 32 : 16, rows_in);
     }
     const rows_to_any rows = rows_in(j.live);
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
@@ -518,8 +519,8 @@ void rgb_to_yuv_pictures(const job &j) {
         const ptrdiff_t chroma_bytes = !by_rows ? 0 : pairs ? 2 : 1;
         const ptrdiff_t chroma_line = chroma_bytes * ((j.width + 1) / 2);
         // Means would take the second of two.
-        const bool column = !w.mean && column_of(j.live, by_rows, j.width, j.height).width == 1 &&
-                            j.width > 1 && lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
+        const bool column = !w.mean && column_of(j.live, by_rows, 0, j.width, j.height).width > 0 &&
+                            lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
                             lie_apart(v, chroma_line);
         for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
             const bool two = to.down && y + 1 < j.height;

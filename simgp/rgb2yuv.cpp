@@ -73,8 +73,8 @@ void rgb_to_yuv(const csc_args &a, const format &from, const format &to) {
     const const_lines in = whole_pixel_lines(src_lines(a, 0), size);
     const lines luma = dst_lines(a, 0), u = dst_lines(a, to.u), v = dst_lines(a, to.v);
     // The last pixel of an odd row has no chroma.
-    column c = column_of(live, true, width, height);
-    if (c.x == 0 || !lie_apart(luma, width)) c = {};
+    column c = column_of(live, true, 0, width, height);
+    if (!lie_apart(luma, width)) c = {};
     for (ptrdiff_t y = 0; y < height; y++) {
         const bool chroma = !(y & 1) && y + 1 < height;
         (chroma ? with_chroma : luma_only)(in.line(y), luma.line(y), u.line(y >> 1), v.line(y >> 1),

@@ -172,12 +172,13 @@ void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_
         scatter_column(at, p, c, first, count);
     });
 }
+// Pictures narrower than `narrow` are a column.
 template <class RowsOf>
-void convert_planes(const planes_to_rgb &p, const RowsOf &rows_of) {
+void convert_planes(const planes_to_rgb &p, ptrdiff_t narrow, const RowsOf &rows_of) {
     if (p.width < 1) return;
     const row_table &live = live_rows(p.width);
     const auto rows = rows_of(live);
-    column c = column_of(live, chroma_is_shared(p.layout), p.width, p.height);
+    column c = column_of(live, chroma_is_shared(p.layout), narrow, p.width, p.height);
     if (!lie_apart(p.dst, p.width * p.pixel_bytes)) c = {};
     walk_planes(p, rows, p.width - c.width);
     if (c.width > 0) convert_column(p, c, rows_of);
@@ -195,8 +196,8 @@ void walk_one_plane(const row_table &live, const const_lines &in, int in_bytes, 
     if (width < 1 || height < 1) return;
     if (in.stride == width * in_bytes && out.stride == width * out_bytes)
         return row(in.first, out.first, width * height);
-    column c = column_of(live, false, width, height);
-    if (c.x == 0 || !lie_apart(out, width * out_bytes)) c = {};
+    column c = column_of(live, false, 0, width, height);
+    if (!lie_apart(out, width * out_bytes)) c = {};
     for (ptrdiff_t y = 0; y < height; y++) row(in.line(y), out.line(y), width - c.width);
     if (c.width > 0) convert_column(in, in_bytes, out, out_bytes, c, height, row);
 }

@@ -67,7 +67,8 @@ void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a) {
         p.width *= p.height;
         p.height = 1;
     }
-    convert_planes(p, [=](const row_table &t) {
+    // The shortest vectors have 16 bytes.
+    convert_planes(p, 16, [=](const row_table &t) {
         return rows_to_rgb{t.yuv2rgb.row[m][l][k], t.yuv2rgb.pair[m][l][k]};
     });
 }
