@@ -75,10 +75,12 @@ CALL(call_chroma, chroma_row, to_yuv_how, channels_in, d, e, n)
 CALL(call_split_pixels, split_pixels_row, a, channels, n)
 CALL(call_repack, repack_row, order, a, d, n)
 CALL(call_join_groups, join_groups_row, a, b, c, d, n, true)
-CALL(call_split_groups, split_groups_row, a, nullptr, d, e, f, n, true)
-CALL(call_split_luma, split_groups_row, a, nullptr, d, nullptr, nullptr, n, true)
-CALL(call_split_to_pairs, split_groups_row, a, nullptr, d, e, nullptr, n, true)
-CALL(call_split_means, split_groups_row, a, b, d, e, f, n, true)
+#define SPLIT(v, shared, mean) \
+    { a, second, d, second, e, second, v, second, n, 2, true, shared, mean }
+CALL(call_split_groups, split_groups_rows, SPLIT(f, false, false))
+CALL(call_split_to_planes, split_groups_rows, SPLIT(f, true, false))
+CALL(call_split_to_pairs, split_groups_rows, SPLIT(nullptr, true, false))
+CALL(call_split_means, split_groups_rows, SPLIT(f, true, true))
 CALL(call_mean, mean_row, a, b, d, n)
 CALL(call_mean_of_blocks, mean_of_blocks_rows, a, b, 0, d, 0, n, 1)
 CALL(call_resample, resample_row, a, d, n)
@@ -187,10 +189,13 @@ void list_any(const any_rows &n, const any_rows &s) {
         add(named("any split %s", rgb_ins[k]), n.split_pixels[k], s.split_pixels[k],
             call_split_pixels);
     add("any chroma", n.chroma, s.chroma, call_chroma);
-    add("any split groups", n.split_groups, s.split_groups, call_split_groups, 2);
-    add("any split groups, luma alone", n.split_groups, s.split_groups, call_split_luma, 2);
-    add("any split groups, pairs", n.split_groups, s.split_groups, call_split_to_pairs, 2);
-    add("any split groups, means", n.split_groups, s.split_groups, call_split_means, 2);
+    const auto split = [&](const char *name, auto call) {
+        add(name, n.split_groups, s.split_groups, call, 4);
+    };
+    split("any split groups, two", call_split_groups);
+    split("any split groups to planes, two", call_split_to_planes);
+    split("any split groups to pairs, two", call_split_to_pairs);
+    split("any split groups, means, two", call_split_means);
     add("any join groups", n.join_groups, s.join_groups, call_join_groups, 2);
     add("any mean of lines", n.mean_of_lines, s.mean_of_lines, call_mean);
     add("any mean of blocks", n.mean_of_blocks, s.mean_of_blocks, call_mean_of_blocks);

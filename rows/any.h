@@ -91,11 +91,25 @@ struct repacking {
 };
 using repack_row = void(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count);
 
-// Takes `pairs` >= 1 pairs of pixels apart, bytes Y U Y V or U Y V Y: luma, and chroma, or its rounded
-// mean with that of the line `other`, unless this is null, to u and v, or, if v is null, to u as pairs
-// U V, or, if u is null, not at all. And puts them together.
-using split_groups_row = void(const uint8_t *src, const uint8_t *other, uint8_t *y, uint8_t *u,
-                              uint8_t *v, ptrdiff_t pairs, bool luma_first);
+// Takes lines of packed 4:2:2 apart, bytes Y U Y V or U Y V Y: luma to y, chroma to u and v, or, if v is
+// null, to u as pairs U V.
+struct groups_split {
+    const uint8_t *src;
+    ptrdiff_t stride;
+    uint8_t *y;
+    ptrdiff_t y_stride;
+    uint8_t *u;
+    ptrdiff_t u_stride;
+    uint8_t *v;
+    ptrdiff_t v_stride;
+    ptrdiff_t pairs, rows;  // pairs of pixels, and lines, at least one
+    bool luma_first;
+    bool shared;  // a line of chroma for two rows: that of the first,
+    bool mean;    // or the rounded mean of both, as far as there are
+};
+using split_groups_rows = void(const groups_split &s);
+
+// Puts `pairs` >= 1 pairs of pixels together.
 using join_groups_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                              ptrdiff_t pairs, bool luma_first);
 
@@ -117,7 +131,7 @@ struct any_rows {
     chroma_row *chroma;
     split_pixels_row *split_pixels[size_t(rgb_in::count)];
     repack_row *repack[size_t(pixel_kind::count)][size_t(pixel_kind::count)];
-    split_groups_row *split_groups;
+    split_groups_rows *split_groups;
     join_groups_row *join_groups;
     mean_row *mean_of_lines;
     mean_of_blocks_rows *mean_of_blocks;

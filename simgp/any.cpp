@@ -146,18 +146,24 @@ void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t 
     }
 }
 
-void split_groups(const uint8_t *src, const uint8_t *other, uint8_t *y, uint8_t *u, uint8_t *v,
-                  ptrdiff_t pairs, bool luma_first) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    const auto sample = [=](ptrdiff_t at) {
-        return other ? uint8_t((src[at] + other[at] + 1) >> 1) : src[at];
-    };
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        y[2 * i] = src[4 * i + luma];
-        y[2 * i + 1] = src[4 * i + luma + 2];
-        if (!u) continue;
-        u[v ? i : 2 * i] = sample(4 * i + of_u);
-        (v ? v[i] : u[2 * i + 1]) = sample(4 * i + of_u + 2);
+void split_groups(const groups_split &s) {
+    const int luma = s.luma_first ? 0 : 1, of_u = s.luma_first ? 1 : 0;
+    for (ptrdiff_t row = 0; row < s.rows; row++) {
+        const uint8_t *const src = s.src + row * s.stride;
+        for (ptrdiff_t x = 0; x < 2 * s.pairs; x++) s.y[row * s.y_stride + x] = src[2 * x + luma];
+        if (s.shared && row & 1) continue;
+        // The mean of a line and itself is the line.
+        const bool both = s.shared && s.mean && row + 1 < s.rows;
+        const uint8_t *const other = both ? src + s.stride : src;
+        const ptrdiff_t line = s.shared ? row / 2 : row;
+        for (ptrdiff_t i = 0; i < s.pairs; i++) {
+            const auto sample = [=](ptrdiff_t at) {
+                return uint8_t((src[at] + other[at] + 1) >> 1);
+            };
+            uint8_t *const u = s.u + line * s.u_stride + (s.v ? i : 2 * i);
+            u[0] = sample(4 * i + of_u);
+            (s.v ? s.v[line * s.v_stride + i] : u[1]) = sample(4 * i + of_u + 2);
+        }
     }
 }
 void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,

@@ -117,13 +117,15 @@ void split_pairs(const job &j, bool v_first, const uint8_t *src, uint8_t *u, uin
 
 void read_groups(const job &j, const strip_rows &b, yuv_strip &s) {
     const bool luma_first = j.from.layout == yuv_layout::yuyv;
+    const const_lines in = j.in(0).from(2 * b.x, b.y);
+    const ptrdiff_t whole = b.width / 2;
+    if (whole)
+        j.rows.split_groups({in.first, in.stride, s.y[0], strip_width, s.u[0], strip_width, s.v[0],
+                             strip_width, whole, b.rows, luma_first, false, false});
+    if (!(b.width & 1)) return;
     for (ptrdiff_t r = 0; r < b.rows; r++) {
-        const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x;
-        const ptrdiff_t whole = b.width / 2;
-        if (whole) j.rows.split_groups(src, nullptr, s.y[r], s.u[r], s.v[r], whole, luma_first);
-        if (!(b.width & 1)) continue;
         // The V of a half group would lie behind the line.
-        const uint8_t *const group = src + 4 * whole;
+        const uint8_t *const group = in.line(r) + 4 * whole;
         s.y[r][2 * whole] = group[!luma_first];
         s.u[r][whole] = group[luma_first];
         s.v[r][whole] = b.x + whole ? group[luma_first - 2] : 128;
@@ -301,25 +303,20 @@ void groups_to_420(const job &j) {
     const const_lines in = j.in(0);
     const lines luma = j.out(0), of_u = j.out(j.to.u), of_v = j.out(j.to.v);
     const ptrdiff_t whole = j.width & ~ptrdiff_t(1);
+    if (whole)
+        j.rows.split_groups({in.first, in.stride, luma.first, luma.stride, of_u.first, of_u.stride,
+                             pairs ? nullptr : of_v.first, of_v.stride, whole / 2, j.height,
+                             luma_first, true, j.mean});
+    if (whole == j.width) return;
     for (ptrdiff_t y = 0; y < j.height; y++) {
-        // Chroma comes with the first line of two, or, as a mean, with the second.
-        const bool gives = y & 1 ? j.mean : !j.mean || y + 1 == j.height;
-        const uint8_t *const line = in.line(y), *const other = y & 1 ? in.line(y - 1) : nullptr;
-        uint8_t *const u = gives ? of_u.line(y >> 1) : nullptr;
-        uint8_t *const v = gives ? of_v.line(y >> 1) + pairs : nullptr;
-        if (whole)
-            j.rows.split_groups(line, other, luma.line(y), u, pairs ? nullptr : v, whole / 2,
-                                luma_first);
-        if (whole == j.width) continue;
-        const uint8_t *const last = line + 2 * whole;
+        const uint8_t *const last = in.line(y) + 2 * whole;
         luma.line(y)[whole] = last[!luma_first];
-        if (!gives) continue;
-        const auto sample = [&](int at) {
-            return other ? uint8_t((last[at] + other[2 * whole + at] + 1) >> 1) : last[at];
-        };
+        if (y & 1) continue;
+        const uint8_t *const below = j.mean && y + 1 < j.height ? last + in.stride : last;
+        const auto mean = [&](int at) { return uint8_t((last[at] + below[at] + 1) >> 1); };
         const ptrdiff_t at = pairs ? whole : whole / 2;
-        u[at] = sample(luma_first);
-        v[at] = whole ? sample(luma_first - 2) : 128;
+        of_u.line(y >> 1)[at] = mean(luma_first);
+        of_v.line(y >> 1)[at + pairs] = whole ? mean(luma_first - 2) : 128;
     }
 }
 
@@ -584,7 +581,8 @@ int32_t simgp_csc_any(const simgp_img *src, const simgp_img *dst, int32_t colour
     if (width < 1 || height < 1) return SIMGP_OK;
     if (colour == SIMGP_COLOUR_BT601 && simgp_csc(src, dst) == SIMGP_OK) return SIMGP_OK;
 
-    const row_table &live = live_rows(width);
+    // From YUV to YUV it is rows of chroma that are the shortest.
+    const row_table &live = live_rows(is_rgb(*from) || is_rgb(*to) ? width : (width + 1) / 2);
     const job j{*from, *to, *src, *dst, matrix, mean, width, height, live, live.any, live.layout};
     if (from == to)
         copy_picture(j);
