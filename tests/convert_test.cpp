@@ -638,8 +638,8 @@ TEST_F(convert_test, the_list_names_formats_colours_and_dithered_conversions) {
     EXPECT_NE(got.err.find("bgr565 -> uyvy\n"), std::string::npos) << got.err;
 }
 
-// Nothing in the first half second, and not twice at once; a bar that fills the line but for its last
-// place, half of it done.
+// Nothing in the first half second; then a bar that fills the line but for its last place, half of it
+// done.
 TEST(progress, is_a_bar_as_wide_as_the_terminal) {
     const int terminal = posix_openpt(O_RDWR | O_NOCTTY);
     ASSERT_TRUE(terminal >= 0 && grantpt(terminal) == 0 && unlockpt(terminal) == 0);
@@ -652,20 +652,17 @@ TEST(progress, is_a_bar_as_wide_as_the_terminal) {
         bar.show(1, 0.1);
         usleep(600'000);
         bar.show(10, 0.5);
-        bar.show(11, 0.6);
     }
     dup2(kept, STDERR_FILENO);
     char said[256] = {};
     ASSERT_GT(read(terminal, said, sizeof said - 1), 0);
     for (int descriptor : {terminal, line, kept}) close(descriptor);
     const std::string text = said, end = "/s\033[K\r\033[K";
-    const auto count = [&](char c) { return std::count(text.begin(), text.end(), c); };
     const size_t bar_end = text.find("]  50%  10 frames  ");
     ASSERT_NE(bar_end, std::string::npos) << text;
-    EXPECT_EQ(text.substr(0, 2), "\r[");
-    EXPECT_EQ(text.substr(2, bar_end - 2), std::string(size_t(count('#')), '#') +
-                                               std::string(bar_end - 2 - size_t(count('#')), '.'));
-    EXPECT_EQ(count('#'), (bar_end - 2) / 2);
+    const size_t done = (bar_end - 2) / 2;
+    EXPECT_EQ(text.substr(0, bar_end),
+              "\r[" + std::string(done, '#') + std::string(bar_end - 2 - done, '.'));
     EXPECT_EQ(text.size(), 1 + 39 + end.size() - 2) << text;
     EXPECT_EQ(text.substr(text.size() - end.size()), end);
 }

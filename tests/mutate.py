@@ -83,7 +83,7 @@ NO_TOOLS = "-DSIMGP_BUILD_TOOLS=OFF"
 TOOLCHAINS = "-DCMAKE_TOOLCHAIN_FILE=cmake/toolchains/"
 COPIES = {
     "rows": ([], [], [ONE_SET, NO_LANES]),
-    "choose": ([NO_TOOLS], [], [areas("simgp/layout simgp/yuv2rgb")]),  # the rows that its test looks at
+    "choose": ([NO_TOOLS], [], [areas("scmn/mem simgp/layout simgp/yuv2rgb")]),  # the rows that its test looks at
     "x86": ([NO_TOOLS], [], [areas("scmn/keyframe"), NO_LANES]),
     "aarch64": ([NO_TOOLS, TOOLCHAINS + "aarch64-linux-gnu.cmake"],
                 ["qemu-aarch64", "-L", "/usr/aarch64-linux-gnu"], [areas("scmn/keyframe"), NO_LANES]),
