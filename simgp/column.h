@@ -41,15 +41,14 @@ inline bool lie_apart(const lines &dst, ptrdiff_t bytes) {
 // Copies `count` short lines.
 void copy_column(const const_lines &from, const lines &to, ptrdiff_t bytes, ptrdiff_t count);
 
-// Calls f(first, count) for blocks of `height` lines. The last one ends at the last line and may do some
-// again.
+// Calls f(first, count) for blocks of `height` lines, at most `block` each and about the same number. No line
+// is done again: its pixels may lie over its samples.
 template <class F>
 void in_column_blocks(ptrdiff_t height, ptrdiff_t block, F f) {
-    const ptrdiff_t count = height < block ? height : block;
-    for (ptrdiff_t end = count;; end += count) {
-        if (end > height) end = height;
-        f(end - count, count);
-        if (end == height) return;
+    for (ptrdiff_t y = 0, left = (height + block - 1) / block; left > 0; left--) {
+        const ptrdiff_t count = (height - y) / left;
+        f(y, count);
+        y += count;
     }
 }
 

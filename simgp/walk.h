@@ -161,9 +161,9 @@ template <class RowsOf>
 void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_of) {
     const ptrdiff_t block = column_pixels / pitch_of(c);
     const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
-    const auto rows = rows_of(live_rows(pitch_of(c) * (units < block ? units : block)));
     pixel_column at;
     in_column_blocks(units, block, [&](ptrdiff_t first, ptrdiff_t count) {
+        const auto rows = rows_of(live_rows(pitch_of(c) * count));
         gather_column(p, c, first, count, at);
         if (p.two_rows)
             rows.two(at.y[0], at.y[1], at.u, at.v, at.rgb[0], at.rgb[1], pitch_of(c) * count);
