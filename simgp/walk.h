@@ -113,7 +113,8 @@ void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&lu
 
 // Converts the first `width` pixels of rows, but all of those that have a chroma line to themselves.
 template <class Rows>
-[[gnu::noinline]] void walk_planes(const planes_to_rgb &p, const Rows &rows, ptrdiff_t width) {
+[[gnu::always_inline]] inline void walk_planes(const planes_to_rgb &p, const Rows &rows,
+                                               ptrdiff_t width) {
     const const_lines y = p.y, u = p.u, v = p.v;
     const lines dst = p.dst;
     const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
