@@ -51,7 +51,8 @@ F *as(code address) {
     void name(code address, int n) { as<type>(address)(__VA_ARGS__); }
 
 constexpr yuv_to_rgb to_rgb_how{{298, 16, 409, -100, -208, 516}, false, false, true, false};
-constexpr rgb_weights to_yuv_how{{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false};
+constexpr rgb_weights to_yuv_how{{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false, false},
+    to_yuv_means{{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false, true};
 constexpr repacking order{true, false, false};
 uint8_t *const channels[3] = {d, e, f};
 const uint8_t *const channels_in[3] = {a, b, c};
@@ -65,14 +66,23 @@ CALL(call_unpack, unpack_rows, a, 0, d, 0, e, 0, n, 1)
 CALL(call_dither, dither_row, a, b, c, d, n)
 CALL(call_any, any_to_rgb_row, to_rgb_how, a, b, c, d, n)
 CALL(call_any_pair, any_to_rgb_row_pair, to_rgb_how, a, a + second, b, c, d, d + second, n)
-CALL(call_any_to_yuv, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, e, f, n)
+CALL(call_any_to_grey, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, nullptr, nullptr,
+     n)
+CALL(call_any_to_half, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, e, f, n)
+CALL(call_any_to_pairs, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, e, nullptr, n)
+CALL(call_any_to_means, any_to_yuv_row, to_yuv_means, a, a + second, d, d + second, e, nullptr, n)
 CALL(call_chroma, chroma_row, to_yuv_how, channels_in, d, e, n)
 CALL(call_split_pixels, split_pixels_row, a, channels, n)
 CALL(call_repack, repack_row, order, a, d, n)
-CALL(call_split_groups, split_groups_row, a, d, e, f, n, true)
 CALL(call_join_groups, join_groups_row, a, b, c, d, n, true)
-CALL(call_to_planes, groups_to_planes_row, a, a + second, d, d + second, e, f, n, true)
+#define SPLIT(v, shared, mean) \
+    { a, second, d, second, e, second, v, second, n, 2, true, shared, mean }
+CALL(call_split_groups, split_groups_rows, SPLIT(f, false, false))
+CALL(call_split_to_planes, split_groups_rows, SPLIT(f, true, false))
+CALL(call_split_to_pairs, split_groups_rows, SPLIT(nullptr, true, false))
+CALL(call_split_means, split_groups_rows, SPLIT(f, true, true))
 CALL(call_mean, mean_row, a, b, d, n)
+CALL(call_mean_of_blocks, mean_of_blocks_rows, a, b, 0, d, 0, n, 1)
 CALL(call_resample, resample_row, a, d, n)
 CALL(call_detile, detile_rows, a, d, 256, n)
 CALL(call_entile, entile_rows, a, 256, d, n)
@@ -126,7 +136,6 @@ constexpr const char *matrices[] = {"", "coarse "},
                      *chroma_ins[] = {"half", "full", "pairs", "groups"},
                      *kinds[] = {"words", "three", "four"},
                      *rgb_ins[] = {"words", "three", "four", "four, alpha first"},
-                     *chroma_outs[] = {"grey", "half", "pairs"},
                      *sample_kinds[] = {"bytes", "words", "even bytes"};
 const char *layout_name(size_t l) { return l ? layouts[l - 1] : "grey"; }
 
@@ -165,9 +174,13 @@ void list_any(const any_rows &n, const any_rows &s) {
             add(named("any %s to %s, two", chroma_ins[l], kinds[k]), n.to_rgb_pair[l][k],
                 s.to_rgb_pair[l][k], call_any_pair, 2);
         }
-        for (size_t l = 0; l < size_t(chroma_out::count); l++)
-            add(named("any %s to %s, two", kinds[k], chroma_outs[l]), n.to_yuv[k][l],
-                s.to_yuv[k][l], call_any_to_yuv, 2);
+        const auto to_yuv = [&](const char *out, auto call) {
+            add(named("any %s to %s, two", kinds[k], out), n.to_yuv[k], s.to_yuv[k], call, 2);
+        };
+        to_yuv("grey", call_any_to_grey);
+        to_yuv("half", call_any_to_half);
+        to_yuv("pairs", call_any_to_pairs);
+        to_yuv("means", call_any_to_means);
         for (size_t to = 0; to < size_t(pixel_kind::count); to++)
             add(named("any %s to %s", kinds[k], kinds[to]), n.repack[k][to], s.repack[k][to],
                 call_repack);
@@ -176,13 +189,16 @@ void list_any(const any_rows &n, const any_rows &s) {
         add(named("any split %s", rgb_ins[k]), n.split_pixels[k], s.split_pixels[k],
             call_split_pixels);
     add("any chroma", n.chroma, s.chroma, call_chroma);
-    add("any split groups", n.split_groups, s.split_groups, call_split_groups, 2);
+    const auto split = [&](const char *name, auto call) {
+        add(name, n.split_groups, s.split_groups, call, 4);
+    };
+    split("any split groups, two", call_split_groups);
+    split("any split groups to planes, two", call_split_to_planes);
+    split("any split groups to pairs, two", call_split_to_pairs);
+    split("any split groups, means, two", call_split_means);
     add("any join groups", n.join_groups, s.join_groups, call_join_groups, 2);
-    add("any groups to planes, two", n.groups_to_planes, s.groups_to_planes, call_to_planes, 4);
-    add("any groups to pairs, two", n.groups_to_pairs, s.groups_to_pairs, call_to_planes, 4);
     add("any mean of lines", n.mean_of_lines, s.mean_of_lines, call_mean);
-    add("any mean of pairs", n.mean_of_pairs, s.mean_of_pairs, call_mean);
-    add("any mean of blocks", n.mean_of_blocks, s.mean_of_blocks, call_mean);
+    add("any mean of blocks", n.mean_of_blocks, s.mean_of_blocks, call_mean_of_blocks);
     add("any every second", n.every_second, s.every_second, call_resample);
     add("any twice", n.twice, s.twice, call_resample);
 }
@@ -242,12 +258,12 @@ void list_peers() {
     PEER(SplitRGBRow, peer_plain_13)
     PEER(YUY2ToYRow, peer_plain_11)
     PEER(YUY2ToUV422Row, peer_plain_12)
+    PEER(YUY2ToUVRow, peer_lines)
     PEER(I422ToYUY2Row, peer_plain_31)
     PEER(SplitUVRow, peer_plain_12)
     PEER(MergeUVRow, peer_plain_21)
     PEER(InterpolateRow, peer_interpolated)
     PEER(ScaleRowDown2, peer_scaled)
-    PEER(ScaleRowDown2Linear, peer_scaled)
     PEER(ScaleRowDown2Box, peer_scaled)
     PEER(TransposeWx8, peer_transposed, 8)
     PEER(MirrorRow, peer_plain_11)

@@ -1,5 +1,5 @@
 # Libraries, headers, CMake package and pkg-config file. Components: runtime (the shared library), dev (what
-# compiling and linking needs) and tools.
+# compiling and linking needs), tools, and player where it is built.
 include(CMakePackageConfigHelpers)
 
 install(TARGETS ${libraries} EXPORT simgp-targets

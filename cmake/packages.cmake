@@ -1,5 +1,5 @@
 # Packages for Debian, by `cpack -G DEB` in a build that is configured with the prefix /usr (the preset
-# "packages"): libsimgp1, libsimgp-dev and simgp-tools, one for each component.
+# "packages"): libsimgp1, libsimgp-dev, simgp-tools and simgp-play, one for each component that the build has.
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME simgp)
 # Each package has a summary of its own.
@@ -15,6 +15,9 @@ set(CPACK_COMPONENTS_ALL runtime dev)
 if(TARGET simgp-convert)
   list(APPEND CPACK_COMPONENTS_ALL tools)
 endif()
+if(TARGET simgp-play)
+  list(APPEND CPACK_COMPONENTS_ALL player)
+endif()
 
 set(CPACK_DEB_COMPONENT_INSTALL ON)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
@@ -26,14 +29,17 @@ set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${PROJECT_BINARY_DIR})
 set(CPACK_DEBIAN_ENABLE_COMPONENT_DEPENDS ON)
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
 
+# CPack indents it.
 set(what_it_is "Conversion between planar, semi-planar, packed and tiled YUV and RGB,
- resizing, turns, deblocking and dithering, with vector instructions and
- the same result on every processor.")
+resizing, turns, deblocking and dithering, with vector instructions and
+the same result on every processor.")
 # simgp_package(COMPONENT name section summary)
+set(packages "")
 macro(simgp_package component name section summary)
+  list(APPEND packages "${component}:${name}")
   set(CPACK_DEBIAN_${component}_PACKAGE_NAME ${name})
   set(CPACK_DEBIAN_${component}_PACKAGE_SECTION ${section})
-  set(CPACK_DEBIAN_${component}_DESCRIPTION "${summary}\n ${what_it_is}")
+  set(CPACK_DEBIAN_${component}_DESCRIPTION "${summary}\n${what_it_is}")
 endmacro()
 simgp_package(RUNTIME libsimgp${PROJECT_VERSION_MAJOR} libs "pixel kernels for players, cameras and devices")
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
@@ -43,9 +49,12 @@ set(CPACK_DEBIAN_RUNTIME_PACKAGE_CONTROL_EXTRA ${PROJECT_BINARY_DIR}/debian/trig
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY >=)
 simgp_package(DEV libsimgp-dev libdevel "pixel kernels for players, cameras and devices: what programs are made with")
 simgp_package(TOOLS simgp-tools video "converts pictures and video frames, lists the pictures of streams")
+# The library is in it.
+simgp_package(PLAYER simgp-play video "shows films through the simgp library")
 set(CPACK_COMPONENT_DEV_DEPENDS runtime)
 set(CPACK_COMPONENT_TOOLS_DEPENDS runtime)
 
+string(TOLOWER "${packages}" packages)
 # Licence, changes and compressed manual pages go where Debian looks for them.
 configure_file(cmake/debian.cmake.in ${PROJECT_BINARY_DIR}/debian.cmake @ONLY)
 set(CPACK_PRE_BUILD_SCRIPTS ${PROJECT_BINARY_DIR}/debian.cmake)

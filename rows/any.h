@@ -19,6 +19,7 @@ struct rgb_weights {
     int16_t y[3], u[3], v[3];
     uint8_t black;
     bool alpha_first;
+    bool mean;  // of the pixels that share chroma; else the first of them gives it
 };
 
 // How the pixels of a packing lie in memory, but for the order of their channels.
@@ -62,11 +63,11 @@ enum class chroma_in : uint8_t {
 };
 
 // Converts `width` >= 1 pixels of a row: luma, and the chroma of pixels 0, 2, 4, ..., (width + 1) / 2
-// samples, to u and v, or to u as pairs, or not at all; and of the row src1, unless that is null,
-// luma alone.
+// samples, to u and v, or, if v is null, to u as pairs, or, if u is null, not at all; and of the row
+// src1, unless that is null, luma. With w.mean, chroma is that of the rounded means of pixels 0 and
+// 1, 2 and 3, ... of both rows, as far as there are.
 using any_to_yuv_row = void(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
                             uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width);
-enum class chroma_out : uint8_t { none, half, pairs, count };
 
 // The chroma of `count` >= 1 pixels from planes of their channels.
 using chroma_row = void(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
@@ -90,21 +91,35 @@ struct repacking {
 };
 using repack_row = void(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count);
 
-// Takes `pairs` >= 1 pairs of pixels apart, bytes Y U Y V or U Y V Y, and puts them together.
-using split_groups_row = void(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
-                              ptrdiff_t pairs, bool luma_first);
+// Takes lines of packed 4:2:2 apart, bytes Y U Y V or U Y V Y: luma to y, chroma to u and v, or, if v is
+// null, to u as pairs U V.
+struct groups_split {
+    const uint8_t *src;
+    ptrdiff_t stride;
+    uint8_t *y;
+    ptrdiff_t y_stride;
+    uint8_t *u;
+    ptrdiff_t u_stride;
+    uint8_t *v;
+    ptrdiff_t v_stride;
+    ptrdiff_t pairs, rows;  // pairs of pixels, and lines, at least one
+    bool luma_first;
+    bool shared;  // a line of chroma for two rows: that of the first,
+    bool mean;    // or the rounded mean of both, as far as there are
+};
+using split_groups_rows = void(const groups_split &s);
+
+// Puts `pairs` >= 1 pairs of pixels together.
 using join_groups_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                              ptrdiff_t pairs, bool luma_first);
 
-// Takes two lines apart, which may be one and the same: the luma of both, and the chroma of the
-// first, to u and v, or to u as pairs U V.
-using groups_to_planes_row = void(const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                                  uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
-                                  bool luma_first);
-
-// `count` >= 1 samples from lines a and b: the mean of two, a[x] and b[x]; of two, a[2x] and
-// a[2x + 1]; of four, of both lines. Rounded, halves up.
+// `count` >= 1 samples from lines a and b: the mean of two, a[x] and b[x]. Rounded, halves up.
 using mean_row = void(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count);
+
+// `rows` >= 1 rows of `count` >= 1 samples: the mean of four, a[2x] and a[2x + 1] and those of b, which
+// may be the same line. From row to row a and b advance by `step`.
+using mean_of_blocks_rows = void(const uint8_t *a, const uint8_t *b, ptrdiff_t step, uint8_t *dst,
+                                 ptrdiff_t dst_step, ptrdiff_t count, ptrdiff_t rows);
 
 // `count` >= 1 samples: every second of a, and every sample of a twice (the last may be once).
 using resample_row = void(const uint8_t *a, uint8_t *dst, ptrdiff_t count);
@@ -112,14 +127,14 @@ using resample_row = void(const uint8_t *a, uint8_t *dst, ptrdiff_t count);
 struct any_rows {
     any_to_rgb_row *to_rgb[size_t(chroma_in::count)][size_t(pixel_kind::count)];
     any_to_rgb_row_pair *to_rgb_pair[size_t(chroma_in::count)][size_t(pixel_kind::count)];
-    any_to_yuv_row *to_yuv[size_t(pixel_kind::count)][size_t(chroma_out::count)];
+    any_to_yuv_row *to_yuv[size_t(pixel_kind::count)];
     chroma_row *chroma;
     split_pixels_row *split_pixels[size_t(rgb_in::count)];
     repack_row *repack[size_t(pixel_kind::count)][size_t(pixel_kind::count)];
-    split_groups_row *split_groups;
+    split_groups_rows *split_groups;
     join_groups_row *join_groups;
-    groups_to_planes_row *groups_to_planes, *groups_to_pairs;
-    mean_row *mean_of_lines, *mean_of_pairs, *mean_of_blocks;
+    mean_row *mean_of_lines;
+    mean_of_blocks_rows *mean_of_blocks;
     resample_row *every_second, *twice;
 };
 

@@ -258,14 +258,21 @@ struct pair_u8 {
 };
 // In-block: the even bytes of each block go to its lower half, the odd ones to its upper half; then
 // halves of two vectors meet. What is loaded where decides the order.
-inline pair_u8 split_blocks(__m256i a, __m256i b) {
+using split_moves = __m256i;
+inline split_moves set_split_moves(bool exchange) {
     const __m256i split = _mm256_broadcastsi128_si256(
         _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
-    a = _mm256_shuffle_epi8(a, split);
-    b = _mm256_shuffle_epi8(b, split);
+    return _mm256_xor_si256(split, set_u8(exchange));
+}
+inline pair_u8 split_blocks(__m256i a, __m256i b, split_moves order = set_split_moves(false)) {
+    a = _mm256_shuffle_epi8(a, order);
+    b = _mm256_shuffle_epi8(b, order);
     return {_mm256_unpacklo_epi64(a, b), _mm256_unpackhi_epi64(a, b)};
 }
-inline pair_u8 load_split(const uint8_t *p) { return split_blocks(load(p), load(p + bytes)); }
+inline pair_u8 load_split(const uint8_t *p, split_moves order) {
+    return split_blocks(load(p), load(p + bytes), order);
+}
+inline pair_u8 load_split(const uint8_t *p) { return load_split(p, set_split_moves(false)); }
 inline pair_u8 load_split_natural(const uint8_t *p) {
     return split_blocks(load_blocks(p, 32), load_blocks(p + 16, 32));
 }
@@ -541,6 +548,10 @@ inline u8v pack_bytes(s16v a, s16v b) { return _mm256_packs_epi16(a, b); }
 inline u8v even_dwords(u8v a, u8v b) {
     return _mm256_castps_si256(
         _mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), 0x88));
+}
+inline u8v odd_dwords(u8v a, u8v b) {
+    return _mm256_castps_si256(
+        _mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), 0xDD));
 }
 inline u8v unpack_order(u8v v) {
     return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));

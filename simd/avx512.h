@@ -272,13 +272,18 @@ struct pair_u8 {
 };
 // Each vector is permuted once, so that the parts of the results that it holds stand where these
 // want them, and the parts of two vectors put together.
-inline pair_u8 load_split(const uint8_t *p) {
+using split_moves = __m512i;
+inline split_moves set_split_moves(bool exchange) {
     const __m512i split =
         _mm512_broadcast_i32x4(_mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
-    const __m512i a = _mm512_shuffle_epi8(load(p), split);
-    const __m512i b = _mm512_shuffle_epi8(load(p + bytes), split);
+    return _mm512_xor_si512(split, set_u8(exchange));
+}
+inline pair_u8 load_split(const uint8_t *p, split_moves order) {
+    const __m512i a = _mm512_shuffle_epi8(load(p), order);
+    const __m512i b = _mm512_shuffle_epi8(load(p + bytes), order);
     return {_mm512_unpacklo_epi64(a, b), _mm512_unpackhi_epi64(a, b)};
 }
+inline pair_u8 load_split(const uint8_t *p) { return load_split(p, set_split_moves(false)); }
 struct split_index {
     alignas(64) uint8_t natural[64], by4[64];
     constexpr split_index() : natural(), by4() {
@@ -575,6 +580,10 @@ inline u8v pack_bytes(s16v a, s16v b) { return _mm512_packs_epi16(a, b); }
 inline u8v even_dwords(u8v a, u8v b) {
     return _mm512_castps_si512(
         _mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), 0x88));
+}
+inline u8v odd_dwords(u8v a, u8v b) {
+    return _mm512_castps_si512(
+        _mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), 0xDD));
 }
 inline u8v unpack_order(u8v v) {
     return _mm512_permutexvar_epi32(

@@ -439,9 +439,21 @@ inline pair_u8 load_split(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by8(v.even), natural_to_by8(v.odd)};
 }
+// load_split, or the same with even and odd exchanged.
+using split_moves = bool;
+inline split_moves set_split_moves(bool exchange) { return exchange; }
+inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
+    const pair_u8 v = load_split(p);
+    return exchange ? pair_u8{v.odd, v.even} : v;
+}
 inline pair_u8 load_split_by4(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by4(v.even), natural_to_by4(v.odd)};
+}
+// The rounded means of blocks of four in two lines of twice `bytes` bytes, (sum + 2) >> 2.
+inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
+    return make<u8v>(
+        [&](int i) { return (a[2 * i] + a[2 * i + 1] + b[2 * i] + b[2 * i + 1] + 2) >> 2; });
 }
 // The even bytes of v at p, the odd ones at q.
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
@@ -561,6 +573,17 @@ inline s16v even_dot(rgb_v v, const channel_factors &f) {
         return f.a * v.c[0].lane[2 * i] + f.b * v.c[1].lane[2 * i] + f.c * v.c[2].lane[2 * i];
     });
 }
+// The even pixels become the rounded means of blocks of four: of pixels 2i and 2i + 1 of a and of b. The
+// odd ones have no meaning.
+inline rgb_v block_means(rgb_v a, rgb_v b) {
+    const auto means = [&](int k) {
+        return make<u8v>([&](int i) {
+            const uint8_t *const p = &a.c[k].lane[i & ~1], *const q = &b.c[k].lane[i & ~1];
+            return (p[0] + p[1] + q[0] + q[1] + 2) >> 2;
+        });
+    };
+    return {means(0), means(1), means(2)};
+}
 // `bytes` pixels of 3 or 4 bytes at q become words of 5, 6 and 5 bits at p, the first channel in
 // the highest bits; the low bits of each channel are dropped, and so is the fourth byte.
 template <int Size>
@@ -628,15 +651,34 @@ inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int 
 inline u8v dot_high(quads_v v, const quad_weights &w) {
     return make<u8v>([&](int i) { return (w.of(v.p + 4 * i) >> 8) + w.d; });
 }
-// The high bytes of c - (f0 c0 + f1 c1 + f2 c2) of the even pixels, saturated to 16 bits, signed,
-// with two sets of factors in turn. Factors lie in -128 ... 127; the sum and that of two neighbours
-// in memory, from the first byte on, fit 16 bits, signed.
+// Half as many pixels: the even ones, or the rounded means of blocks of four, pixels 2i and 2i + 1 of a and
+// of b.
+struct half_quads_v {
+    uint8_t pixel[bytes / 2][4];
+};
+inline half_quads_v even_quads(quads_v v) {
+    half_quads_v r;
+    for (int i = 0; i < bytes / 2; i++) memcpy(r.pixel[i], v.p + 8 * i, 4);
+    return r;
+}
+inline half_quads_v block_means(quads_v a, quads_v b) {
+    half_quads_v r;
+    for (int i = 0; i < bytes / 2; i++)
+        for (int k = 0; k < 4; k++) {
+            const uint8_t *const p = a.p + 8 * i + k, *const q = b.p + 8 * i + k;
+            r.pixel[i][k] = static_cast<uint8_t>((p[0] + p[4] + q[0] + q[4] + 2) >> 2);
+        }
+    return r;
+}
+// The high bytes of c - (f0 c0 + f1 c1 + f2 c2), saturated to 16 bits, signed, with two sets of factors
+// in turn. Factors lie in -128 ... 127; the sum and that of two neighbours in memory, from the first
+// byte on, fit 16 bits, signed.
 inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
     return {a, b, c, 0, skips_first};
 }
-inline u8v even_dots_high(quads_v v, const quad_factors &f, const quad_factors &g, s16v c) {
+inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
     return make<u8v>([&](int i) {
-        const int dot = (i & 1 ? g : f).of(v.p + 8 * (i / 2));
+        const int dot = (i & 1 ? g : f).of(v.pixel[i / 2]);
         return clamp_to(-32768, 32767, c.lane[i / 2] - dot) >> 8;
     });
 }

@@ -264,6 +264,13 @@ inline pair_u8 load_split(const uint8_t *p) {
     const uint8x16x2_t v = vld2q_u8(p);
     return {v.val[0], v.val[1]};
 }
+// All bits, or none.
+using split_moves = u8v;
+inline split_moves set_split_moves(bool exchange) { return set_u8(exchange ? 255 : 0); }
+inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
+    const pair_u8 v = load_split(p);
+    return {vbslq_u8(exchange, v.odd, v.even), vbslq_u8(exchange, v.even, v.odd)};
+}
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     const uint8x8x2_t split = vuzp_u8(vget_low_u8(v), vget_high_u8(v));
     vst1_u8(p, split.val[0]);
@@ -271,6 +278,12 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
 }
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
+
+inline u16v sums_of_four(u8v a, u8v b) { return vpadalq_u8(vpaddlq_u8(a), b); }
+inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
+    return vcombine_u8(vrshrn_n_u16(sums_of_four(load(a), load(b)), 2),
+                       vrshrn_n_u16(sums_of_four(load(a + bytes), load(b + bytes)), 2));
+}
 
 // Some compilers have macros for stores of several vectors, which take no braces: hence the names.
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
@@ -372,6 +385,12 @@ inline s16v even_dot(rgb_v v, const channel_factors &f) {
     return vmlaq_n_s16(sum, as_s16(even(v.val[2])), f.c);
 }
 
+inline u8v block_means(u8v a, u8v b) { return as_u8(vrshrq_n_u16(sums_of_four(a, b), 2)); }
+inline rgb_v block_means(const rgb_v &a, const rgb_v &b) {
+    return {{block_means(a.val[0], b.val[0]), block_means(a.val[1], b.val[1]),
+             block_means(a.val[2], b.val[2])}};
+}
+
 struct channels_v {
     u8v c[3];
 };
@@ -451,7 +470,14 @@ inline u8v dot_high(const quads_v &v, const quad_weights &w) {
 inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
     return {set_channel_factors(a, b, c), skips_first};
 }
-inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
+// Still all of them: the even ones count.
+using half_quads_v = quads_v;
+inline half_quads_v even_quads(const quads_v &v) { return v; }
+inline half_quads_v block_means(const quads_v &a, const quads_v &b) {
+    return {{block_means(a.val[0], b.val[0]), block_means(a.val[1], b.val[1]),
+             block_means(a.val[2], b.val[2]), block_means(a.val[3], b.val[3])}};
+}
+inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
     const auto dot = [&](const quad_factors &k) {
         return as_u16(sub_sat(c, even_dot(weighted(v, k.skips_first), k.factors)));
     };

@@ -222,12 +222,17 @@ inline u8v by8_to_natural(u8v v) { return v; }
 struct pair_u8 {
     u8v even, odd;
 };
-inline pair_u8 load_split(const uint8_t *p) {
+using split_moves = __m128i;
+inline split_moves set_split_moves(bool exchange) {
     const __m128i split = _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15);
-    const __m128i a = _mm_shuffle_epi8(load(p), split),
-                  b = _mm_shuffle_epi8(load(p + bytes), split);
+    return _mm_xor_si128(split, set_u8(exchange));
+}
+inline pair_u8 load_split(const uint8_t *p, split_moves order) {
+    const __m128i a = _mm_shuffle_epi8(load(p), order),
+                  b = _mm_shuffle_epi8(load(p + bytes), order);
     return {_mm_unpacklo_epi64(a, b), _mm_unpackhi_epi64(a, b)};
 }
+inline pair_u8 load_split(const uint8_t *p) { return load_split(p, set_split_moves(false)); }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     v = _mm_shuffle_epi8(v, _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
     _mm_storel_epi64(reinterpret_cast<__m128i *>(p), v);
@@ -464,6 +469,9 @@ inline s16v add_pairs(s16v a, s16v b) {
 inline u8v pack_bytes(s16v a, s16v b) { return _mm_packs_epi16(a, b); }
 inline u8v even_dwords(u8v a, u8v b) {
     return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), 0x88));
+}
+inline u8v odd_dwords(u8v a, u8v b) {
+    return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), 0xDD));
 }
 inline u8v unpack_order(u8v v) { return v; }
 

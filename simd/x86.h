@@ -4,7 +4,7 @@
 // Besides the vocabulary, a layer gives
 //   add_pairs(a, b)      16-bit lanes: the sums of two neighbours each, of a and of b, block by block
 //   pack_bytes(a, b)     signed 16-bit lanes to bytes, block by block
-//   even_dwords(a, b)    dwords 0 and 2 of each block of a, then of b
+//   even_dwords(a, b)    dwords 0 and 2 of each block of a, then of b; odd_dwords 1 and 3
 //   unpack_order(v)      what two steps of packing leave, put in order: granule k of block j belongs to
 //                        vector k
 #ifndef SIMD_X86_H
@@ -47,6 +47,29 @@ inline u8v dot_high(rgb_v v, const channel_factors &f) {
 }
 inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
 
+// Sums of neighbours, and the rounded quarters of what is at most 32767, (v + 2) >> 2.
+inline u16v sums_of_pairs(u8v v) { return dot_pairs(v, set_u8(1)); }
+inline u16v quarter(u16v v) { return mul_round(v, set_u16(8192)); }
+
+inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
+    const auto means = [&](int at) {
+        return quarter(add(sums_of_pairs(load(a + at)), sums_of_pairs(load(b + at))));
+    };
+    return by8_to_natural(narrow(means(0), means(bytes)));
+}
+
+// The mean of means is one too high where both it and one of the others were rounded up.
+inline u8v mean_of_four(u8v a, u8v b, u8v c, u8v d) {
+    const u8v p = avg_u8(a, b), q = avg_u8(c, d);
+    const u8v excess = bit_and(bit_or(bit_xor(a, b), bit_xor(c, d)), bit_xor(p, q));
+    return sub_u8(avg_u8(p, q), bit_and(excess, set_u8(1)));
+}
+inline rgb_v block_means(const rgb_v &p, const rgb_v &q) {
+    const u8v ac = mean_of_four(p.ac_even, p.ac_odd, q.ac_even, q.ac_odd);
+    const u16v b = quarter(add(add(p.b_even, p.b_odd), add(q.b_even, q.b_odd)));
+    return {ac, b, ac, b};
+}
+
 struct channels_v {
     u8v c[3];
 };
@@ -84,10 +107,23 @@ using quad_factors = u8v;
 inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
     return set_quad(skips_first, a, b, c);
 }
-inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const u8v low = even_dwords(v.v[0], v.v[1]), high = even_dwords(v.v[2], v.v[3]);
+// Pixels of each block of two vectors: 0 and 2 of a block of the first, then of the second.
+struct half_quads_v {
+    u8v low, high;
+};
+inline half_quads_v even_quads(const quads_v &v) {
+    return {even_dwords(v.v[0], v.v[1]), even_dwords(v.v[2], v.v[3])};
+}
+inline half_quads_v block_means(const quads_v &a, const quads_v &b) {
+    const auto means = [&](int k) {
+        return mean_of_four(even_dwords(a.v[k], a.v[k + 1]), odd_dwords(a.v[k], a.v[k + 1]),
+                            even_dwords(b.v[k], b.v[k + 1]), odd_dwords(b.v[k], b.v[k + 1]));
+    };
+    return {means(0), means(2)};
+}
+inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
     const auto dot = [&](u8v k) {
-        return sub_sat(c, add_pairs(dot_pairs(low, k), dot_pairs(high, k)));
+        return sub_sat(c, add_pairs(dot_pairs(v.low, k), dot_pairs(v.high, k)));
     };
     return unpack_order(join_high(dot(f), dot(g)));
 }

@@ -86,25 +86,29 @@ uint8_t chroma_of(const int16_t (&w)[3], const channels &p) {
     return uint8_t(clamp(((dot(w, p) + 128) >> 8) + 128));
 }
 
-template <pixel_kind Kind, chroma_out Out>
+template <pixel_kind Kind>
 void any_to_yuv(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
                 uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     const auto pixel = [&w](const uint8_t *src, ptrdiff_t x) {
         return read_channels<rgb_in(Kind)>(src + w.alpha_first, x);
     };
+    // Of a pixel and those beside and below it; at borders some of them twice, which changes no mean.
+    const auto mean = [&](ptrdiff_t x) {
+        const ptrdiff_t right = x + 1 < width ? x + 1 : x;
+        const uint8_t *const below = src1 ? src1 : src0;
+        const channels a = pixel(src0, x), b = pixel(src0, right), c = pixel(below, x),
+                       d = pixel(below, right);
+        channels m{};
+        for (int k = 0; k < 3; k++) m.c[k] = (a.c[k] + b.c[k] + c.c[k] + d.c[k] + 2) >> 2;
+        return m;
+    };
     for (ptrdiff_t x = 0; x < width; x++) {
-        const channels p = pixel(src0, x);
-        y0[x] = luma_of(w, p);
+        y0[x] = luma_of(w, pixel(src0, x));
         if (src1) y1[x] = luma_of(w, pixel(src1, x));
-        if (Out == chroma_out::none || x & 1) continue;
-        const uint8_t of_u = chroma_of(w.u, p), of_v = chroma_of(w.v, p);
-        if (Out == chroma_out::half) {
-            u[x / 2] = of_u;
-            v[x / 2] = of_v;
-        } else {
-            u[x] = of_u;
-            u[x + 1] = of_v;
-        }
+        if (!u || x & 1) continue;
+        const channels p = w.mean ? mean(x) : pixel(src0, x);
+        u[v ? x / 2 : x] = chroma_of(w.u, p);
+        (v ? v[x / 2] : u[x + 1]) = chroma_of(w.v, p);
     }
 }
 
@@ -142,14 +146,24 @@ void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t 
     }
 }
 
-void split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t pairs,
-                  bool luma_first) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        y[2 * i] = src[4 * i + luma];
-        y[2 * i + 1] = src[4 * i + luma + 2];
-        u[i] = src[4 * i + of_u];
-        v[i] = src[4 * i + of_u + 2];
+void split_groups(const groups_split &s) {
+    const int luma = s.luma_first ? 0 : 1, of_u = s.luma_first ? 1 : 0;
+    for (ptrdiff_t row = 0; row < s.rows; row++) {
+        const uint8_t *const src = s.src + row * s.stride;
+        for (ptrdiff_t x = 0; x < 2 * s.pairs; x++) s.y[row * s.y_stride + x] = src[2 * x + luma];
+        if (s.shared && row & 1) continue;
+        // The mean of a line and itself is the line.
+        const bool both = s.shared && s.mean && row + 1 < s.rows;
+        const uint8_t *const other = both ? src + s.stride : src;
+        const ptrdiff_t line = s.shared ? row / 2 : row;
+        for (ptrdiff_t i = 0; i < s.pairs; i++) {
+            const auto sample = [=](ptrdiff_t at) {
+                return uint8_t((src[at] + other[at] + 1) >> 1);
+            };
+            uint8_t *const u = s.u + line * s.u_stride + (s.v ? i : 2 * i);
+            u[0] = sample(4 * i + of_u);
+            (s.v ? s.v[line * s.v_stride + i] : u[1]) = sample(4 * i + of_u + 2);
+        }
     }
 }
 void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
@@ -163,29 +177,17 @@ void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *
     }
 }
 
-template <bool Pairs>
-void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1, uint8_t *u,
-                   uint8_t *v, ptrdiff_t pairs, bool luma_first) {
-    const int luma = luma_first ? 0 : 1, of_u = luma_first ? 1 : 0;
-    for (ptrdiff_t x = 0; x < 2 * pairs; x++) {
-        y0[x] = src0[2 * x + luma];
-        y1[x] = src1[2 * x + luma];
-    }
-    for (ptrdiff_t i = 0; i < pairs; i++) {
-        u[Pairs ? 2 * i : i] = src0[4 * i + of_u];
-        (Pairs ? u[2 * i + 1] : v[i]) = src0[4 * i + of_u + 2];
-    }
-}
-
 void mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[x] + b[x] + 1) >> 1);
 }
-void mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++) dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + 1) >> 1);
-}
-void mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    for (ptrdiff_t x = 0; x < count; x++)
-        dst[x] = uint8_t((a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1] + 2) >> 2);
+void mean_of_blocks(const uint8_t *a, const uint8_t *b, ptrdiff_t step, uint8_t *dst,
+                    ptrdiff_t dst_step, ptrdiff_t count, ptrdiff_t rows) {
+    for (ptrdiff_t y = 0; y < rows; y++) {
+        const uint8_t *const p = a + y * step, *const q = b + y * step;
+        for (ptrdiff_t x = 0; x < count; x++)
+            dst[y * dst_step + x] =
+                uint8_t((p[2 * x] + p[2 * x + 1] + q[2 * x] + q[2 * x + 1] + 2) >> 2);
+    }
 }
 void every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) dst[x] = a[2 * x];
@@ -208,10 +210,7 @@ void fill_from_yuv(any_rows &t) {
 }
 template <pixel_kind From>
 void fill_from_rgb(any_rows &t) {
-    any_to_yuv_row **const to_yuv = t.to_yuv[size_t(From)];
-    to_yuv[size_t(chroma_out::none)] = any_to_yuv<From, chroma_out::none>;
-    to_yuv[size_t(chroma_out::half)] = any_to_yuv<From, chroma_out::half>;
-    to_yuv[size_t(chroma_out::pairs)] = any_to_yuv<From, chroma_out::pairs>;
+    t.to_yuv[size_t(From)] = any_to_yuv<From>;
     t.split_pixels[size_t(From)] = split_pixels<rgb_in(From)>;
     repack_row **const to = t.repack[size_t(From)];
     to[size_t(pixel_kind::words)] = repack<From, pixel_kind::words>;
@@ -233,10 +232,7 @@ void fill_any(any_rows &t) {
     t.chroma = chroma;
     t.split_groups = split_groups;
     t.join_groups = join_groups;
-    t.groups_to_planes = groups_to_420<false>;
-    t.groups_to_pairs = groups_to_420<true>;
     t.mean_of_lines = mean_of_lines;
-    t.mean_of_pairs = mean_of_pairs;
     t.mean_of_blocks = mean_of_blocks;
     t.every_second = every_second;
     t.twice = twice;

@@ -42,7 +42,7 @@ inline bool lie_apart(const lines &dst, ptrdiff_t bytes) {
 void copy_column(const const_lines &from, const lines &to, ptrdiff_t bytes, ptrdiff_t count);
 
 // Calls f(first, count) for blocks of `height` lines, at most `block` each and about the same number. No line
-// is done again: its pixels may lie over its samples.
+// is done twice: the first time may have written over its samples.
 template <class F>
 void in_column_blocks(ptrdiff_t height, ptrdiff_t block, F f) {
     for (ptrdiff_t y = 0, left = (height + block - 1) / block; left > 0; left--) {

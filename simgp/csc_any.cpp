@@ -15,12 +15,12 @@ constexpr yuv_weights to_rgb_weights[] = {
     {298, 16, 430, 48, 167, 548},  {256, 0, 378, 42, 146, 482},
 };
 constexpr rgb_weights to_yuv_weights[] = {
-    {{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false},
-    {{77, 150, 29}, {-43, -85, 128}, {128, -107, -21}, 0, false},
-    {{47, 157, 16}, {-26, -86, 112}, {112, -102, -10}, 16, false},
-    {{54, 184, 18}, {-29, -99, 128}, {128, -116, -12}, 0, false},
-    {{58, 149, 13}, {-31, -81, 112}, {112, -103, -9}, 16, false},
-    {{67, 174, 15}, {-36, -92, 128}, {128, -118, -10}, 0, false},
+    {{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false, false},
+    {{77, 150, 29}, {-43, -85, 128}, {128, -107, -21}, 0, false, false},
+    {{47, 157, 16}, {-26, -86, 112}, {112, -102, -10}, 16, false, false},
+    {{54, 184, 18}, {-29, -99, 128}, {128, -116, -12}, 0, false, false},
+    {{58, 149, 13}, {-31, -81, 112}, {112, -103, -9}, 16, false, false},
+    {{67, 174, 15}, {-36, -92, 128}, {128, -118, -10}, 0, false, false},
 };
 constexpr bool luma_sums_are_even() {
     for (const rgb_weights &w : to_yuv_weights)
@@ -117,13 +117,15 @@ void split_pairs(const job &j, bool v_first, const uint8_t *src, uint8_t *u, uin
 
 void read_groups(const job &j, const strip_rows &b, yuv_strip &s) {
     const bool luma_first = j.from.layout == yuv_layout::yuyv;
+    const const_lines in = j.in(0).from(2 * b.x, b.y);
+    const ptrdiff_t whole = b.width / 2;
+    if (whole)
+        j.rows.split_groups({in.first, in.stride, s.y[0], strip_width, s.u[0], strip_width, s.v[0],
+                             strip_width, whole, b.rows, luma_first, false, false});
+    if (!(b.width & 1)) return;
     for (ptrdiff_t r = 0; r < b.rows; r++) {
-        const uint8_t *const src = j.in(0).line(b.y + r) + 2 * b.x;
-        const ptrdiff_t whole = b.width / 2;
-        if (whole) j.rows.split_groups(src, s.y[r], s.u[r], s.v[r], whole, luma_first);
-        if (!(b.width & 1)) continue;
         // The V of a half group would lie behind the line.
-        const uint8_t *const group = src + 4 * whole;
+        const uint8_t *const group = in.line(r) + 4 * whole;
         s.y[r][2 * whole] = group[!luma_first];
         s.u[r][whole] = group[luma_first];
         s.v[r][whole] = b.x + whole ? group[luma_first - 2] : 128;
@@ -187,6 +189,17 @@ planar_band read_band(const job &j, const strip_rows &b, yuv_strip &s) {
 // YUV destinations
 // ------------------------------------------------------------------------------------------
 
+// The means of blocks of four in `rows` lines of a and of b, which may be the same, of `width` pixels
+// each. In both, lines are `step` bytes apart.
+void means_of_blocks(const job &j, const uint8_t *a, const uint8_t *b, ptrdiff_t step,
+                     const lines &dst, ptrdiff_t width, ptrdiff_t rows) {
+    const ptrdiff_t whole = width / 2, last = width - 1;
+    if (whole) j.rows.mean_of_blocks(a, b, step, dst.first, dst.stride, whole, rows);
+    if (width & 1)
+        for (ptrdiff_t y = 0; y < rows; y++)
+            dst.line(y)[whole] = uint8_t((a[y * step + last] + b[y * step + last] + 1) >> 1);
+}
+
 // A line of chroma of the destination, for `width` pixels, from one or two lines (b may be null) of
 // the source. Averages the lines if there are two, and drops or repeats or averages samples. The
 // result lies in the source or in `room`.
@@ -197,16 +210,16 @@ const uint8_t *chroma_line(const job &j, bool from_across, bool to_across, const
         if (!b) return a;
         j.rows.mean_of_lines(a, b, room, count);
     } else if (from_across) {
-        uint8_t means[strip_width / 2];
-        if (b) j.rows.mean_of_lines(a, b, means, (width + 1) / 2);
-        j.rows.twice(b ? means : a, room, count);
+        for (ptrdiff_t x = 0; x < width; x += strip_width) {
+            const ptrdiff_t pixels = width - x < strip_width ? width - x : strip_width;
+            uint8_t means[strip_width / 2];
+            if (b) j.rows.mean_of_lines(a + x / 2, b + x / 2, means, (pixels + 1) / 2);
+            j.rows.twice(b ? means : a + x / 2, room + x, pixels);
+        }
     } else if (!j.mean) {
         j.rows.every_second(a, room, count);
     } else {
-        const ptrdiff_t whole = width / 2;
-        if (whole) (b ? j.rows.mean_of_blocks : j.rows.mean_of_pairs)(a, b, room, whole);
-        if (whole < count)  // of the last pixels across
-            room[whole] = b ? uint8_t((a[width - 1] + b[width - 1] + 1) >> 1) : a[width - 1];
+        means_of_blocks(j, a, b ? b : a, 0, lines{room, 0}, width, 1);
     }
     return room;
 }
@@ -278,38 +291,66 @@ void finish_band(const job &j, const strip_rows &b, const planar_band &p, const 
     }
 }
 
-// From packed 4:2:2 to the chroma of every second row, straight to its place: to planes, or to pairs
-// U V.
+// From packed 4:2:2 to the chroma of every second row, or the mean of two, straight to its place: to
+// planes, or to pairs U V.
 bool has_way_from_groups(const job &j) {
     return j.from.kind == format_kind::packed && j.to.kind == format_kind::planar &&
            (j.to.layout == yuv_layout::uv || j.to.layout == yuv_layout::half) &&
-           sharing_of(j.to).down && !averages(j);
+           sharing_of(j.to).down;
 }
-void groups_to_every_second_row(const job &j) {
+void groups_to_420(const job &j) {
     const bool luma_first = j.from.layout == yuv_layout::yuyv, pairs = has_pairs(j.to);
-    groups_to_planes_row *const row = pairs ? j.rows.groups_to_pairs : j.rows.groups_to_planes;
     const const_lines in = j.in(0);
     const lines luma = j.out(0), of_u = j.out(j.to.u), of_v = j.out(j.to.v);
     const ptrdiff_t whole = j.width & ~ptrdiff_t(1);
-    for (ptrdiff_t line = 0; line < j.height; line += 2) {
-        // A last row alone is done twice.
-        const ptrdiff_t below = line + 1 < j.height ? line + 1 : line;
-        uint8_t *const u = of_u.line(line >> 1), *const v = of_v.line(line >> 1) + pairs;
-        if (whole)
-            row(in.line(line), in.line(below), luma.line(line), luma.line(below), u, v, whole / 2,
-                luma_first);
-        if (whole == j.width) continue;
-        const uint8_t *const last = in.line(line) + 2 * whole;
-        luma.line(line)[whole] = last[!luma_first];
-        luma.line(below)[whole] = in.line(below)[2 * whole + !luma_first];
+    if (whole)
+        j.rows.split_groups({in.first, in.stride, luma.first, luma.stride, of_u.first, of_u.stride,
+                             pairs ? nullptr : of_v.first, of_v.stride, whole / 2, j.height,
+                             luma_first, true, j.mean});
+    if (whole == j.width) return;
+    for (ptrdiff_t y = 0; y < j.height; y++) {
+        const uint8_t *const last = in.line(y) + 2 * whole;
+        luma.line(y)[whole] = last[!luma_first];
+        if (y & 1) continue;
+        const uint8_t *const below = j.mean && y + 1 < j.height ? last + in.stride : last;
+        const auto mean = [&](int at) { return uint8_t((last[at] + below[at] + 1) >> 1); };
         const ptrdiff_t at = pairs ? whole : whole / 2;
-        u[at] = last[luma_first];
-        v[at] = whole ? last[luma_first - 2] : 128;
+        of_u.line(y >> 1)[at] = mean(luma_first);
+        of_v.line(y >> 1)[at + pairs] = whole ? mean(luma_first - 2) : 128;
     }
 }
 
+// From planes to planes: each by itself, whole lines of it.
+bool has_planes_alone(const format &f) {
+    return f.kind == format_kind::planar && f.u >= 0 && !has_pairs(f);
+}
+void planes_to_planes(const job &j) {
+    copy_lines(j.in(0), j.out(0), j.width, j.height);
+    const sharing from = sharing_of(j.from), to = sharing_of(j.to);
+    const bool across = j.mean && to.across && !from.across, down = j.mean && to.down && !from.down;
+    const ptrdiff_t count = (j.width + to.across) >> to.across;
+    const auto plane = [&](const const_lines &in, const lines &out) {
+        ptrdiff_t y = 0;  // with means of blocks, a last line may remain
+        const ptrdiff_t rows = down ? j.height >> 1 : (j.height + to.down) >> to.down;
+        if (across && rows && (to.down || !from.down)) {
+            means_of_blocks(j, in.first, in.line(down), in.stride * (1 + down), out, j.width, rows);
+            y = rows << to.down;
+        }
+        for (; y < j.height; y += 1 + to.down) {
+            uint8_t *const dst = out.line(y >> to.down);
+            copy_line(
+                chroma_line(j, from.across, to.across, in.line(y >> from.down),
+                            down && y + 1 < j.height ? in.line(y + 1) : nullptr, dst, j.width),
+                dst, count);
+        }
+    };
+    plane(j.in(j.from.u), j.out(j.to.u));
+    plane(j.in(j.from.v), j.out(j.to.v));
+}
+
 void yuv_to_yuv(const job &j) {
-    if (has_way_from_groups(j)) return groups_to_every_second_row(j);
+    if (has_way_from_groups(j)) return groups_to_420(j);
+    if (has_planes_alone(j.from) && has_planes_alone(j.to)) return planes_to_planes(j);
     const sharing from = sharing_of(j.from), to = sharing_of(j.to);
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip read, resampled;
@@ -412,18 +453,18 @@ rgb_weights in_memory_order(rgb_weights w, rgb_packing packing) {
     return w;
 }
 
-// The chroma of a line of the destination from one or two lines of RGB: where samples stand for
-// several pixels, of their mean; for every pixel else.
+// The chroma of each pixel of a line, or of the mean of it and the one below, if b is not null.
 void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, const uint8_t *b,
-                      bool across, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+                      uint8_t *u, uint8_t *v, ptrdiff_t width) {
     rgb_strip of_a, of_b, means;
     const uint8_t *channels[3];
     split_pixels(j, a, of_a, width);
     if (b) split_pixels(j, b, of_b, width);
-    for (int k = 0; k < 3; k++)
-        channels[k] =
-            chroma_line(j, false, across, of_a.c[k], b ? of_b.c[k] : nullptr, means.c[k], width);
-    j.rows.chroma(w, channels, u, v, (width + across) >> across);
+    for (int k = 0; k < 3; k++) {
+        if (b) j.rows.mean_of_lines(of_a.c[k], of_b.c[k], means.c[k], width);
+        channels[k] = b ? means.c[k] : of_a.c[k];
+    }
+    j.rows.chroma(w, channels, u, v, width);
 }
 
 // The last pixels of lines, or of pairs of them, each as the first of two, whose second has no meaning.
@@ -442,7 +483,8 @@ void convert_rgb_column(const job &j, const rgb_weights &w, any_to_yuv_row *row,
         for (ptrdiff_t r = 0; r < at_once; r++)
             copy_column({in.line(at_once * first + r) + size * last, at_once * in.stride},
                         {pixels[r], 2 * size}, size, count);
-        row(w, pixels[0], at_once == 2 ? pixels[1] : nullptr, y[0], y[1], u, v, 2 * count);
+        row(w, pixels[0], at_once == 2 ? pixels[1] : nullptr, y[0], y[1],
+            chroma_bytes ? u : nullptr, chroma_bytes == 1 ? v : nullptr, 2 * count);
         for (ptrdiff_t r = 0; r < at_once; r++)
             copy_column(const_lines{y[r], 2}, lines_of_plane(0, last, at_once * first + r, at_once),
                         1, count);
@@ -457,25 +499,24 @@ void convert_rgb_column(const job &j, const rgb_weights &w, any_to_yuv_row *row,
 
 void rgb_to_yuv_pictures(const job &j) {
     rgb_weights w = in_memory_order(to_yuv_weights[j.colour], j.from.packing);
-    any_to_yuv_row *const *const rows = j.rows.to_yuv[size_t(kind_of(j.from.packing))];
+    w.mean = averages(j);
+    any_to_yuv_row *const row = j.rows.to_yuv[size_t(kind_of(j.from.packing))];
     const sharing to = sharing_of(j.to);
-    // Rows give the chroma of every second pixel; pairs of theirs need no strip.
-    const bool by_rows = j.to.u >= 0 && to.across && !averages(j);
-    const bool pairs = by_rows && j.to.kind == format_kind::planar && has_pairs(j.to);
-    if (pairs && j.to.layout == yuv_layout::vu)
-        for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
-    any_to_yuv_row *const row = rows[size_t(!by_rows ? chroma_out::none
-                                            : pairs  ? chroma_out::pairs
-                                                     : chroma_out::half)];
+    // Rows give the chroma of every second pixel, or of two.
+    const bool by_rows = j.to.u >= 0 && to.across;
     const ptrdiff_t rows_at_once = to.down ? 2 : 1;
     if (j.to.u < 0 || (by_rows && j.to.kind == format_kind::planar)) {
         // Straight to their places, whole lines of them.
-        const int of_u = j.to.u < 0 ? 0 : j.to.u, of_v = j.to.u < 0 ? 0 : j.to.v;
+        const bool pairs = by_rows && has_pairs(j.to), planes = by_rows && !pairs;
+        if (pairs && j.to.layout == yuv_layout::vu)
+            for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
+        const int of_u = by_rows ? j.to.u : 0, of_v = by_rows ? j.to.v : 0;
         const const_lines in = j.in(0);
         const lines luma = j.out(0), u = j.out(of_u), v = j.out(of_v);
         const ptrdiff_t chroma_bytes = !by_rows ? 0 : pairs ? 2 : 1;
         const ptrdiff_t chroma_line = chroma_bytes * ((j.width + 1) / 2);
-        const bool column = column_of(j.live, by_rows, 0, j.width, j.height).width > 0 &&
+        // Means would take the second of two.
+        const bool column = !w.mean && column_of(j.live, by_rows, 0, j.width, j.height).width > 0 &&
                             lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
                             lie_apart(v, chroma_line);
         for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
@@ -483,7 +524,8 @@ void rgb_to_yuv_pictures(const job &j) {
             const ptrdiff_t line = y >> to.down;
             // The column has no row that is alone in its pair.
             row(w, in.line(y), two ? in.line(y + 1) : nullptr, luma.line(y),
-                two ? luma.line(y + 1) : nullptr, u.line(line), v.line(line),
+                two ? luma.line(y + 1) : nullptr, by_rows ? u.line(line) : nullptr,
+                planes ? v.line(line) : nullptr,
                 column && (two || !to.down) ? j.width - 1 : j.width);
         }
         if (column) convert_rgb_column(j, w, row, int(chroma_bytes), rows_at_once);
@@ -497,10 +539,9 @@ void rgb_to_yuv_pictures(const job &j) {
         };
         for (ptrdiff_t r = 0; r < b.rows; r += rows_at_once) {
             const uint8_t *const below = to.down && b.rows == 2 ? line(1) : nullptr;
-            row(w, line(r), below, t.y[r], t.y[1], t.u[r], t.v[r], b.width);
+            row(w, line(r), below, t.y[r], t.y[1], by_rows ? t.u[r] : nullptr, t.v[r], b.width);
             if (by_rows) continue;
-            chroma_of_pixels(j, w, line(r), averages(j) ? below : nullptr, to.across, t.u[r],
-                             t.v[r], b.width);
+            chroma_of_pixels(j, w, line(r), w.mean ? below : nullptr, t.u[r], t.v[r], b.width);
         }
         finish_band(j, b, {{t.y[0], t.y[1]}, {t.u[0], t.u[1]}, {t.v[0], t.v[1]}}, t);
     });
@@ -540,7 +581,8 @@ int32_t simgp_csc_any(const simgp_img *src, const simgp_img *dst, int32_t colour
     if (width < 1 || height < 1) return SIMGP_OK;
     if (colour == SIMGP_COLOUR_BT601 && simgp_csc(src, dst) == SIMGP_OK) return SIMGP_OK;
 
-    const row_table &live = live_rows(width);
+    // From YUV to YUV it is rows of chroma that are the shortest.
+    const row_table &live = live_rows(is_rgb(*from) || is_rgb(*to) ? width : (width + 1) / 2);
     const job j{*from, *to, *src, *dst, matrix, mean, width, height, live, live.any, live.layout};
     if (from == to)
         copy_picture(j);

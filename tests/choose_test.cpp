@@ -1,6 +1,9 @@
 // The choice of the instruction set.
 #include "rows/choose.h"
 
+#if defined(__x86_64__) || defined(__i386__)
+#include <cpuid.h>
+#endif
 #ifdef __linux__
 #include <sys/auxv.h>
 #endif
@@ -140,6 +143,17 @@ TEST(choice, follows_the_words_of_the_processor) {
                       (has.avx512 ? "avx512 " : "") + (has.fast_strings ? "erms " : ""),
                   c.has)
             << &c - cases;
+    }
+}
+
+TEST(choice, string_stores_are_for_processors_with_fast_ones) {
+    unsigned eax = 0, ebx = 0, ecx = 0, edx = 0;
+    __get_cpuid_count(7, 0, &eax, &ebx, &ecx, &edx);
+    for (int t = 0; t < int(target::count); t++) {
+        const simgp::mem_rows &rows = simgp::rows_of(target(t)).mem;
+        if (!simgp::target_available(target(t)) || !rows.fill_with_strings) continue;
+        EXPECT_EQ(rows.fill == rows.fill_with_strings, (ebx >> 9 & 1) != 0)
+            << simgp::target_name(target(t));
     }
 }
 #endif

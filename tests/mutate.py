@@ -6,12 +6,15 @@
     ./run mutate --only 'simgp/vector/*' 20
     ./run mutate --again          # those that were not seen, against the tests as they are now
 
-Works on a copy of the tree, with the scalar rows and those of one instruction set. A fault that does not
-compile, or that makes the same code, is replaced by another. The tests are those of the fault's area."""
+Works on copies of the tree. One has the scalar rows and those of one instruction set; the tests are those of
+the fault's area. Others have every vector layer, as x86 and both ARMs compile it, and next to no rows: a fault
+there is for simd_test alone, which is to know all that rows count on. A fault that does not compile, or that
+makes the same code, is replaced by another."""
 
 import argparse
 import difflib
 import fnmatch
+import functools
 import hashlib
 import json
 import os
@@ -29,7 +32,7 @@ SOURCE = pathlib.Path(__file__).resolve().parent.parent
 
 # Which tests belong to which sources, the narrowest first: (names of files, test programs).
 TESTS = [
-    ("tools/probe.cpp tools/stream.* tools/h264.*", "probe"),
+    ("tools/probe.cpp tools/stream.* tools/h264.* tools/description.*", "probe"),
     ("tools/main.h tools/text.* tools/fault.h tools/progress.*", "convert probe"),
     ("tools/*", "convert"),
     ("simgp/vector/any*.h simgp/any.cpp simgp/csc_any.cpp rows/any.h", "csc_any"),
@@ -56,17 +59,49 @@ TESTS = [
     ("scmn/*keyframe.* rows/keyframe.h", "keyframe"),
     ("scmn/*mem.* rows/mem.h", "mem"),
     ("rows/choose.*", "choose"),
+    ("simd/*", "simd"),
     ("*", "csc csc_any layout tile rotate copy resize resize_rot rgb2yuv dither"),
 ]
 FILES = ["simgp/*.cpp", "simgp/*.h", "simgp/vector/*.h", "scmn/*.cpp", "scmn/vector/*.h", "rows/*",
-         "tools/*.cpp", "tools/*.h"]
+         "tools/*.cpp", "tools/*.h", "simd/*.h"]
 LEFT_OUT = ["rows/unit.cpp", "scmn/version.cpp",
-            "simgp/vector/fetch.h"]  # hints to the caches, which change no result
+            "simgp/vector/fetch.h",  # hints to the caches, which change no result
+            "simd/limits.h"]  # refuses to compile, and makes no code
+
+# Which copies judge a file, and what a copy is made of: CMake's options, the processor that runs it, and what
+# is cut from the tree.
+COPIES_OF = [("simd/neon.h", "aarch64 armv7"), ("simd/*", "x86"), ("rows/choose.*", "choose"), ("*", "rows")]
+NO_LANES = ("tests/CMakeLists.txt", r"if\(NOT SIMGP_BIG_ENDIAN\)", "if(OFF)")  # a fault is in those rows, too
+ONE_SET = ("cmake/targets.cmake", r"TARGETS sse41 avx2 avx512\)", "TARGETS avx2)")
+
+
+def areas(names):
+    return "cmake/targets.cmake", r"\(SIMGP_AREAS\n.*?\)", f"(SIMGP_AREAS {names})"
+
+
+NO_TOOLS = "-DSIMGP_BUILD_TOOLS=OFF"
+TOOLCHAINS = "-DCMAKE_TOOLCHAIN_FILE=cmake/toolchains/"
+COPIES = {
+    "rows": ([], [], [ONE_SET, NO_LANES]),
+    "choose": ([NO_TOOLS], [], [areas("scmn/mem simgp/layout simgp/yuv2rgb")]),  # the rows that its test looks at
+    "x86": ([NO_TOOLS], [], [areas("scmn/keyframe"), NO_LANES]),
+    "aarch64": ([NO_TOOLS, TOOLCHAINS + "aarch64-linux-gnu.cmake"],
+                ["qemu-aarch64", "-L", "/usr/aarch64-linux-gnu"], [areas("scmn/keyframe"), NO_LANES]),
+    "armv7": ([NO_TOOLS, TOOLCHAINS + "arm-linux-gnueabihf.cmake"],
+              ["qemu-arm", "-L", "/usr/arm-linux-gnueabihf"], [areas("scmn/keyframe"), NO_LANES]),
+}
 
 SWAPS = {"+": "-", "-": "+", "*": "/", "/": "*", "%": "/", "<": "<=", "<=": "<", ">": ">=", ">=": ">",
          "==": "!=", "!=": "==", "&&": "||", "||": "&&", "<<": ">>", ">>": "<<", "&": "|", "|": "&",
          "+=": "-=", "-=": "+=", "min": "max", "max": "min", "true": "false", "false": "true",
          "even": "odd", "odd": "even", "width": "height", "height": "width"}
+# Parts of the names of instructions: saturating or not, signed or not, rounding or not, the other half.
+INSTRUCTIONS = dict(pair.split("/") for pair in (
+    "adds/add subs/sub unpacklo/unpackhi unpackhi/unpacklo srli/srai srai/srli packus/packs packs/packus "
+    "epu8/epi8 epu16/epi16 mulhi/mullo mulhrs/mulhi min/max max/min "
+    "qadd/add qsub/sub rhadd/hadd shrn/rshrn sra/rsra sri/sli sli/sri get_low/get_high get_high/get_low "
+    "qmovun/movn qshlu/shl qrdmulh/qdmulh addhn/raddhn mlal/mlsl mlsl/mlal cgt/cge bic/and").split())
+SWAPS |= INSTRUCTIONS
 
 
 def swapped(m, _):
@@ -93,6 +128,7 @@ FAULTS = {
     "negation": (r"(?<![\w!])(!)(?=[\w(])", lambda m, _: ""),
     "bits": (r"(?<= )(<<|>>|[&|])(?= )", swapped),
     "word": (r"(?<![\w])(min|max|true|false|even|odd|width|height)(?!\w)", swapped),
+    "instruction": (rf"(?:(?<=_)|\bv)({'|'.join(INSTRUCTIONS)})(?=q?_|\()", swapped),
     "operands": (r"(?<=\()([\w.\[\]+* ]+)(, )([\w.\[\]+* ]+)(?=[,)])", other_order),
     "operands of a difference": (r"(?<![\w.\])] )(?<![\w.])([\w.]+)( - )([\w.]+)(?![\w.(\[])", other_order),
     "dropped line": (r"^ +((?!return\b|const|using|static|auto|typedef|template|struct|\w+_t \w+;)[^{}]*[;])$",
@@ -130,37 +166,46 @@ def faults_of(path, choice):
 
 
 class Copy:
-    """The copy of the tree, its build and its tests."""
+    """A copy of the tree, its build and its tests."""
 
-    def __init__(self, folder, jobs):
+    def __init__(self, folder, name, jobs, tests, limit):
+        options, self.runner, self.cuts = COPIES[name]
+        folder /= name
         self.tree, self.build, self.jobs = folder / "tree", folder / "build", jobs
         self.environment = dict(os.environ, CCACHE_BASEDIR=str(self.tree), CCACHE_NOHASHDIR="1",
-                                SIMGP_TEST_QUICK="1", GTEST_FAIL_FAST="1", GTEST_BRIEF="1",
-                                GTEST_FILTER="-choice.every_target_has_its_own_rows")  # see fewer_targets
+                                SIMGP_TEST_QUICK="1", GTEST_FAIL_FAST="1", GTEST_BRIEF="1")
         self.environment.pop("SIMGP_TEST_EXPECT_TARGET", None)
         self.update()
         launcher = "ccache" if shutil.which("ccache") else ""
         subprocess.run(["cmake", "-S", self.tree, "-B", self.build, "-G", "Ninja", "-DSIMGP_BUILD_BENCH=OFF",
-                        "-DCMAKE_BUILD_TYPE=Release", "-DCMAKE_CXX_FLAGS_RELEASE=-O1",
+                        "-DCMAKE_BUILD_TYPE=Release", "-DCMAKE_CXX_FLAGS_RELEASE=-O1", *options,
                         f"-DCMAKE_C_COMPILER_LAUNCHER={launcher}", f"-DCMAKE_CXX_COMPILER_LAUNCHER={launcher}"],
-                       check=True, stdout=subprocess.DEVNULL)
+                       check=True, cwd=self.tree, stdout=subprocess.DEVNULL)
+        print(f"Building and running the tests as they are ({name}):", *tests, flush=True)
+        if not self.make(tests):
+            sys.exit("The tests do not build.")
+        self.limits = {}
+        for test in tests:
+            start = time.time()
+            if self.fails(test, 10 * limit):
+                sys.exit(f"{test}_test fails without a fault.")
+            self.limits[test] = limit + 3 * (time.time() - start)
+            print(f"  {test}: {time.time() - start:.1f} s", flush=True)
+        self.baseline = self.objects()
 
     def update(self):
         names = subprocess.run(["git", "ls-files", "-co", "--exclude-standard"], cwd=SOURCE, check=True,
                                capture_output=True, text=True).stdout.splitlines()
         for name in names:
             if (SOURCE / name).is_file():
-                self.put(name, self.fewer_targets(name, (SOURCE / name).read_bytes()))
+                self.put(name, self.cut(name, (SOURCE / name).read_bytes()))
                 os.chmod(self.tree / name, (SOURCE / name).stat().st_mode)
 
-    @staticmethod
-    def fewer_targets(name, content):
-        """One instruction set of those that x86 offers, and no vector rows over lanes: a fault is in all of them."""
-        shorter = {"cmake/targets.cmake": (b"TARGETS sse41 avx2 avx512)", b"TARGETS avx2)"),
-                   "tests/CMakeLists.txt": (b"if(NOT SIMGP_BIG_ENDIAN)", b"if(OFF)")}
-        if name in shorter:
-            assert shorter[name][0] in content, name
-            content = content.replace(*shorter[name])
+    def cut(self, name, content):
+        for file, what, by in self.cuts:
+            if name == file:
+                content, times = re.subn(what.encode(), by.encode(), content, flags=re.S)
+                assert times == 1, (name, what)
         return content
 
     def put(self, name, content):
@@ -185,8 +230,8 @@ class Copy:
             resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
             resource.setrlimit(resource.RLIMIT_FSIZE, (1 << 30, 1 << 30))
             resource.setrlimit(resource.RLIMIT_DATA, (4 << 30, 4 << 30))
-        process = subprocess.Popen([self.build / "tests" / f"{test}_test"], cwd=self.build, env=self.environment,
-                                   stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL,
+        process = subprocess.Popen([*self.runner, self.build / "tests" / f"{test}_test"], cwd=self.build,
+                                   env=self.environment, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL,
                                    stderr=subprocess.DEVNULL, start_new_session=True, preexec_fn=bounds)
         try:
             return process.wait(limit) != 0
@@ -200,42 +245,62 @@ class Copy:
             process.wait()
 
 
+def first_match(table, name):
+    return next(found.split() for patterns, found in table
+                if any(fnmatch.fnmatch(name, pattern) for pattern in patterns.split()))
+
+
 def tests_of(name):
-    for patterns, tests in TESTS:
-        if any(fnmatch.fnmatch(name, pattern) for pattern in patterns.split()):
-            return tests.split()
+    return first_match(TESTS, name)
+
+
+def place(fault, lines):
+    """Where the line of a fault is now, or None: the file may have changed since."""
+    number, before = fault["line"], fault["before"]
+    if lines[number:number + 1] == [before]:
+        return number
+    return lines.index(before) if lines.count(before) == 1 else None
 
 
 def show(fault):
-    name, number = fault["file"], fault["line"]
+    name = fault["file"]
     lines = (SOURCE / name).read_text().split("\n")
-    at = lines.index(fault["before"]) if lines[number:number + 1] != [fault["before"]] else number
+    at = place(fault, lines)
+    if at is None:
+        return f"{name}: no longer there: {fault['before'].strip()}"
     faulty = lines[:at] + [fault["after"]] + lines[at + 1:]
     return "\n".join(difflib.unified_diff(lines, faulty, name, name, n=2, lineterm=""))
 
 
-def run_fault(copy, fault, baseline, limits):
+def run_fault(copies, fault):
     """"nothing" if it does not compile, "same" if the code is the same, the test that saw it, or None."""
+    results = []
+    for name in first_match(COPIES_OF, fault["file"]):
+        results.append(run_in(copies(name), fault))
+        if results[-1] not in ("same", None):
+            return results[-1]
+    return None if None in results else "same"
+
+
+def run_in(copy, fault):
     name, tests = fault["file"], tests_of(fault["file"])
-    original = copy.fewer_targets(name, (SOURCE / name).read_bytes())
+    original = copy.cut(name, (SOURCE / name).read_bytes())
     lines = original.decode().split("\n")
-    number = fault["line"]
-    if lines[number:number + 1] != [fault["before"]]:  # the file has changed since
-        if lines.count(fault["before"]) != 1:
-            return "nothing"
-        number = lines.index(fault["before"])
+    number = place(fault, lines)
+    if number is None:
+        return "nothing"
     lines[number] = fault["after"]
     start = time.time() - 1
     copy.put(name, "\n".join(lines).encode())
     try:
         if not copy.make(tests[:1]):
             return "nothing"
-        if all(baseline.get(path) == code for path, code in copy.objects(start).items()):
+        if all(copy.baseline.get(path) == code for path, code in copy.objects(start).items()):
             return "same"
         for test in tests:
             if not copy.make([test]):
                 return "nothing"
-            if copy.fails(test, limits[test]):
+            if copy.fails(test, copy.limits[test]):
                 return test
         return None
     finally:
@@ -277,25 +342,17 @@ def main():
     folder.mkdir(parents=True, exist_ok=True)
     log = folder / f"seed-{arguments.seed}.json"
     done = json.loads(log.read_text()) if log.exists() else {}
-    copy = Copy(folder, arguments.jobs)
     public = set(re.findall(r"\b(?:simgp|scmn)/\w+\.h", (SOURCE / "CMakeLists.txt").read_text()))
     files = list(sources(arguments.only or ["*"], public))
-    all_tests = sorted({test for name, _ in files for test in tests_of(name)})
-    print("Building and running the tests as they are:", *all_tests, flush=True)
-    if not copy.make(all_tests):
-        sys.exit("The tests do not build.")
-    limits = {}
-    for test in all_tests:
-        start = time.time()
-        if copy.fails(test, 10 * arguments.limit):
-            sys.exit(f"{test}_test fails without a fault.")
-        limits[test] = arguments.limit + 3 * (time.time() - start)
-        print(f"  {test}: {time.time() - start:.1f} s", flush=True)
-    baseline = copy.objects()
+
+    @functools.cache
+    def copies(name):
+        tests = {test for file, _ in files if name in first_match(COPIES_OF, file) for test in tests_of(file)}
+        return Copy(folder, name, arguments.jobs, sorted(tests), arguments.limit)
 
     def settle(key, fault):
         start = time.time()
-        fault["seen"] = run_fault(copy, fault, baseline, limits)
+        fault["seen"] = run_fault(copies, fault)
         if fault["seen"] in ("nothing", "same"):
             return False
         done[key] = fault
@@ -314,13 +371,16 @@ def main():
                 log.write_text(json.dumps(done, indent=1))
     else:
         chosen = ",".join(arguments.only or [])
+        one = lambda fault: (fault["file"], fault["before"], fault["after"])
+        tried = {one(fault) for fault in done.values()}
         for i in range(arguments.count):
             key = f"{chosen}#{i}"
             attempt = 0
-            while key not in done:
+            while key not in done and attempt < 1000:
                 fault = random_fault(f"{arguments.seed}/{key}/{attempt}", files)
                 attempt += 1
-                if fault:
+                if fault and one(fault) not in tried:
+                    tried.add(one(fault))
                     settle(key, fault)
 
     unseen = [fault for fault in done.values() if fault["seen"] is None]

@@ -477,10 +477,27 @@ TEST_F(play_test, what_cannot_be_shown_ends_in_one_line) {
         EXPECT_EQ(got.err.find(std::string("simgp-play: ") + file), 0u) << got.err;
         EXPECT_EQ(got.out, "") << file;
     }
-    const auto got =
-        program::run(place, "DISPLAY=:nowhere SDL_VIDEODRIVER=x11 " SIMGP_PLAY " testcard:");
-    EXPECT_EQ(got.status, 1);
-    EXPECT_EQ(std::count(got.err.begin(), got.err.end(), '\n'), 1) << got.err;
+    for (const char *nowhere : {"DISPLAY=:nowhere SDL_VIDEODRIVER=x11 ",
+                                "env -u DISPLAY -u WAYLAND_DISPLAY -u SDL_VIDEODRIVER "}) {
+        const auto got =
+            program::run(place, nowhere + std::string("timeout 20 " SIMGP_PLAY " testcard:"));
+        EXPECT_EQ(got.status, 1) << nowhere;
+        EXPECT_NE(got.err.find("simgp-play: no screen: "), std::string::npos) << got.err;
+    }
+}
+
+// As with the keys: a line, and the film goes on.
+TEST_F(play_test, what_the_options_ask_for_in_vain_stays_off) {
+    shell("$C testcard:64x48 -o card.png");
+    for (const std::string options : {"testcard:64x48 --dither --rgb32", "card.png --deblock"}) {
+        const auto got = program::run(place, "cd " + place / "" +
+                                                 "; SDL_VIDEODRIVER=dummy timeout 20 " SIMGP_PLAY
+                                                 " -n 1 --screenshot shot.png " +
+                                                 options);
+        EXPECT_EQ(got.status, 0) << options;
+        EXPECT_EQ(std::count(got.err.begin(), got.err.end(), '\n'), 1) << got.err;
+        expect_same(png("shot.png"), png("card.png"), options);
+    }
 }
 
 }  // namespace

@@ -267,6 +267,28 @@ TEST(yuv2rgb, grey_works_over_its_own_luma) {
                             };
                             return j;
                         });
+    // Columns of many lines, whose last pixels are made together.
+    rig::rng random(rig::seed());
+    for (const int width : {1, 5, 17, 33, 65, 129})
+        for (const int height : {65, 129, 200}) {
+            rig::plane apart(rig::samples(width, height), {}),
+                over(rig::samples(2 * width, height), {});
+            rig::plane expected(rig::samples(2 * width, height), {});
+            apart.fill(rig::content::random, random);
+            const int strides[] = {int(apart.stride()), int(over.stride()), int(expected.stride())};
+            rig::for_each_target([&](const rig::target_rows &) {
+                uint8_t *const luma[] = {apart.row(0)}, *const same[] = {over.row(0) + width};
+                uint8_t *const out[] = {expected.row(0)}, *const same_out[] = {over.row(0)};
+                for (int y = 0; y < height; y++)
+                    memcpy(over.row(y) + width, apart.row(y), size_t(width));
+                simgp_csc_yuv400_to_rgb565(luma, &width, &height, strides, strides + 2, out);
+                simgp_csc_yuv400_to_rgb565(same, &width, &height, strides + 1, strides + 1,
+                                           same_out);
+                for (int y = 0; y < height; y++)
+                    ASSERT_EQ(memcmp(over.row(y), expected.row(y), size_t(2 * width)), 0)
+                        << width << " x " << height << ", line " << y;
+            });
+        }
 }
 
 }  // namespace

@@ -44,12 +44,15 @@ struct options {
 // The lines of a table, by their names.
 std::map<std::string, uint32_t> table_of(std::istream &in, const std::string &name) {
     std::map<std::string, uint32_t> table;
+    int number = 0;
     for (std::string line; std::getline(in, line);) {
+        ++number;
         if (line.empty() || line[0] == '#') continue;
         char function[64];
         unsigned checksum;
         if (sscanf(line.c_str(), "%63s %8x", function, &checksum) != 2)
-            throw fault(name, ": no table of checksums: ", line);
+            throw fault(name, ": no table of checksums: line ", number,
+                        " is not a name and eight digits");
         table[function] = checksum;
     }
     if (table.empty()) throw fault(name, ": no table of checksums");
@@ -155,7 +158,8 @@ int run(const options &o) {
     }
     if (o.compare) {
         if (different == 0)
-            printf("OK, %zu functions, all %08x\n", known, unsigned(all.value()));
+            printf("OK, %zu function%s, all %08x\n", known, known == 1 ? "" : "s",
+                   unsigned(all.value()));
         else
             describe_machine();
     } else if (!o.list && o.only.empty()) {

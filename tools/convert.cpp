@@ -11,7 +11,8 @@ namespace {
 constexpr const char *examples = R"(
 Inputs: Y4M video (mono, 4:2:0, 4:2:2, 4:4:4 of 8 bits), PNG, PPM, numbered files such as
 in-%04d.png (from 0 or 1 on), raw frames with --format and --size, a moving test card
-testcard:[WIDTHxHEIGHT][@FRAMES], and "-" for the standard input.
+testcard:[WIDTHxHEIGHT][@FRAMES] (one frame of 640x480, unless it says more), and "-" for the
+standard input.
 Outputs by their ending: .png, .ppm, .y4m, anything else raw frames; "-" is the standard output.
 
 Between YUV and RGB, colours are what --colour says; without it, what the Y4M header says in its tags
@@ -54,16 +55,10 @@ int main(int argc, char **argv) {
     app.add_option("-f,--format", job.source.format, "format of raw frames or of the test card");
     app.add_option("-s,--size", job.source.size, "size of raw frames, such as 640x480");
     app.add_option("-n,--frames", job.frames, "stop after so many frames; all without it")
-        ->check(CLI::Validator(
-            [](const std::string &text) -> std::string {
-                const bool number = !text.empty() && text.size() < 19 &&
-                                    text.find_first_not_of("0123456789") == std::string::npos;
-                if (number && std::stoll(text) > 0) return {};
-                return text + " is not a number of frames from 1 on; leave it out for all of them";
-            },
-            "", ""));
-    app.add_flag("!--no-clobber", job.may_replace, "leave files alone that are there already");
-    app.add_option("--colour", job.source.colour,
+        ->check(tools::at_least_one("; leave it out for all of them"));
+    bool keep = false;
+    app.add_flag("--no-clobber", keep, "leave files alone that are there already");
+    app.add_option("--colour,--color", job.source.colour,
                    "what Y, U and V mean, instead of what the input says of it (see below)")
         ->check(CLI::IsMember(tools::colour_names()));
     std::string chroma = "first";
@@ -73,7 +68,7 @@ int main(int argc, char **argv) {
     app.add_flag("-d,--dither", job.dither, "dither on the way to 16-bit RGB");
     app.add_option("--deblock", job.edit.deblock,
                    "smooth the edges between blocks of 8 x 8, 0 (not at all) to 15; YUV only")
-        ->check(CLI::Range(0, 15));
+        ->check(CLI::Range(0, 15).description(""));
     const auto resize = app.add_option("--resize", job.resize,
                                        "size of what comes out, such as 320x240, after the turn");
     std::string turn(tools::turn_names[SIMGP_ROT_NONE]);
@@ -87,8 +82,8 @@ int main(int argc, char **argv) {
         ->excludes(resize)
         ->excludes(rotate);
     app.add_flag("--sheet", job.sheet, "put the frames on one contact sheet");
-    app.add_option("--columns", job.columns, "pictures in a row of the sheet")
-        ->check(CLI::PositiveNumber);
+    const auto columns = app.add_option("--columns", job.columns, "pictures in a row of the sheet")
+                             ->check(tools::at_least_one());
     app.add_option("--as", job.as, "kind of output, whatever its name says")
         ->check(CLI::IsMember({"png", "ppm", "y4m", "raw"}));
     app.add_flag("-v,--verbose", job.verbose, "say which way the frames go, and who does what");
@@ -99,9 +94,15 @@ int main(int argc, char **argv) {
                    "write pictures that show what the library does into this folder");
 
     const auto check = [&] {
-        if (list || !demo.empty()) return;
+        if (list) return;
+        if (!demo.empty()) {
+            if (!job.output.empty()) throw CLI::ExcludesError("--demo", "--output");
+            return;
+        }
+        if (columns->count() > 0 && !job.sheet) throw CLI::RequiresError("--columns", "--sheet");
         if (job.source.path.empty()) throw CLI::RequiredError("input");
         if (job.output.empty()) throw CLI::RequiredError("--output");
+        job.may_replace = !keep;
         job.chroma_mean = chroma == "mean";
         job.edit.turn =
             int(std::find(std::begin(tools::turn_names), std::end(tools::turn_names), turn) -

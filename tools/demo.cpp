@@ -56,35 +56,47 @@ std::vector<tile> every_rgb(std::vector<picture> &frames) {
     return tiles;
 }
 
-// Every conversion from YUV to RGB that the library has, on the test card.
-std::vector<tile> every_pair() {
+// The size of a picture whose longer side has `side` pixels.
+edits shrunk_to(const picture &p, int side) {
+    const int longer = std::max(p.width(), p.height());
+    edits edit;
+    edit.width = std::max(p.width() * side / longer, 1);
+    edit.height = std::max(p.height() * side / longer, 1);
+    return edit;
+}
+
+// Every conversion from YUV to RGB that the library has.
+std::vector<tile> every_pair(picture &frame) {
     std::vector<tile> tiles;
-    for (const pixel_format &from : formats())
+    for (const pixel_format &from : formats()) {
+        if (from.is_rgb()) continue;
+        road shrink(frame.shape(), from, false, shrunk_to(frame, 192));
+        picture &small = shrink.run(frame);
         for (const pixel_format &to : formats()) {
-            if (from.is_rgb() || !to.is_rgb() || !offered(from, to, method::csc)) continue;
-            auto card = open_testcard("testcard:192x144", from);
-            picture frame;
-            card->next(frame);
-            road r(frame.shape(), to, false);
-            tiles.push_back(make_tile(r.run(frame), upper_label(r), 192, 144));
+            if (!to.is_rgb() || !offered(from, to, method::csc)) continue;
+            road r(small.shape(), to, false);
+            tiles.push_back(make_tile(r.run(small), upper_label(r), 192, 192));
         }
+    }
     return tiles;
 }
 
-// A clip in BT.709 and one in full range, as what they are and as the BT.601 that they are not.
-std::vector<tile> right_and_wrong() {
+// The frame as one in BT.709 and as one in full range, shown as what they are and as the BT.601 that
+// they are not.
+std::vector<tile> right_and_wrong(picture &frame) {
     std::vector<tile> tiles;
+    const pixel_format &screen = format_coded(SIMGP_FMT_RGB888);
+    road shrink(frame.shape(), screen, false, shrunk_to(frame, 480));
+    picture &small = shrink.run(frame);
     for (const std::string name : {"bt709", "bt601-full"})
         for (const std::string &taken_for : {name, std::string("bt601")}) {
-            const colour &drawn_in = colour_named(name);
-            auto card = open_testcard("testcard:480x288", format_coded(SIMGP_FMT_NV12), &drawn_in);
-            picture frame;
-            card->next(frame);
-            road r(frame.shape(), format_coded(SIMGP_FMT_RGB888), false, {},
-                   colour_named(taken_for).code);
+            road coded(small.shape(), format_coded(SIMGP_FMT_NV12), false, {},
+                       colour_named(name).code);
+            picture &film = coded.run(small);
+            road shown(film.shape(), screen, false, {}, colour_named(taken_for).code);
             const std::string label =
                 name + (taken_for == name ? ": right" : " taken for bt601: wrong");
-            tiles.push_back(make_tile(r.run(frame), label, 480, 288));
+            tiles.push_back(make_tile(shown.run(film), label, 480, 480));
         }
     return tiles;
 }
@@ -155,15 +167,6 @@ std::vector<tile> tiles_and_dithering(picture &frame) {
     compare(soft, 96, 48, 4, "x 4: ");
     compare(frame, 192, 144, 2, "frame x 2: ");
     return tiles;
-}
-
-// The size of a picture whose longer side has `side` pixels.
-edits shrunk_to(const picture &p, int side) {
-    const int longer = std::max(p.width(), p.height());
-    edits edit;
-    edit.width = std::max(p.width() * side / longer, 1);
-    edit.height = std::max(p.height() * side / longer, 1);
-    return edit;
 }
 
 // A tiled frame that is resized, converted and turned for a screen that stands upright; and the
@@ -305,10 +308,9 @@ void demo(const std::string &directory, const source_options &options) {
            wanted.path != "-"  ? in->name().c_str()
            : frames.size() > 1 ? "the video"
                                : "the picture");
-    save(folder + "every-yuv-to-rgb.png", every_pair(), 7);
-    printf("%severy-yuv-to-rgb.png: the test card through every YUV to RGB conversion\n",
-           folder.c_str());
-    save(folder + "right-and-wrong-colour.png", right_and_wrong(), 2);
+    save(folder + "every-yuv-to-rgb.png", every_pair(frames.front()), 7);
+    printf("%severy-yuv-to-rgb.png: every YUV to RGB conversion\n", folder.c_str());
+    save(folder + "right-and-wrong-colour.png", right_and_wrong(frames.front()), 2);
     printf("%sright-and-wrong-colour.png: BT.709 and full range, taken for what they are or not\n",
            folder.c_str());
     save(folder + "tiles-and-dithering.png", tiles_and_dithering(frames.front()), 3);

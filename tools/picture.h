@@ -36,15 +36,13 @@ struct pixel_format {
     family kind;
     int plane_count;
     plane_shape planes[3];
-    channel channels[3];  // Y, U, V or R, G, B; of no use where has_samples() is false
+    channel channels[3];  // Y, U, V or R, G, B; of no use in tiles and in 16 bits
 
     bool is_rgb() const { return kind == family::rgb || is_rgb16(); }
     bool is_rgb16() const { return kind == family::rgb16; }
     bool is_tiled() const { return kind == family::tiled; }
     // Two pixels share a group, which the last pixel of an odd line has only half of.
     bool is_packed() const { return kind == family::packed; }
-    // Every sample is a byte with a place that `channels` gives.
-    bool has_samples() const { return !is_tiled() && !is_rgb16(); }
     // A chroma sample stands for 2^chroma_x_shift() x 2^chroma_y_shift() pixels; shifts of 0 where
     // there is no chroma.
     int chroma_x_shift() const { return is_packed() ? 1 : planes[plane_count - 1].x_shift; }
@@ -105,7 +103,8 @@ class picture {
     // nobody looks at what the added column and line hold.
     simgp_img descriptor(bool even_width = false, bool even_height = false);
 
-    // The sample of channel `number` (Y, U, V or R, G, B) of pixel (x, y). The format has_samples().
+    // The sample of channel `number` (Y, U, V or R, G, B) of pixel (x, y): a byte, so neither in tiles nor
+    // in 16 bits.
     uint8_t *sample(int number, int x, int y) {
         const channel &c = format().channels[number];
         return line(c.plane, y >> c.y_shift) + c.first + c.step * (x >> c.x_shift);

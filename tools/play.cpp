@@ -6,7 +6,7 @@ namespace {
 
 constexpr const char *keys = R"(
 Keys:
-  space   pause            .   one frame on          left, right   to the key frame before, behind
+  space   pause            .   one frame on          left, right   to the key frame before, after
   r       quarter turn     h   mirror left to right  v             mirror top to bottom
   d       dither           b   deblock               f             16 or 32 bits a pixel
   o       overlay          s   screenshot            q, Esc        quit
@@ -28,23 +28,26 @@ int main(int argc, char **argv) {
     app.footer(keys);
     tools::play_options options;
     bool rgb565 = false, rgb32 = false, deblock = false;
-    app.add_option("film", options.path, "any film that FFmpeg reads, or testcard:[WxH][@FRAMES]")
+    app.add_option("film", options.path,
+                   "any film that FFmpeg reads, or testcard:[WxH][@FRAMES], 640x480 without end")
         ->required();
     app.add_flag("--tiled", options.first.tiled,
                  "bring frames into tiles of 64 x 32 first, as hardware decoders write them");
     const auto in_16 = app.add_flag("--rgb565", rgb565, "16-bit pixels, whatever the screen has");
     app.add_flag("--rgb32", rgb32, "32-bit pixels, whatever the screen has")->excludes(in_16);
-    app.add_flag("-d,--dither", options.first.dither, "dither, on the way to 16-bit pixels");
+    app.add_flag("-d,--dither", options.first.dither,
+                 "dither, on the way to 16-bit pixels; --rgb565 asks for these");
     app.add_flag("-b,--deblock", deblock, "smooth the edges between blocks of 8 x 8");
     app.add_flag("--overlay", options.overlay,
                  "tell format, size, steps, instruction set and milliseconds");
     app.add_option("-s,--size", options.size, "size of the window, such as 640x480");
     app.add_option("-n,--frames", options.frames, "stop after so many frames")
-        ->check(CLI::PositiveNumber);
+        ->check(tools::at_least_one());
     app.add_flag("--pause", options.paused, "begin with the first frame, standing");
     const auto screenshot =
         app.add_option("--screenshot", options.screenshot,
-                       "file for the key s (simgp-play.png), and for the last of --frames");
+                       "PNG file for the key s (simgp-play.png), and for the last of --frames");
+    app.set_version_flag("--version", "simgp-play " SIMGP_TOOLS_VERSION);
     const auto check = [&] {
         if (rgb565) options.format = "rgb565";
         if (rgb32) options.format = "bgra8888";

@@ -72,6 +72,11 @@ class player {
             options.format.empty() ? &window_->natural_format() : &format_named(options.format);
         overlay_on_ = options.overlay;
         paused_ = options.paused;
+        // As if their keys had been pressed.
+        look_.dither = false;
+        look_.deblock = 0;
+        if (options.first.dither) press('d');
+        if (options.first.deblock) press('b');
     }
 
     void run() {
@@ -218,6 +223,9 @@ class player {
     // Takes over a look, unless the library cannot do it to these frames.
     void change(const look &wish) {
         try {
+            if (wish.dither && !wish.format->is_rgb16())
+                throw fault("there is no dithering of 32-bit pixels; --rgb565 or the key f asks ",
+                            "for 16 bits");
             prepare(wish);
             look_ = wish;
             stale_ = true;

@@ -1,6 +1,7 @@
 #include "tools/play_window.h"
 
 #include <SDL.h>
+#include <string.h>
 
 #include <algorithm>
 #include <cmath>
@@ -48,6 +49,12 @@ window::window(const std::string &title, int width, int height, bool fixed) {
     // A screen saver may come; desktop effects may stay.
     SDL_SetHint(SDL_HINT_VIDEO_X11_NET_WM_BYPASS_COMPOSITOR, "0");
     if (SDL_Init(SDL_INIT_VIDEO) != 0) quit_and_fail("no screen");
+    // Where SDL2 finds no screen it draws into memory. That is for those who ask for it.
+    const char *asked = SDL_getenv("SDL_VIDEODRIVER");
+    if (!(asked && *asked) && strcmp(SDL_GetCurrentVideoDriver(), "offscreen") == 0) {
+        SDL_Quit();
+        throw fault("no screen: neither DISPLAY nor WAYLAND_DISPLAY leads to one");
+    }
     SDL_Rect room;
     if (!fixed && SDL_GetDisplayUsableBounds(0, &room) == 0 && room.w > 0 && room.h > 0) {
         const double shrink = std::min({1., double(room.w) / width, double(room.h) / height});

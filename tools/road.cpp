@@ -267,25 +267,20 @@ std::string road::text() const {
 
 std::string road::loss() const {
     if (steps_.size() < 2) return {};
-    const pixel_format &to = *steps_.back().out().format;
-    // The coarsest chroma on the way; quarter turns exchange its directions.
+    // The coarsest chroma on the way; quarter turns exchange its directions. Bits and colour itself are
+    // dear enough for no road to lead through less of them than its ends have.
     int x_shift = 0, y_shift = 0;
-    bool grey = false;
     const auto pass = [&](const pixel_format &f) {
-        grey |= f.chroma() == 0;
         x_shift = std::max(x_shift, f.chroma_x_shift());
         y_shift = std::max(y_shift, f.chroma_y_shift());
     };
     pass(*from_.format);
     for (const step &s : steps_) {
-        const pixel_format &f = *s.out().format;
-        if (f.is_rgb16() && !from_.format->is_rgb16() && !to.is_rgb16()) return "16-bit colour";
         if (s.turns() && is_quarter(s.code())) std::swap(x_shift, y_shift);
-        pass(f);
+        pass(*s.out().format);
     }
-    const int kept = grey ? 0 : 4 >> (x_shift + y_shift);
-    if (kept >= std::min(from_.format->chroma(), to.chroma())) return {};
-    return kept == 0 ? "luma alone" : kept == 1 ? "4:2:0 chroma" : "4:2:2 chroma";
+    const int ends = std::min(from_.format->chroma(), steps_.back().out().format->chroma());
+    return 4 >> (x_shift + y_shift) < ends ? "4:2:0 chroma" : "";
 }
 
 std::vector<std::unique_ptr<road>> roads(const picture_shape &from, const pixel_format &to,

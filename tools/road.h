@@ -37,7 +37,7 @@ class road : public stage {
     // "nv12 -> yuv420 -> rgb565 (dithered)"
     std::string text() const override;
     picture_shape out() const override;
-    // What a step on the way loses that both ends could hold; empty if nothing.
+    // What is left on the way of the chroma that both ends could hold; empty if all of it.
     std::string loss() const;
     // Comparable between roads: fewer and gentler steps cost less.
     int cost() const { return cost_; }

@@ -11,15 +11,16 @@ namespace {
 // What ffmpeg can read and this program cannot, by how it begins; null for everything else.
 const char *foreign_kind(std::string_view begin) {
     using namespace std::string_view_literals;
-    return begin.starts_with("\xFF\xD8\xFF"sv)                                      ? "a JPEG"
-           : begin.substr(0, 8).ends_with("ftyp")                                   ? "an MP4"
-           : begin.starts_with("\x1A\x45\xDF\xA3"sv)                                ? "a Matroska"
-           : begin.starts_with("RIFF")                                              ? "a RIFF"
-           : begin.starts_with("GIF8")                                              ? "a GIF"
-           : begin.starts_with("BM")                                                ? "a BMP"
-           : begin.starts_with("II*\0"sv) || begin.starts_with("MM\0*"sv)           ? "a TIFF"
-           : begin.starts_with("\x30\x26\xB2\x75"sv)                                ? "an ASF"
-           : begin.starts_with("FLV")                                               ? "an FLV"
+    return begin.starts_with("\xFF\xD8\xFF"sv)                            ? "a JPEG"
+           : begin.substr(0, 8).ends_with("ftyp")                         ? "an MP4"
+           : begin.starts_with("\x1A\x45\xDF\xA3"sv)                      ? "a Matroska"
+           : begin.starts_with("RIFF")                                    ? "a RIFF"
+           : begin.starts_with("GIF8")                                    ? "a GIF"
+           : begin.starts_with("BM")                                      ? "a BMP"
+           : begin.starts_with("II*\0"sv) || begin.starts_with("MM\0*"sv) ? "a TIFF"
+           : begin.starts_with("\x30\x26\xB2\x75"sv)                      ? "an ASF"
+           : begin.starts_with("FLV")                                     ? "an FLV"
+           : begin.starts_with("\0\0\0\1"sv)                              ? "an H.264 or H.265"
            : begin.starts_with("\0\0\1\xBA"sv) || begin.starts_with("\0\0\1\xB3"sv) ? "an MPEG"
                                                                                     : nullptr;
 }
@@ -27,23 +28,27 @@ const char *foreign_kind(std::string_view begin) {
 std::unique_ptr<source> open_file(const source_options &options, const std::string &path) {
     const pixel_format *format = options.format.empty() ? nullptr : &format_named(options.format);
     auto in = std::make_unique<input>(path);
+    const std::string begin = in->peek(12);
+    const bool png = begin.starts_with("\x89PNG\r\n\x1a\n"), y4m = begin.starts_with("YUV4MPEG2");
+    const bool ppm = (begin.starts_with("P6") || begin.starts_with("P5")) && begin.size() > 2 &&
+                     isspace(static_cast<unsigned char>(begin[2]));
+    // "frames.nv21" names the format of raw frames by its ending.
+    const pixel_format *raw = format ? format : find_format(ending_of(path));
     if (!options.size.empty()) {
-        // "frames.nv21" names its format by its ending.
-        if (!format) format = find_format(ending_of(path));
-        if (!format)
+        if (!raw && (png || y4m || ppm))
+            throw fault(in->name(), ": --size is for raw frames; this file says its own, which ",
+                        "--resize changes");
+        if (!raw)
             throw fault(in->name(),
                         ": raw frames need --format as well as --size, such as --format ",
                         "nv21 --size ", options.size);
-        picture_shape shape{format};
+        picture_shape shape{raw};
         parse_size(options.size, "--size", shape.width, shape.height);
         return open_raw(std::move(in), shape);
     }
-    const std::string begin = in->peek(12);
     if (begin.empty()) in->fail(-1, 0, "the input is empty");
-    const bool ppm = begin.starts_with("P6") || begin.starts_with("P5");
-    if (begin.starts_with("\x89PNG\r\n\x1a\n"))
-        return open_png(std::move(in), format ? *format : format_named("rgb888"));
-    if (begin.starts_with("YUV4MPEG2") || (ppm && begin.size() > 2 && isspace(begin[2]))) {
+    if (png) return open_png(std::move(in), format ? *format : format_named("rgb888"));
+    if (y4m || ppm) {
         auto opened = ppm ? open_ppm(std::move(in)) : open_y4m(std::move(in));
         if (format && format != opened->shape().format)
             throw fault(opened->name(), ": holds ", opened->shape().format->name, ", not ",
@@ -54,6 +59,9 @@ std::unique_ptr<source> open_file(const source_options &options, const std::stri
         throw fault(in->name(), ": ", kind, " file; ffmpeg reads it: ffmpeg -i ",
                     path == "-" ? "FILE" : "'" + path + "'",
                     " -f yuv4mpegpipe -pix_fmt yuv420p - | simgp-convert - -o OUTPUT");
+    if (raw)
+        throw fault(in->name(), ": raw frames of ", raw->name,
+                    " need --size, such as --size 640x480");
     throw fault(in->name(),
                 ": neither Y4M nor PNG nor PPM; raw frames need --format and --size, such as "
                 "--format nv21 --size 640x480");

@@ -58,7 +58,7 @@ std::unique_ptr<source> open_ppm(std::unique_ptr<input> in);
 std::unique_ptr<source> open_raw(std::unique_ptr<input> in, const picture_shape &shape);
 // `drawn_in` is what it is drawn in; null: the usual one of its size.
 std::unique_ptr<source> open_testcard(const std::string &spec, const pixel_format &format,
-                                      const colour *drawn_in = nullptr);
+                                      const colour *drawn_in);
 
 }  // namespace tools
 

@@ -153,9 +153,10 @@ bool offered(const pixel_format &from, const pixel_format &to, method how, int t
         default:
             break;
     }
-    static std::vector<signed char> known(size_t(method::count) * 6 * all.size() * all.size());
+    constexpr size_t turns = SIMGP_ROT_VERT + 1;
+    static std::vector<signed char> known(size_t(method::count) * turns * all.size() * all.size());
     signed char &answer =
-        known[((size_t(how) * 6 + size_t(turn)) * all.size() + index(from)) * all.size() +
+        known[((size_t(how) * turns + size_t(turn)) * all.size() + index(from)) * all.size() +
               index(to)];
     if (answer == 0) {  // not asked
         const bool smaller =

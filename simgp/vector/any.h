@@ -283,7 +283,8 @@ struct any_yuv_matrix {
           black(set_u8(w.black)) {}
 
     u8v luma(rgb_v p) const { return add_u8(dot_high(p, y), black); }
-    // Pairs of U and V.
+    // Pairs of U and V of the even pixels.
+    static rgb_v even_pixels(rgb_v p) { return p; }
     u8v chroma(rgb_v p) const {
         const auto sum = [&](const channel_factors &f) {
             return as_u16(sub_sat(half, even_dot(p, f)));
@@ -303,8 +304,9 @@ struct any_yuv_matrix<pixel_kind::four> {
           v(set_quad_factors(w.alpha_first, -w.v[0], -w.v[1], -w.v[2])) {}
 
     u8v luma(const quads_v &p) const { return dot_high(p, y); }
-    u8v chroma(const quads_v &p) const {
-        return bit_xor(even_dots_high(p, u, v, half), set_u8(128));
+    static half_quads_v even_pixels(const quads_v &p) { return even_quads(p); }
+    u8v chroma(const half_quads_v &p) const {
+        return bit_xor(dots_high(p, u, v, half), set_u8(128));
     }
 };
 
@@ -316,78 +318,97 @@ inline auto load_pixels(const uint8_t *p) {
         return load_pixels<rgb_in(Kind)>(p);
 }
 
-// Less than a vector goes through the stack, by the row itself. A pixel has `size` bytes, and the
-// chroma of two `chroma_size` in u (0: there is none); with one of them, v has the other.
-struct any_yuv_sizes {
-    int size, chroma_size;
-};
-[[gnu::noinline]] static void any_yuv_part(any_to_yuv_row *row, any_yuv_sizes of,
-                                           const rgb_weights &w, const uint8_t *src0,
-                                           const uint8_t *src1, uint8_t *y0, uint8_t *y1,
-                                           uint8_t *u, uint8_t *v, ptrdiff_t x, int count) {
+// Less than a vector goes through the stack, by the row itself. Of a last pixel alone, the mean is that of
+// it and itself.
+[[gnu::noinline]] static void any_yuv_part(any_to_yuv_row *row, int size, const rgb_weights &w,
+                                           const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                                           uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t x,
+                                           int count) {
     uint8_t pixels[2][bytes * 4], to_y[2][bytes], to_u[bytes], to_v[bytes];
-    stage_few(pixels[0], of.size, src0 + of.size * x, count, of.size);
-    if (src1) stage_few(pixels[1], of.size, src1 + of.size * x, count, of.size);
-    row(w, pixels[0], src1 ? pixels[1] : nullptr, to_y[0], to_y[1], to_u, to_v, bytes);
+    const auto stage = [&](uint8_t *to, const uint8_t *src) {
+        stage_few(to, size, src + size * x, count, size);
+        // One pixel of four bytes is staged over and over.
+        if (w.mean && (count & 1) && (count > 1 || size < 4))
+            copy_few(to + size * count, src + size * (x + count - 1), size);
+    };
+    stage(pixels[0], src0);
+    if (src1) stage(pixels[1], src1);
+    row(w, pixels[0], src1 ? pixels[1] : nullptr, to_y[0], to_y[1], u ? to_u : nullptr,
+        v ? to_v : nullptr, bytes);
     copy_few(y0 + x, to_y[0], count);
     if (src1) copy_few(y1 + x, to_y[1], count);
-    if (of.chroma_size == 0) return;
+    if (!u) return;
     const int samples = (count + 1) / 2;
-    copy_few(u + of.chroma_size * (x / 2), to_u, ptrdiff_t(of.chroma_size) * samples);
-    if (of.chroma_size == 1) copy_few(v + x / 2, to_v, samples);
+    copy_few(v ? u + x / 2 : u + x, to_u, v ? samples : 2 * samples);
+    if (v) copy_few(v + x / 2, to_v, samples);
 }
 
-template <pixel_kind Kind, chroma_out Out>
-static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+template <pixel_kind Kind, bool Mean>
+static void any_yuv_row_of(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
+                           uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     constexpr int size = int(Kind) + 2;
-    constexpr int chroma_size = Out == chroma_out::none ? 0 : Out == chroma_out::pairs ? 2 : 1;
     const any_yuv_matrix<Kind> m(w);
-    row_of_steps<Out != chroma_out::none>(
+    row_of_steps<true>(
         width, [](ptrdiff_t x) { return x; },
         [&](ptrdiff_t x, ptrdiff_t) {
             const auto p = load_pixels<Kind>(src0 + size * x);
             store(y0 + x, m.luma(p));
-            if constexpr (Out == chroma_out::half) store_split(u + x / 2, v + x / 2, m.chroma(p));
-            if constexpr (Out == chroma_out::pairs) store(u + x, m.chroma(p));
-            if (src1) store(y1 + x, m.luma(load_pixels<Kind>(src1 + size * x)));
+            const auto put_chroma = [&](const auto &pixels) {
+                const u8v chroma = m.chroma(pixels);
+                if (v)
+                    store_split(u + x / 2, v + x / 2, chroma);
+                else
+                    store(u + x, chroma);
+            };
+            if (!Mean && u) put_chroma(m.even_pixels(p));
+            auto below = p;
+            if (src1) {
+                below = load_pixels<Kind>(src1 + size * x);
+                store(y1 + x, m.luma(below));
+            }
+            if (Mean) put_chroma(block_means(p, below));
         },
         [&](ptrdiff_t x, int count) {
-            any_yuv_part(any_yuv_row<Kind, Out>, {size, chroma_size}, w, src0, src1, y0, y1, u, v,
-                         x, count);
+            any_yuv_part(any_yuv_row_of<Kind, Mean>, size, w, src0, src1, y0, y1, u, v, x, count);
         });
 }
+template <pixel_kind Kind>
+static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+    (w.mean && u ? any_yuv_row_of<Kind, true> : any_yuv_row_of<Kind, false>)(w, src0, src1, y0, y1,
+                                                                             u, v, width);
+}
 
+[[gnu::noinline]] static void chroma_plane(const int16_t *of, const uint8_t *const channels[3],
+                                           uint8_t *dst, ptrdiff_t count) {
+    u16v f[3];
+    for (int k = 0; k < 3; k++) f[k] = set_u16(static_cast<uint16_t>(of[k]));
+    const s16v half = as_s16(set_u16(128));
+    const u8v sign = set_u8(128);
+    in_steps(
+        count,
+        [&](ptrdiff_t x) {
+            const u8v c[3] = {load(channels[0] + x), load(channels[1] + x), load(channels[2] + x)};
+            const auto high = [&](u16v c0, u16v c1, u16v c2) {
+                const s16v sum =
+                    add(add(as_s16(mul(c0, f[0])), as_s16(mul(c1, f[1]))), as_s16(mul(c2, f[2])));
+                return as_u16(add_sat(sum, half));
+            };
+            store(dst + x, bit_xor(join_high(high(even(c[0]), even(c[1]), even(c[2])),
+                                             high(odd(c[0]), odd(c[1]), odd(c[2]))),
+                                   sign));
+        },
+        [&](ptrdiff_t x) {
+            const int sum =
+                (of[0] * channels[0][x] + of[1] * channels[1][x] + of[2] * channels[2][x] + 128) >>
+                8;
+            dst[x] = static_cast<uint8_t>(sum > 127 ? 255 : sum + 128);
+        });
+}
 static void any_chroma_row(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,
                            uint8_t *v, ptrdiff_t count) {
-    const auto plane = [&](const int16_t(&of)[3], uint8_t *dst) {
-        u16v f[3];
-        for (int k = 0; k < 3; k++) f[k] = set_u16(static_cast<uint16_t>(of[k]));
-        const s16v half = as_s16(set_u16(128));
-        const u8v sign = set_u8(128);
-        in_steps(
-            count,
-            [&](ptrdiff_t x) {
-                const u8v c[3] = {load(channels[0] + x), load(channels[1] + x),
-                                  load(channels[2] + x)};
-                const auto high = [&](u16v c0, u16v c1, u16v c2) {
-                    const s16v sum = add(add(as_s16(mul(c0, f[0])), as_s16(mul(c1, f[1]))),
-                                         as_s16(mul(c2, f[2])));
-                    return as_u16(add_sat(sum, half));
-                };
-                store(dst + x, bit_xor(join_high(high(even(c[0]), even(c[1]), even(c[2])),
-                                                 high(odd(c[0]), odd(c[1]), odd(c[2]))),
-                                       sign));
-            },
-            [&](ptrdiff_t x) {
-                const int sum = (of[0] * channels[0][x] + of[1] * channels[1][x] +
-                                 of[2] * channels[2][x] + 128) >>
-                                8;
-                dst[x] = static_cast<uint8_t>(sum > 127 ? 255 : sum + 128);
-            });
-    };
-    plane(w.u, u);
-    plane(w.v, v);
+    chroma_plane(w.u, channels, u, count);
+    chroma_plane(w.v, channels, v, count);
 }
 
 template <pixel_kind Kind>
@@ -406,10 +427,7 @@ static void fill_any_kind(any_rows &t) {
 }
 template <pixel_kind Kind>
 static void fill_any_rgb(any_rows &t) {
-    any_to_yuv_row **const to = t.to_yuv[size_t(Kind)];
-    to[size_t(chroma_out::none)] = any_yuv_row<Kind, chroma_out::none>;
-    to[size_t(chroma_out::half)] = any_yuv_row<Kind, chroma_out::half>;
-    to[size_t(chroma_out::pairs)] = any_yuv_row<Kind, chroma_out::pairs>;
+    t.to_yuv[size_t(Kind)] = any_yuv_row<Kind>;
     t.split_pixels[size_t(Kind)] = split_pixels_vectors<rgb_in(Kind)>;
 }
 
@@ -436,10 +454,7 @@ void fill_any(any_rows &t) {
     t.chroma = any_chroma_row;
     t.split_groups = any_split_groups;
     t.join_groups = any_join_groups;
-    t.groups_to_planes = any_groups_to_420<false>;
-    t.groups_to_pairs = any_groups_to_420<true>;
     t.mean_of_lines = any_mean_of_lines;
-    t.mean_of_pairs = any_mean_of_pairs;
     t.mean_of_blocks = any_mean_of_blocks;
     t.every_second = any_every_second;
     t.twice = any_twice;

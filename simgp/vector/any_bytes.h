@@ -164,23 +164,76 @@ static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *ds
 // YUV to YUV
 // ------------------------------------------------------------------------------------------------
 
-static void any_split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
-                             ptrdiff_t pairs, bool luma_first) {
-    in_steps<bytes / 2>(
-        pairs,
-        [&](ptrdiff_t i) {
-            const pair_u8 p = load_split_natural(src + 4 * i);
-            store(y + 2 * i, luma_first ? p.even : p.odd);
-            store_split(u + i, v + i, luma_first ? p.odd : p.even);
-        },
-        [&](ptrdiff_t i) {
-            const uint8_t *const luma = src + 4 * i + !luma_first;
-            const uint8_t *const chroma = src + 4 * i + luma_first;
-            y[2 * i] = luma[0];
-            y[2 * i + 1] = luma[2];
-            u[i] = chroma[0];
-            v[i] = chroma[2];
-        });
+// The same as in_steps, for `count` >= Step samples, two steps a round: the shortest steps wait for the
+// counting.
+template <int Step, class Vector>
+inline void in_double_steps(ptrdiff_t count, Vector vector) {
+    ptrdiff_t x = 0;
+    for (; x + 2 * Step < count; x += 2 * Step) {
+        vector(x);
+        vector(x + Step);
+    }
+    if (x + Step < count) vector(x);
+    vector(count - Step);
+}
+
+// Pairs that are less than a vector.
+[[gnu::noinline]] static void split_few_groups(const uint8_t *src, const uint8_t *other, uint8_t *y,
+                                               uint8_t *u, uint8_t *v, ptrdiff_t pairs,
+                                               bool luma_first) {
+    for (ptrdiff_t x = 0; x < 2 * pairs; x++) {
+        const uint8_t *const p = src + 2 * x;
+        y[x] = p[!luma_first];
+        if (!u) continue;
+        const int of_p = p[luma_first], sum = of_p + (other ? other[2 * x + luma_first] + 1 : of_p);
+        *(!v ? u + x : x & 1 ? v + x / 2 : u + x / 2) = static_cast<uint8_t>(sum >> 1);
+    }
+}
+
+enum class groups_to { luma, planes, pairs };
+template <groups_to To, bool Mean>
+static void split_line(const uint8_t *src, const uint8_t *other, uint8_t *y, uint8_t *u, uint8_t *v,
+                       ptrdiff_t pairs, split_moves order) {
+    const auto vector = [&](ptrdiff_t i) {
+        const pair_u8 p = load_split(src + 4 * i, order);
+        store(y + 2 * i, by8_to_natural(p.even));
+        if constexpr (To == groups_to::luma) return;
+        u8v c = p.odd;
+        if constexpr (Mean) c = avg_u8(c, load_split(other + 4 * i, order).odd);
+        c = by8_to_natural(c);
+        if constexpr (To == groups_to::planes)
+            store_split(u + i, v + i, c);
+        else
+            store(u + 2 * i, c);
+    };
+    in_double_steps<bytes / 2>(pairs, vector);
+}
+// One line after the other, a mean with the second of two: in cache that is faster than two at once.
+static void any_split_groups(const groups_split &s) {
+    using to = groups_to;
+    const split_moves order = set_split_moves(!s.luma_first);
+    for (ptrdiff_t row = 0; row < s.rows; row++) {
+        const bool second = s.shared && row & 1;
+        const bool gives = s.shared && s.mean ? second || row + 1 == s.rows : !second;
+        const ptrdiff_t line = s.shared ? row >> 1 : row;
+        const uint8_t *const src = s.src + row * s.stride;
+        const uint8_t *const other = second && gives ? src - s.stride : nullptr;
+        uint8_t *const y = s.y + row * s.y_stride;
+        uint8_t *const u = gives ? s.u + line * s.u_stride : nullptr;
+        uint8_t *const v = gives && s.v ? s.v + line * s.v_stride : nullptr;
+        if (s.pairs < bytes / 2)
+            split_few_groups(src, other, y, u, v, s.pairs, s.luma_first);
+        else if (!u)
+            split_line<to::luma, false>(src, other, y, u, v, s.pairs, order);
+        else if (other && v)
+            split_line<to::planes, true>(src, other, y, u, v, s.pairs, order);
+        else if (other)
+            split_line<to::pairs, true>(src, other, y, u, v, s.pairs, order);
+        else if (v)
+            split_line<to::planes, false>(src, other, y, u, v, s.pairs, order);
+        else
+            split_line<to::pairs, false>(src, other, y, u, v, s.pairs, order);
+    }
 }
 
 static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
@@ -202,69 +255,23 @@ static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v
         });
 }
 
-template <bool LumaFirst, bool Pairs>
-static void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
-                          uint8_t *u, uint8_t *v, ptrdiff_t pairs) {
-    in_steps<bytes / 2>(
-        pairs,
-        [&](ptrdiff_t i) {
-            const pair_u8 p = load_split(src0 + 4 * i);
-            const pair_u8 q = load_split(src1 + 4 * i);
-            const u8v chroma = by8_to_natural(LumaFirst ? p.odd : p.even);
-            store(y0 + 2 * i, by8_to_natural(LumaFirst ? p.even : p.odd));
-            store(y1 + 2 * i, by8_to_natural(LumaFirst ? q.even : q.odd));
-            if constexpr (Pairs)
-                store(u + 2 * i, chroma);
-            else
-                store_split(u + i, v + i, chroma);
-        },
-        [&](ptrdiff_t i) {
-            constexpr int luma = LumaFirst ? 0 : 1, chroma = 1 - luma;
-            for (int k = 0; k < 2; k++) {
-                y0[2 * i + k] = src0[4 * i + 2 * k + luma];
-                y1[2 * i + k] = src1[4 * i + 2 * k + luma];
-                *(Pairs ? u + 2 * i + k : k ? v + i : u + i) = src0[4 * i + 2 * k + chroma];
-            }
-        });
-}
-template <bool Pairs>
-static void any_groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
-                              uint8_t *u, uint8_t *v, ptrdiff_t pairs, bool luma_first) {
-    (luma_first ? groups_to_420<true, Pairs> : groups_to_420<false, Pairs>)(src0, src1, y0, y1, u,
-                                                                            v, pairs);
-}
-
 static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
     in_steps(
         count, [&](ptrdiff_t x) { store(dst + x, avg_u8(load(a + x), load(b + x))); },
         [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[x] + b[x] + 1) >> 1); });
 }
-static void any_mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
-    in_steps(
-        count,
-        [&](ptrdiff_t x) {
-            const pair_u8 p = load_split_natural(a + 2 * x);
-            store(dst + x, avg_u8(p.even, p.odd));
-        },
-        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[2 * x] + a[2 * x + 1] + 1) >> 1); });
-}
-static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    const s16v two = as_s16(set_u16(2));
-    in_steps(
-        count,
-        [&](ptrdiff_t x) {
-            const auto sums = [&](ptrdiff_t at) {
-                const u8v of_a = load(a + at), of_b = load(b + at);
-                const s16v of_even = add(as_s16(even(of_a)), as_s16(even(of_b)));
-                const s16v of_odd = add(as_s16(odd(of_a)), as_s16(odd(of_b)));
-                return sar<2>(add(add(of_even, of_odd), two));
-            };
-            store(dst + x, by8_to_natural(narrow(sums(2 * x), sums(2 * x + bytes))));
-        },
-        [&](ptrdiff_t x) {
-            const int sum = a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1];
-            dst[x] = static_cast<uint8_t>((sum + 2) >> 2);
-        });
+static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, ptrdiff_t step, uint8_t *dst,
+                               ptrdiff_t dst_step, ptrdiff_t count, ptrdiff_t rows) {
+    for (ptrdiff_t y = 0; y < rows; y++) {
+        const uint8_t *const p = a + y * step, *const q = b + y * step;
+        uint8_t *const to = dst + y * dst_step;
+        in_steps(
+            count, [=](ptrdiff_t x) { store(to + x, load_block_means(p + 2 * x, q + 2 * x)); },
+            [=](ptrdiff_t x) {
+                const int sum = p[2 * x] + p[2 * x + 1] + q[2 * x] + q[2 * x + 1];
+                to[x] = static_cast<uint8_t>((sum + 2) >> 2);
+            });
+    }
 }
 
 // What follows the last sample may lie behind the line.

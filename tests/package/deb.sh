@@ -18,7 +18,7 @@ made=$build_dir/package.deb
 
 version=$(sed -n 's/^CMAKE_PROJECT_VERSION:[A-Z]*=//p' "$made/CMakeCache.txt")-1
 architecture=$(dpkg --print-architecture) triplet=$(gcc -print-multiarch)
-packages="libsimgp1 libsimgp-dev simgp-tools"
+packages="libsimgp1 libsimgp-dev simgp-tools $player"
 files=()
 for package in $packages; do files+=("$made/${package}_${version}_$architecture.deb"); done
 there=$(cd "$made" && printf '%s\n' *.deb | sort)
@@ -33,6 +33,8 @@ has() { # PACKAGE PATTERN: a file whose path from the root on matches
 }
 for package in $packages; do
     [ "$(field $package Maintainer | sed 's/ <.*//')" = "the simgp authors" ] || fault "$package has another maintainer."
+    # What is indented further is set as it stands.
+    ! field "$package" Description | grep -nE '^  |^$' || fault "The lines of the description of $package are askew."
     has $package "usr/share/doc/$package/copyright"
     has $package "usr/share/doc/$package/changelog\.gz"
     others=$(dpkg-deb -c "$made/${package}_${version}_$architecture.deb" | awk '$2 != "root/root" || $1 ~ /^.....w|^........w/' |
@@ -45,6 +47,15 @@ has libsimgp-dev "usr/lib/$triplet/pkgconfig/simgp\.pc"
 has libsimgp-dev "usr/include/simgp/simgp\.h"
 has simgp-tools "usr/bin/simgp-convert"
 has simgp-tools "usr/share/man/man1/simgp-convert\.1\.gz"
+if [ -n "$player" ]; then
+    has simgp-play "usr/bin/simgp-play"
+    has simgp-play "usr/share/man/man1/simgp-play\.1\.gz"
+    has simgp-play "usr/share/bash-completion/completions/simgp-play"
+    for library in libsdl2-2.0-0 libavformat libavcodec libpng16-16; do
+        [[ $(field simgp-play Depends) == *$library* ]] || fault "simgp-play does not ask for $library."
+    done
+    [[ $(field simgp-play Depends) != *libsimgp* ]] || fault "simgp-play asks for the library that is in it."
+fi
 [[ $(field libsimgp1 Depends) =~ ^libc6\ \([^,]*$ ]] || fault "libsimgp1 depends on:" "$(field libsimgp1 Depends)"
 for package in libsimgp-dev simgp-tools; do
     [[ $(field $package Depends) == *"libsimgp1 (= $version)"* ]] || fault "$package does not ask for its libsimgp1."
@@ -59,7 +70,8 @@ if command -v lintian >/dev/null; then
     [ -z "$said" ] || fault "lintian finds:" "$said"
 fi
 
-# A program in $root, whose folder /trial has sources and packages, does all the rest.
+# A program in $root, whose folder /trial has sources and packages, does all the rest; with an argument, it
+# tries the player.
 cat >"$scratch/try.sh" <<'END'
 set -e
 cd /trial
@@ -73,6 +85,14 @@ simgp-convert -q testcard:64x48@2 -o card.y4m
 simgp-convert -q card.y4m -o frame-%d.png
 test -s frame-1.png
 simgp-probe --fourcc avc1 >/dev/null
+if [ $# -gt 0 ]; then
+    # FFmpeg reads the film; nobody sees the window.
+    simgp-play --version
+    SDL_VIDEODRIVER=dummy simgp-play card.y4m --frames 2 --rgb32 --screenshot seen.png
+    simgp-convert -q seen.png -o seen.rgb888
+    simgp-convert -q frame-1.png -o meant.rgb888
+    cmp seen.rgb888 meant.rgb888
+fi
 END
 cat >"$scratch/CMakeLists.txt" <<'END'
 cmake_minimum_required(VERSION 3.22)
@@ -103,13 +123,13 @@ if [ -f "$clean" ]; then
     echo "In a clean system:"
     put_trial_into "$scratch/root/trial"
     # What they depend on comes from the distribution.
-    timeout 300 chroot "$scratch/root" sh -c 'apt-get update && apt-get install -y --no-install-recommends /trial/*.deb' \
+    timeout 900 chroot "$scratch/root" sh -c 'apt-get update && apt-get install -y --no-install-recommends /trial/*.deb' \
         >"$scratch/log" 2>&1 || {
         tail -n 20 "$scratch/log"
         fault "The packages cannot be installed."
         finish
     }
-    chroot "$scratch/root" sh /trial/try.sh || fault "What is installed does not work."
+    chroot "$scratch/root" sh /trial/try.sh $player || fault "What is installed does not work."
     chroot "$scratch/root" apt-get purge -y $packages >"$scratch/log" 2>&1 || fault "The packages cannot be removed."
     left=$(cd "$scratch/root" && find usr etc var/lib/dpkg/info -path '*simgp*')
     [ -z "$left" ] || fault "Left behind when they are removed:" "$left"
@@ -120,6 +140,6 @@ else
     sed -i "s#^cd /trial#cd '$scratch/trial'#" "$scratch/trial/try.sh"
     PATH=$scratch/root/usr/bin:$PATH LD_LIBRARY_PATH=$scratch/root/usr/lib/$triplet \
         PKG_CONFIG_PATH=$scratch/root/usr/lib/$triplet/pkgconfig CMAKE_PREFIX_PATH=$scratch/root/usr \
-        sh "$scratch/trial/try.sh" || fault "What is unpacked does not work."
+        sh "$scratch/trial/try.sh" $player || fault "What is unpacked does not work."
 fi
 finish

@@ -20,7 +20,8 @@ backward=$(grep -rIlF -e "$source_dir" -e "$build_dir" "$prefix")
 
 # Each component has what its name says, and together they are everything.
 files() { (cd "$scratch/$1" && find . ! -type d | sort); }
-for component in runtime dev tools; do install_to $component --component $component; done
+mkdir "$scratch/player" # which is empty where there is none
+for component in runtime dev tools player; do install_to $component --component $component; done
 expected='libsimgp\.so\.[0-9.]*$' suffix=
 if [ "$library_kind" = PE ]; then
     expected='bin/libsimgp-1\.dll$' suffix=.exe
@@ -28,12 +29,17 @@ if [ "$library_kind" = PE ]; then
 fi
 [ -n "$(files runtime)" ] && ! files runtime | grep -vqE "/$expected" || fault "Component runtime has:" "$(files runtime)"
 ! files dev | grep -qE "/bin/|/$expected" || fault "Component dev has:" "$(files dev)"
-expected=$(for tool in $tools; do
-    printf './%s\n' "bin/$tool" "share/man/man1/$tool.1" "share/bash-completion/completions/$tool"
-done
-[ -z "$tools" ] || echo ./share/simgp/python/simgp.py)
-[ "$(files tools | sort)" = "$(sort <<<"$expected")" ] || fault "Component tools has:" "$(files tools)"
-rest=$(comm -3 <(files prefix) <({ files runtime && files dev && files tools; } | sort))
+of_programs() {
+    local program
+    for program in "$@"; do
+        printf './%s\n' "bin/$program" "share/man/man1/$program.1" "share/bash-completion/completions/$program"
+    done
+}
+# shellcheck disable=SC2086
+expected=$(of_programs $tools && [ -z "$tools" ] || echo ./share/simgp/python/simgp.py)
+[ "$(files tools)" = "$(sort <<<"$expected")" ] || fault "Component tools has:" "$(files tools)"
+[ "$(files player)" = "$(of_programs $player | sort)" ] || fault "Component player has:" "$(files player)"
+rest=$(comm -3 <(files prefix) <({ files runtime && files dev && files tools && files player; } | sort))
 [ -z "$rest" ] || fault "In no component, or in two:" "$rest"
 
 for tool in $tools; do
@@ -41,6 +47,11 @@ for tool in $tools; do
     ldd "$prefix/bin/$tool" | grep -q "libsimgp.* => $prefix/" ||
         fault "$tool takes the library from elsewhere:" "$(ldd "$prefix/bin/$tool" | grep libsimgp)"
 done
+# It has the library in it.
+if [ -n "$player" ]; then
+    "$prefix/bin/$player" --version >/dev/null || fault "$player does not run where it is installed."
+    ! ldd "$prefix/bin/$player" | grep libsimgp || fault "$player takes the library from elsewhere."
+fi
 
 # The Python interface finds the library of its tree.
 if [ -n "$tools" ] && [ -z "$toolchain" ] && /usr/bin/python3 -c 'import numpy' 2>/dev/null; then

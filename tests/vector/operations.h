@@ -39,10 +39,13 @@ static const operation operations[] = {
     MEMORY("load_zip, first", bytes, put(out, load_zip(in - bytes / 2, in - 3 * bytes))),
     MEMORY("load_zip, second", bytes, put(out, load_zip(in - 3 * bytes - 1, in - bytes / 2))),
     MEMORY("load_split", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("load_split, in order", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes, set_split_moves(false)); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("load_split, exchanged", 2 * bytes, const pair_u8 v = load_split(in - 2 * bytes, set_split_moves(true)); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("store_split", bytes, store_split(out, out + bytes / 2, u8(in, 0))),
     MEMORY("store_split, anywhere", bytes + 1, { out[bytes / 2] = 0; store_split(out + bytes / 2 + 1, out, u8(in, 0)); }),
     MEMORY("load_split_natural", 2 * bytes, const pair_u8 v = load_split_natural(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
     MEMORY("load_split_by4", 2 * bytes, const pair_u8 v = load_split_by4(in - 2 * bytes); put(out, v.even); put(out + bytes, v.odd)),
+    MEMORY("load_block_means", bytes, put(out, load_block_means(in - 2 * bytes, in - 5 * bytes))),
     MEMORY("load_blocks", bytes, put(out, load_blocks(in - 16 - (blocks - 1) * 23, 23))),
     MEMORY("load_blocks, upwards", bytes, put(out, load_blocks(in - 16, -bytes - 1))),
     MEMORY("gather_blocks", bytes, int32_t at[blocks];
@@ -169,6 +172,11 @@ static const operation operations[] = {
     MEMORY("load_565, channels_of", 3 * bytes, const channels_v v = channels_of(load_565(in - 2 * bytes)); for (int k = 0; k < 3; k++) put(out + k * bytes, v.c[k])),
     MEMORY("load_888, channels_of", 3 * bytes, const channels_v v = channels_of(load_888(in - 3 * bytes)); for (int k = 0; k < 3; k++) put(out + k * bytes, v.c[k])),
     MEMORY("load_8888, channels_of", 3 * bytes, const channels_v v = channels_of(load_8888<1>(in - 4 * bytes)); for (int k = 0; k < 3; k++) put(out + k * bytes, v.c[k])),
+    MEMORY("block_means of load_888", 3 * bytes,
+           const rgb_v v = block_means(load_888(in - 3 * bytes), load_888(in - 6 * bytes));
+           put(out, even_dot(v, set_channel_factors(1, 0, 0))); put(out + bytes, even_dot(v, set_channel_factors(0, 1, 0)));
+           put(out + 2 * bytes, even_dot(v, set_channel_factors(0, 0, 1)))),
+    MEMORY("block_means of load_565", bytes, put(out, even_dot(block_means(load_565(in - 2 * bytes), load_565(in - 4 * bytes)), set_channel_factors(-128, 255, 127)))),
     MEMORY("repack_888_to_565", 2 * bytes, repack_888_to_565(out, in - 3 * bytes)),
     MEMORY("repack_8888_to_565", 2 * bytes, repack_8888_to_565(out, in - 4 * bytes)),
     MEMORY("repack_888_to_8888", 4 * bytes, repack_888_to_8888(out, in - 3 * bytes, set_widen_moves(false, false))),
@@ -179,7 +187,13 @@ static const operation operations[] = {
     MEMORY("load_quads, dot_high", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(false, 77, 150, 29, 0)))),
     MEMORY("load_quads, dot_high, widest", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(true, 1, 254, 1, 200)))),
     MEMORY("load_quads, dot_high, offset", bytes, put(out, dot_high(load_quads(in - 4 * bytes), set_quad_weights(true, 47, 157, 16, 16)))),
-    MEMORY("load_quads, even_dots_high", bytes, put(out, even_dots_high(load_quads(in - 4 * bytes), set_quad_factors(false, 43, 85, -128), set_quad_factors(true, -128, 107, 21), as_s16(set_u16(128))))),
+    MEMORY("even_quads, dots_high", bytes, put(out, dots_high(even_quads(load_quads(in - 4 * bytes)), set_quad_factors(false, 43, 85, -128), set_quad_factors(true, -128, 107, 21), as_s16(set_u16(128))))),
+    MEMORY("block_means of quads", 2 * bytes,
+           const half_quads_v v = block_means(load_quads(in - 4 * bytes), load_quads(in - 8 * bytes));
+           const auto channels = [&](bool skips_first, int p, int q, int r, int s, int t, int u, uint8_t *to) {
+               put(to, dots_high(v, set_quad_factors(skips_first, p, q, r), set_quad_factors(skips_first, s, t, u), as_s16(set_u16(0))));
+           };
+           channels(false, 127, 0, 0, 0, 127, 0, out); channels(true, 0, 127, 0, 0, 0, 127, out + bytes)),
     MEMORY("load_565, even_dot", bytes, put(out, even_dot<112, -94, -18, 32896>(load_565(in - 2 * bytes)))),
     MEMORY("load_888, even_dot", bytes, put(out, even_dot<-128, 255, 127, 1>(load_888(in - 3 * bytes)))),
     MEMORY("store_zip8", 2 * bytes, store_zip8(out, u8(in, 0), u8(in, 1))),

@@ -13,8 +13,8 @@ _simgp() {
             words=$("$program" --list 2>/dev/null | sed -n 2p)
             ;;
         -*) # The words that the option takes, if it takes but some; nothing if it takes others.
-            words=$(sed -nE "s/^ *(-[a-z],)?$before [A-Z]+:\{([^}]*)\}.*/\2/p" <<<"$help" | tr , ' ')
-            if [ -z "$words" ] && grep -qE -- "^ *(-[a-z],)?$before(,--[a-z-]+)? (INT|UINT|FLOAT)" <<<"$help"; then
+            words=$(sed -nE "s/^ *([^ ]+,)?$before(,[^ ]+)? [A-Z]+:\{([^}]*)\}.*/\3/p" <<<"$help" | tr , ' ')
+            if [ -z "$words" ] && grep -qE -- "^ *([^ ]+,)?$before(,[^ ]+)? (INT|UINT|FLOAT)" <<<"$help"; then
                 return
             fi
             ;;

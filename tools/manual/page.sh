@@ -29,6 +29,7 @@ function close_entry(    names, value, more, list) {
     }
     sub(/\{.*/, "", head)
     sub(/:.*/, "", head)
+    sub(/ REQUIRED$/, "", head)
     names = head
     value = ""
     if (match(head, / +[A-Z]+( \.\.\.)?$/)) {
@@ -70,7 +71,7 @@ NR == 1 {
 state == "entries" && /^  [^ ]/ {
     close_entry()
     head = substr($0, 3)
-    if (match(head, /   +/)) {
+    if (match(head, /  +/)) {
         body = substr(head, RSTART + RLENGTH)
         head = substr(head, 1, RSTART - 1)
     } else if (length(head) > 27 && match(head, /\} [a-z]/)) { # one space is left between them
@@ -89,6 +90,22 @@ state == "entries" && /^ +[^ ]/ {
     next
 }
 state == "entries" && /^$/ { next }
+/^Keys:$/ {
+    close_entry()
+    section("KEYS")
+    state = "keys"
+    next
+}
+state == "keys" && $0 != "" { # several to a line: the key, what it does
+    sub(/^ +/, "")
+    n = split($0, column, /  +/)
+    for (i = 1; i < n; i += 2) print ".TP\n\\fB" text(column[i]) "\\fR\n" text(column[i + 1]) "."
+    next
+}
+state == "keys" {
+    state = "entries"
+    next
+}
 /^Examples:$/ {
     close_entry()
     section("EXAMPLES")
