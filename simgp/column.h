@@ -41,12 +41,15 @@ inline bool lie_apart(const lines &dst, ptrdiff_t bytes) {
 // Copies `count` short lines.
 void copy_column(const const_lines &from, const lines &to, ptrdiff_t bytes, ptrdiff_t count);
 
-// Calls f(first, count) for blocks of `height` lines. No line is done twice: the first time may have written
-// over its samples.
+// Calls f(first, count) for blocks of `height` lines, at most `block` each and about the same number. No line
+// is done twice: the first time may have written over its samples.
 template <class F>
 void in_column_blocks(ptrdiff_t height, ptrdiff_t block, F f) {
-    for (ptrdiff_t first = 0; first < height; first += block)
-        f(first, height - first < block ? height - first : block);
+    for (ptrdiff_t y = 0, left = (height + block - 1) / block; left > 0; left--) {
+        const ptrdiff_t count = (height - y) / left;
+        f(y, count);
+        y += count;
+    }
 }
 
 // YUV in planes, and pixels to be made of it: rows one by one, or in pairs that share chroma lines, of which

@@ -113,7 +113,8 @@ void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&lu
 
 // Converts the first `width` pixels of rows, but all of those that have a chroma line to themselves.
 template <class Rows>
-[[gnu::noinline]] void walk_planes(const planes_to_rgb &p, const Rows &rows, ptrdiff_t width) {
+[[gnu::always_inline]] inline void walk_planes(const planes_to_rgb &p, const Rows &rows,
+                                               ptrdiff_t width) {
     const const_lines y = p.y, u = p.u, v = p.v;
     const lines dst = p.dst;
     const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
@@ -161,9 +162,9 @@ template <class RowsOf>
 void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_of) {
     const ptrdiff_t block = column_pixels / pitch_of(c);
     const ptrdiff_t units = p.two_rows ? (p.height - p.lead) / 2 : p.height;
-    const auto rows = rows_of(live_rows(pitch_of(c) * (units < block ? units : block)));
     pixel_column at;
     in_column_blocks(units, block, [&](ptrdiff_t first, ptrdiff_t count) {
+        const auto rows = rows_of(live_rows(pitch_of(c) * count));
         gather_column(p, c, first, count, at);
         if (p.two_rows)
             rows.two(at.y[0], at.y[1], at.u, at.v, at.rgb[0], at.rgb[1], pitch_of(c) * count);

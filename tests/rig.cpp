@@ -338,6 +338,7 @@ const std::vector<target_rows> &all_targets() {
 #define FILL(area) simgp::lanes::fill_##area(table.area);
         SIMGP_AREAS(FILL)
 #undef FILL
+        table.vector = 32;
 #endif
         return table;
     }();
