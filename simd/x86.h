@@ -12,6 +12,17 @@
 
 namespace simgp::SIMD_TARGET {
 
+// Byte pairs are best left in vectors.
+inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
+inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+inline pairs_v pair_evens(pairs_v u, pairs_v v) { return join(even(u), even(v)); }
+inline pairs_v pair_odds(pairs_v u, pairs_v v) { return join(odd(u), odd(v)); }
+inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+using pair_pairs = pair_u8;
+inline pair_pairs load_split_pairs(const uint8_t *p) { return load_split(p); }
+inline pair_pairs load_split_pairs_natural(const uint8_t *p) { return load_split_natural(p); }
+inline pair_pairs load_split_pairs_by4(const uint8_t *p) { return load_split_by4(p); }
+
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline u16v dot(u8v ac, u16v b) {
