@@ -478,22 +478,24 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     }
 }
 
-// load_split, the halves as byte pairs.
-struct pair_pairs {
-    pairs_v even, odd;
+// Groups of four bytes, which begin with luma: its pairs and those of chroma, in the same orders; and
+// those of groups that begin with chroma.
+struct luma_chroma {
+    pairs_v y, pairs;
 };
-inline pair_pairs load_split_pairs(const uint8_t *p) {
+inline luma_chroma load_groups(const uint8_t *p) {
     const pair_u8 v = load_split(p);
     return {v.even, v.odd};
 }
-inline pair_pairs load_split_pairs_natural(const uint8_t *p) {
+inline luma_chroma load_groups_natural(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {v.even, v.odd};
 }
-inline pair_pairs load_split_pairs_by4(const uint8_t *p) {
+inline luma_chroma load_groups_by4(const uint8_t *p) {
     const pair_u8 v = load_split_by4(p);
     return {v.even, v.odd};
 }
+inline luma_chroma exchanged(const luma_chroma &v) { return {v.pairs, v.y}; }
 
 // Stores of 2, 3 and 4 vectors: the bytes of two vectors in by8 order, in turn; the words of the
 // even and the odd pixels in by8 order, in turn; the bytes of three vectors in natural order, in

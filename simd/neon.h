@@ -305,15 +305,19 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
 }
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
-struct pair_pairs {
-    pairs_v even, odd;
+// GCC keeps structures in memory that are copied as parts of others: hence one register at a time.
+struct luma_chroma {
+    pairs_v y, pairs;
 };
-inline pair_pairs load_split_pairs(const uint8_t *p) {
+inline luma_chroma load_groups(const uint8_t *p) {
     const uint8x8x4_t v = vld4_u8(p);
     return {{v.val[0], v.val[2]}, {v.val[1], v.val[3]}};
 }
-inline pair_pairs load_split_pairs_natural(const uint8_t *p) { return load_split_pairs(p); }
-inline pair_pairs load_split_pairs_by4(const uint8_t *p) { return load_split_pairs(p); }
+inline luma_chroma load_groups_natural(const uint8_t *p) { return load_groups(p); }
+inline luma_chroma load_groups_by4(const uint8_t *p) { return load_groups(p); }
+inline luma_chroma exchanged(const luma_chroma &v) {
+    return {{v.pairs.even, v.pairs.odd}, {v.y.even, v.y.odd}};
+}
 
 // Some compilers have macros for stores of several vectors, which take no braces: hence the names.
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {

@@ -160,8 +160,8 @@ struct any_source<chroma_in::groups> {
 
     template <pixel_order Order>
     yuv_half load(const samples &s, ptrdiff_t x) const {
-        yuv_half p = source<yuv_layout::yuyv>::load<Order>(s, x);
-        if (!luma_first) p = {p.pairs, p.y};
+        luma_chroma p = load_groups_for<Order>(s.y + 2 * x);
+        if (!luma_first) p = exchanged(p);
         return p;
     }
     samples stage(staged &to, const samples &s, ptrdiff_t x, int count) const {

@@ -28,9 +28,7 @@ inline pairs_v load_luma(const uint8_t *y, ptrdiff_t x) {
     return arrange<Order>(load_pairs(y + x));
 }
 
-struct yuv_half {
-    pairs_v y, pairs;
-};
+using yuv_half = luma_chroma;
 struct yuv_full {
     pairs_v y, pairs_even, pairs_odd;
 };
@@ -45,7 +43,8 @@ struct source<yuv_layout::half> {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        return {load_luma<Order>(s.y, x), arrange<Order>(load_pairs(s.u + (x >> 1), s.v + (x >> 1)))};
+        return {load_luma<Order>(s.y, x),
+                arrange<Order>(load_pairs(s.u + (x >> 1), s.v + (x >> 1)))};
     }
     static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         stage_few(to.y, 1, s.y + x, count, 1);
@@ -90,6 +89,15 @@ struct source_pairs {
 };
 
 // Packed 4:2:2: every other byte is luma, the others are pairs U V.
+template <pixel_order Order>
+inline luma_chroma load_groups_for(const uint8_t *p) {
+    if constexpr (Order == pixel_order::by8)
+        return load_groups(p);
+    else if constexpr (Order == pixel_order::by4)
+        return load_groups_by4(p);
+    else
+        return load_groups_natural(p);
+}
 template <bool LUMA_FIRST>
 struct source_packed {
     static constexpr pair_order pairs = pair_order::uv;
@@ -97,11 +105,11 @@ struct source_packed {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        const uint8_t *const at = s.y + 2 * x;
-        const pair_pairs p = Order == pixel_order::by8   ? load_split_pairs(at)
-                             : Order == pixel_order::by4 ? load_split_pairs_by4(at)
-                                                         : load_split_pairs_natural(at);
-        return {LUMA_FIRST ? p.even : p.odd, LUMA_FIRST ? p.odd : p.even};
+        const luma_chroma p = load_groups_for<Order>(s.y + 2 * x);
+        if constexpr (LUMA_FIRST)
+            return p;
+        else
+            return exchanged(p);
     }
     // A last group of one pixel gets the V of the group before.
     static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {

@@ -67,8 +67,7 @@ static void tile_to_rgb(const uint8_t *luma, const uint8_t *chroma, uint8_t *dst
     using to = packer<Packing>;
     for (ptrdiff_t r = 0; r < height; r += 2)
         for (ptrdiff_t x = 0; x < tile_width; x += bytes) {
-            const pairs_v pairs =
-                arrange<to::order>(load_pairs(chroma + tile_width * (r / 2) + x));
+            const pairs_v pairs = arrange<to::order>(load_pairs(chroma + tile_width * (r / 2) + x));
             const chroma_terms c = bt601::chroma<pair_order::uv>(pairs);
             const auto write_row = [&](ptrdiff_t row) {
                 const pairs_v y = arrange<to::order>(load_pairs(luma + tile_width * row + x));
