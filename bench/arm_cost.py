@@ -70,7 +70,7 @@ PEERS = {
     "any three to three": {"RAWToRGB24Row": 1},
     "any three to four": {"RAWToARGBRow": 1},
     "any four to words": {"ARGBToRGB565Row": 1},
-    "any four to three": {"ARGBToRGB24Row": 1},
+    "any four to three": {"ARGBToRAWRow": 1},
     "any split groups, two": {"YUY2ToYRow": 1, "YUY2ToUV422Row": 1},
     "any split groups to planes, two": {"YUY2ToYRow": 1, "YUY2ToUV422Row": .5},
     "any split groups, means, two": {"YUY2ToYRow": 1, "YUY2ToUVRow": .5},
@@ -83,7 +83,8 @@ PEERS = {
     "fill": {"ARGBSetRow": 1},
 }
 # Of two lines, one gives luma alone.
-SUMS = {f"{p} to yuv420": {f"{p} to half": .5, f"{p} to grey": .5} for p in ("rgb888", "bgr888", "rgb565")}
+SUMS = {f"{p} to yuv420": {f"{p} to half": .5, f"{p} to grey": .5}
+        for p in ("rgb888", "bgr888", "rgb565", "any words", "any three", "any four")}
 
 
 def inner_loop(short, long):

@@ -13,6 +13,7 @@ namespace simgp::neon {
 
 inline constexpr int bytes = 16;
 inline constexpr int blocks = 1;
+inline constexpr bool moves_pointers = true;
 
 using u8v = uint8x16_t;
 using u16v = uint16x8_t;
@@ -26,8 +27,13 @@ inline s16v as_s16(u16v v) { return vreinterpretq_s16_u16(v); }
 inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
 inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+#ifdef __aarch64__
+    const uint8x8_t none = vdup_n_u8(0);  // which the loads write
+    return vzip1q_u8(vcombine_u8(vld1_u8(p), none), vcombine_u8(vld1_u8(q), none));
+#else
     const uint8x8x2_t zip = vzip_u8(vld1_u8(p), vld1_u8(q));
     return vcombine_u8(zip.val[0], zip.val[1]);
+#endif
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
@@ -88,15 +94,6 @@ inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
 inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 inline u16v avg_u16(u16v a, u16v b) { return vrhaddq_u16(a, b); }
-struct half_factor {
-    u16v half, odd;  // of an odd factor the bits of v
-};
-inline half_factor set_half_factor(int k) {
-    return {vdupq_n_u16(static_cast<uint16_t>(k >> 1)), vdupq_n_u16(k & 1 ? 255 : 0)};
-}
-inline u16v half_product(u16v v, half_factor k) {
-    return vsraq_n_u16(vmulq_u16(v, k.half), vandq_u16(v, k.odd), 1);
-}
 inline s16v mul_round(s16v a, s16v b) { return vqrdmulhq_s16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
@@ -156,36 +153,67 @@ inline u16v sum_pairs(u16v low, u16v high) {
     return vaddq_u16(v.val[0], vshlq_n_u16(v.val[1], __builtin_ctz(B)));
 }
 
-// The offsets of 128 go into the constant, and the products are accumulated on it.
-template <int A, int B, int C>
-inline s16v pair_dot(u8v v) {
-    static_assert(limits::centred_pair<A, B>);
-    s16v sum = vdupq_n_s16(static_cast<int16_t>(C - 128 * (A + B)));
-    if constexpr (A != 0) sum = vmlaq_n_s16(sum, as_s16(even(v)), A);
-    if constexpr (B != 0) sum = vmlaq_n_s16(sum, as_s16(odd(v)), B);
+// Byte pairs lie apart in 64-bit registers, as loads of structures leave them and as products of
+// bytes want them: such a product is one instruction of one cycle where that of 16-bit lanes often
+// takes two, and no byte has to be widened before.
+struct pairs_v {
+    uint8x8_t even, odd;
+};
+using pair_bytes = uint8x8_t;
+inline pairs_v load_pairs(const uint8_t *p) {
+    const uint8x8x2_t v = vld2_u8(p);
+    return {v.val[0], v.val[1]};
+}
+inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return {vld1_u8(p), vld1_u8(q)}; }
+inline pairs_v pair_evens(pairs_v u, pairs_v v) { return {u.even, v.even}; }
+inline pairs_v pair_odds(pairs_v u, pairs_v v) { return {u.odd, v.odd}; }
+inline pair_bytes even(pairs_v v) { return v.even; }
+inline pair_bytes odd(pairs_v v) { return v.odd; }
+inline pair_bytes set_pair_bytes(int k) { return vdup_n_u8(static_cast<uint8_t>(k)); }
+inline u16v mul(pair_bytes a, pair_bytes b) { return vmull_u8(a, b); }
+// floor(k v / 2) = (k >> 1) v + (k & 1) (v >> 1)
+struct half_factor {
+    uint8x8_t half, odd;
+};
+inline half_factor set_half_factor(int k) {
+    return {vdup_n_u8(static_cast<uint8_t>(k >> 1)), vdup_n_u8(k & 1)};
+}
+inline u16v half_product(pair_bytes v, half_factor k) {
+    return vmlal_u8(vmull_u8(v, k.half), vshr_n_u8(v, 1), k.odd);
+}
+
+template <int K>
+inline u16v add_product(u16v sum, uint8x8_t x) {
+    if constexpr (K > 0) return vmlal_u8(sum, x, vdup_n_u8(K));
+    if constexpr (K < 0) return vmlsl_u8(sum, x, vdup_n_u8(-K));
     return sum;
 }
-template <int K, int C>
-inline s16v half_product(u16v v) {
-    const u16v sum = vmlaq_n_u16(vdupq_n_u16(static_cast<uint16_t>(C)), v, K / 2);
-    return as_s16(K & 1 ? vsraq_n_u16(sum, v, 1) : sum);
+// The offsets of 128 go into the constant, and the products are accumulated on it.
+template <int A, int B, int C>
+inline s16v pair_dot(pairs_v v) {
+    static_assert(limits::centred_pair<A, B>);
+    const u16v c = vdupq_n_u16(static_cast<uint16_t>(C - 128 * (A + B)));
+    return as_s16(add_product<B>(add_product<A>(c, v.even), v.odd));
 }
 template <int K, int C>
-inline s16v half_product_high(u8v v) {
+inline s16v half_product(uint8x8_t v) {
     static_assert(limits::half_factor<K>);
-    return half_product<K, C>(odd(v));
+    const u16v sum = add_product<K / 2>(vdupq_n_u16(static_cast<uint16_t>(C)), v);
+    return as_s16(K & 1 ? vaddw_u8(sum, vshr_n_u8(v, 1)) : sum);
 }
 template <int K, int C>
-inline s16v half_product_low(u8v v) {
-    static_assert(limits::half_factor<K>);
-    return half_product<K, C>(even(v));
+inline s16v half_product_high(pairs_v v) {
+    return half_product<K, C>(v.odd);
 }
-inline s16v low_minus_128_shl8(u8v v) {
-    return as_s16(veorq_u16(vshlq_n_u16(as_u16(v), 8), vdupq_n_u16(0x8000)));
+template <int K, int C>
+inline s16v half_product_low(pairs_v v) {
+    return half_product<K, C>(v.even);
 }
-inline s16v high_minus_128_shl8(u8v v) {
-    return as_s16(veorq_u16(vandq_u16(as_u16(v), vdupq_n_u16(0xFF00)), vdupq_n_u16(0x8000)));
+inline s16v minus_128_shl8(uint8x8_t v) {
+    return as_s16(veorq_u16(vshll_n_u8(v, 8), vdupq_n_u16(0x8000)));
 }
+inline s16v low_minus_128_shl8(pairs_v v) { return minus_128_shl8(v.even); }
+inline s16v high_minus_128_shl8(pairs_v v) { return minus_128_shl8(v.odd); }
 
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
@@ -197,6 +225,11 @@ inline u8v narrow_join(s16v even, s16v odd) {
 inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
 inline u16v widen_high(u8v v) { return vmovl_u8(vget_high_u8(v)); }
 inline u8v narrow(s16v low, s16v high) { return vcombine_u8(vqmovun_s16(low), vqmovun_s16(high)); }
+
+inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
+    return vcombine_u8(vrshrn_n_u16(vpadalq_u8(vpaddlq_u8(a0), b0), 2),
+                       vrshrn_n_u16(vpadalq_u8(vpaddlq_u8(a1), b1), 2));
+}
 
 // 32-bit ARM interleaves whole vectors with one instruction; of a pair zip_low and zip_high of the
 // same vectors the compiler makes one.
@@ -256,6 +289,8 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
 inline u8v natural_to_by8(u8v v) { return v; }
 inline u8v natural_to_by4(u8v v) { return v; }
 inline u8v by8_to_natural(u8v v) { return v; }
+inline pairs_v natural_to_by8(pairs_v v) { return v; }
+inline pairs_v natural_to_by4(pairs_v v) { return v; }
 
 struct pair_u8 {
     u8v even, odd;
@@ -272,12 +307,24 @@ inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
     return {vbslq_u8(exchange, v.odd, v.even), vbslq_u8(exchange, v.even, v.odd)};
 }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
-    const uint8x8x2_t split = vuzp_u8(vget_low_u8(v), vget_high_u8(v));
-    vst1_u8(p, split.val[0]);
-    vst1_u8(q, split.val[1]);
+    vst1_u8(p, vmovn_u16(as_u16(v)));
+    vst1_u8(q, vshrn_n_u16(as_u16(v), 8));
 }
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
+// GCC keeps structures in memory that are copied as parts of others: hence one register at a time.
+struct luma_chroma {
+    pairs_v y, pairs;
+};
+inline luma_chroma load_groups(const uint8_t *p) {
+    const uint8x8x4_t v = vld4_u8(p);
+    return {{v.val[0], v.val[2]}, {v.val[1], v.val[3]}};
+}
+inline luma_chroma load_groups_natural(const uint8_t *p) { return load_groups(p); }
+inline luma_chroma load_groups_by4(const uint8_t *p) { return load_groups(p); }
+inline luma_chroma exchanged(const luma_chroma &v) {
+    return {{v.pairs.even, v.pairs.odd}, {v.y.even, v.y.odd}};
+}
 
 inline u16v sums_of_four(u8v a, u8v b) { return vpadalq_u8(vpaddlq_u8(a), b); }
 inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
@@ -329,12 +376,6 @@ inline rgb_v load_8888(const uint8_t *p) {
     return {{v.val[First], v.val[First + 1], v.val[First + 2]}};
 }
 
-template <int K>
-inline u16v add_product(u16v sum, uint8x8_t x) {
-    if constexpr (K > 0) return vmlal_u8(sum, x, vdup_n_u8(K));
-    if constexpr (K < 0) return vmlsl_u8(sum, x, vdup_n_u8(-K));
-    return sum;
-}
 // Dot products of the low and of the high half, by factors that are the same in all lanes. 64-bit
 // ARM multiplies high halves where they lie.
 inline u16v dot_low(rgb_v v, u8v a, u8v b, u8v c) {
@@ -367,22 +408,27 @@ inline u16v even_dot(rgb_v v) {
     sum = add_product<B>(sum, evens(v.val[1]));
     return add_product<C>(sum, evens(v.val[2]));
 }
-// The same with factors that are known at run time.
+// The same with factors that are known at run time, each in all bytes. Those of the sum are signed;
+// of samples less 128 the products are signed as well, and the offset makes up for these.
 struct channel_factors {
-    int16_t a, b, c;
+    u8v a, b, c;
+    s16v offset;
 };
 inline channel_factors set_channel_factors(int a, int b, int c) {
-    return {static_cast<int16_t>(a), static_cast<int16_t>(b), static_cast<int16_t>(c)};
+    const auto all = [](int k) { return vdupq_n_u8(static_cast<uint8_t>(k)); };
+    return {all(a), all(b), all(c), vdupq_n_s16(static_cast<int16_t>(128 * (a + b + c)))};
 }
 inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    const u8v a = vdupq_n_u8(static_cast<uint8_t>(f.a)), b = vdupq_n_u8(static_cast<uint8_t>(f.b)),
-              c = vdupq_n_u8(static_cast<uint8_t>(f.c));
-    return vcombine_u8(vshrn_n_u16(dot_low(v, a, b, c), 8), vshrn_n_u16(dot_upper(v, a, b, c), 8));
+    return vcombine_u8(vshrn_n_u16(dot_low(v, f.a, f.b, f.c), 8),
+                       vshrn_n_u16(dot_upper(v, f.a, f.b, f.c), 8));
 }
 inline s16v even_dot(rgb_v v, const channel_factors &f) {
-    s16v sum = vmulq_n_s16(as_s16(even(v.val[0])), f.a);
-    sum = vmlaq_n_s16(sum, as_s16(even(v.val[1])), f.b);
-    return vmlaq_n_s16(sum, as_s16(even(v.val[2])), f.c);
+    const auto low = [](u8v k) { return vreinterpret_s8_u8(vget_low_u8(k)); };
+    const auto evens = [&](u8v c) {
+        return vreinterpret_s8_u8(vmovn_u16(as_u16(veorq_u8(c, vdupq_n_u8(128)))));
+    };
+    const s16v sum = vmlal_s8(f.offset, evens(v.val[0]), low(f.a));
+    return vmlal_s8(vmlal_s8(sum, evens(v.val[1]), low(f.b)), evens(v.val[2]), low(f.c));
 }
 
 inline u8v block_means(u8v a, u8v b) { return as_u8(vrshrq_n_u16(sums_of_four(a, b), 2)); }
@@ -410,36 +456,47 @@ inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
     store_565(p, v.val[0], v.val[1], v.val[2]);
 }
 
-struct channel_moves {
-    bool exchange, alpha_first;
-};
-using widen_moves = channel_moves;
-inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
-    return {exchange, to_alpha_first};
+// Loads and stores of structures have the order in their registers: a loop for each.
+template <bool Exchange, bool AlphaFirst>
+struct channel_moves {};
+template <class F>
+[[gnu::always_inline]] inline void with_moves(bool exchange, bool alpha_first, F f) {
+    if (exchange && alpha_first) return f(channel_moves<true, true>{});
+    if (exchange) return f(channel_moves<true, false>{});
+    if (alpha_first) return f(channel_moves<false, true>{});
+    f(channel_moves<false, false>{});
 }
-inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+template <class F>
+[[gnu::always_inline]] inline void with_widen_moves(bool exchange, bool to_alpha_first, F f) {
+    with_moves(exchange, to_alpha_first, f);
+}
+template <bool Exchange, bool AlphaFirst>
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, channel_moves<Exchange, AlphaFirst>) {
     const uint8x16x3_t v = vld3q_u8(q);
-    const u8v first = m.exchange ? v.val[2] : v.val[0], last = m.exchange ? v.val[0] : v.val[2],
-              a = set_u8(255);
-    const uint8x16x4_t before = {{a, first, v.val[1], last}}, behind = {{first, v.val[1], last, a}};
-    if (m.alpha_first)
-        vst4q_u8(p, before);
+    const u8v first = v.val[Exchange ? 2 : 0], last = v.val[Exchange ? 0 : 2], a = set_u8(255);
+    if constexpr (AlphaFirst)
+        store_zip4(p, a, first, v.val[1], last);
     else
-        vst4q_u8(p, behind);
+        store_zip4(p, first, v.val[1], last, a);
 }
-using narrow_moves = channel_moves;
-inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
-    return {exchange, from_alpha_first};
+template <class F>
+[[gnu::always_inline]] inline void with_narrow_moves(bool exchange, bool from_alpha_first, F f) {
+    with_moves(exchange, from_alpha_first, f);
 }
-inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+template <bool Exchange, bool AlphaFirst>
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, channel_moves<Exchange, AlphaFirst>) {
+    constexpr int first = AlphaFirst + (Exchange ? 2 : 0), last = AlphaFirst + (Exchange ? 0 : 2);
+#if defined __aarch64__ || defined __clang__
     const uint8x16x4_t v = vld4q_u8(q);
-    const u8v first = m.alpha_first ? v.val[1] : v.val[0],
-              mid = m.alpha_first ? v.val[2] : v.val[1], last = m.alpha_first ? v.val[3] : v.val[2];
-    const uint8x16x3_t kept = {{first, mid, last}}, exchanged = {{last, mid, first}};
-    if (m.exchange)
-        vst3q_u8(p, exchanged);
-    else
-        vst3q_u8(p, kept);
+    store_zip3(p, v.val[first], v.val[AlphaFirst + 1], v.val[last]);
+#else
+    // GCC moves parts of four vectors through the stack.
+    for (int k = 0; k < 2; k++) {
+        const uint8x8x4_t v = vld4_u8(q + 32 * k);
+        const uint8x8x3_t to = {{v.val[first], v.val[AlphaFirst + 1], v.val[last]}};
+        vst3_u8(p + 24 * k, to);
+    }
+#endif
 }
 
 inline void exchange_888(uint8_t *p, const uint8_t *q) {
@@ -448,39 +505,34 @@ inline void exchange_888(uint8_t *p, const uint8_t *q) {
     vst3q_u8(p, exchanged);
 }
 
-using quads_v = uint8x16x4_t;
-inline quads_v load_quads(const uint8_t *p) { return vld4q_u8(p); }
-inline rgb_v weighted(const quads_v &v, bool skips_first) {
-    return {{skips_first ? v.val[1] : v.val[0], skips_first ? v.val[2] : v.val[1],
-             skips_first ? v.val[3] : v.val[2]}};
+// A loop for each of the two kinds: the byte without a weight is left where it is.
+using quads_v = rgb_v;
+template <class F>
+[[gnu::always_inline]] inline void with_load_quads(bool skips_first, F f) {
+    if (skips_first)
+        f([](const uint8_t *p) { return load_8888<1>(p); });
+    else
+        f([](const uint8_t *p) { return load_8888<0>(p); });
 }
-struct quad_factors {
+struct quad_weights {
     channel_factors factors;
-    bool skips_first;
-};
-struct quad_weights : quad_factors {
     u8v d;
 };
-inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
-    return {{set_channel_factors(a, b, c), skips_first}, set_u8(static_cast<uint8_t>(d))};
+inline quad_weights set_quad_weights(bool, int a, int b, int c, int d) {
+    return {set_channel_factors(a, b, c), set_u8(static_cast<uint8_t>(d))};
 }
 inline u8v dot_high(const quads_v &v, const quad_weights &w) {
-    return vaddq_u8(dot_high(weighted(v, w.skips_first), w.factors), w.d);
+    return vaddq_u8(dot_high(v, w.factors), w.d);
 }
-inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
-    return {set_channel_factors(a, b, c), skips_first};
+using quad_factors = channel_factors;
+inline quad_factors set_quad_factors(bool, int a, int b, int c) {
+    return set_channel_factors(a, b, c);
 }
 // Still all of them: the even ones count.
 using half_quads_v = quads_v;
 inline half_quads_v even_quads(const quads_v &v) { return v; }
-inline half_quads_v block_means(const quads_v &a, const quads_v &b) {
-    return {{block_means(a.val[0], b.val[0]), block_means(a.val[1], b.val[1]),
-             block_means(a.val[2], b.val[2]), block_means(a.val[3], b.val[3])}};
-}
 inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const auto dot = [&](const quad_factors &k) {
-        return as_u16(sub_sat(c, even_dot(weighted(v, k.skips_first), k.factors)));
-    };
+    const auto dot = [&](const quad_factors &k) { return as_u16(sub_sat(c, even_dot(v, k))); };
     return join_high(dot(f), dot(g));
 }
 

@@ -13,11 +13,14 @@ namespace simgp::sse41 {
 
 inline constexpr int bytes = 16;
 inline constexpr int blocks = 1;
+inline constexpr bool moves_pointers = false;
 
 // One register type stands for all lanes.
 using u8v = __m128i;
 using u16v = __m128i;
 using s16v = __m128i;
+using pairs_v = u8v;
+using pair_bytes = u16v;
 
 inline u8v as_u8(u16v v) { return v; }
 inline u16v as_u16(u8v v) { return v; }

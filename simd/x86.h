@@ -12,6 +12,23 @@
 
 namespace simgp::SIMD_TARGET {
 
+// Byte pairs are best left in vectors.
+inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
+inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+inline pairs_v pair_evens(pairs_v u, pairs_v v) { return join(even(u), even(v)); }
+inline pairs_v pair_odds(pairs_v u, pairs_v v) { return join(odd(u), odd(v)); }
+inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+struct luma_chroma {
+    pairs_v y, pairs;
+};
+inline luma_chroma groups_of(const pair_u8 &v) { return {v.even, v.odd}; }
+inline luma_chroma load_groups(const uint8_t *p) { return groups_of(load_split(p)); }
+inline luma_chroma load_groups_natural(const uint8_t *p) {
+    return groups_of(load_split_natural(p));
+}
+inline luma_chroma load_groups_by4(const uint8_t *p) { return groups_of(load_split_by4(p)); }
+inline luma_chroma exchanged(const luma_chroma &v) { return {v.pairs, v.y}; }
+
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline u16v dot(u8v ac, u16v b) {
@@ -28,6 +45,14 @@ template <int A, int B, int C, int D>
 inline u16v even_dot(rgb_v v) {
     static_assert(limits::channel_factors<A, B, C>);
     return add(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
+}
+
+inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
+    const u8v one = set_u8(1);
+    const auto sums = [&](u8v a, u8v b) {
+        return sar<2>(add(add(dot_pairs(a, one), dot_pairs(b, one)), set_u16(2)));
+    };
+    return narrow(sums(a0, b0), sums(a1, b1));
 }
 
 // The same with factors that are known at run time.
@@ -78,12 +103,26 @@ inline channels_v channels_of(rgb_v v) {
             join_high(v.ac_even, v.ac_odd)};
 }
 
+// A shuffle is the same code for all orders.
+template <class F>
+[[gnu::always_inline]] inline void with_widen_moves(bool swap, bool to_alpha_first, F f) {
+    f(set_widen_moves(swap, to_alpha_first));
+}
+template <class F>
+[[gnu::always_inline]] inline void with_narrow_moves(bool swap, bool from_alpha_first, F f) {
+    f(set_narrow_moves(swap, from_alpha_first));
+}
+
 // Pixels of four bytes, a vector's worth of each quarter of what is read.
 struct quads_v {
     u8v v[4];
 };
 inline quads_v load_quads(const uint8_t *p) {
     return {{load(p), load(p + bytes), load(p + 2 * bytes), load(p + 3 * bytes)}};
+}
+template <class F>
+[[gnu::always_inline]] inline void with_load_quads(bool, F f) {
+    f([](const uint8_t *p) { return load_quads(p); });
 }
 inline u8v set_quad(bool skips_first, int a, int b, int c) {
     const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
