@@ -67,7 +67,7 @@ PEERS = {
     "any three to three": {"RAWToRGB24Row": 1},
     "any three to four": {"RAWToARGBRow": 1},
     "any four to words": {"ARGBToRGB565Row": 1},
-    "any four to three": {"ARGBToRGB24Row": 1},
+    "any four to three": {"ARGBToRAWRow": 1},
     "any split groups": {"YUY2ToYRow": 1, "YUY2ToUV422Row": 1},
     "any groups to planes, two": {"YUY2ToYRow": 1, "YUY2ToUV422Row": .5},
     "any join groups": {"I422ToYUY2Row": 1},

@@ -235,7 +235,7 @@ void list_peers() {
     PEER(ARGBToUVRow, peer_lines)
     PEER(RGB565ToUVRow, peer_lines)
     PEER(ARGBToRGB565Row, peer_plain_11)
-    PEER(ARGBToRGB24Row, peer_plain_11)
+    PEER(ARGBToRAWRow, peer_plain_11)
     PEER(RGB565ToARGBRow, peer_plain_11)
     PEER(RAWToARGBRow, peer_plain_11)
     PEER(RAWToRGB24Row, peer_plain_11)

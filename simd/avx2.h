@@ -13,6 +13,7 @@ namespace simgp::avx2 {
 
 inline constexpr int bytes = 32;
 inline constexpr int blocks = 2;
+inline constexpr bool moves_pointers = false;
 
 // One register type stands for all lanes.
 using u8v = __m256i;

@@ -13,6 +13,7 @@ namespace simgp::avx512 {
 
 inline constexpr int bytes = 64;
 inline constexpr int blocks = 4;
+inline constexpr bool moves_pointers = false;
 
 // One register type stands for all lanes.
 using u8v = __m512i;

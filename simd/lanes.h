@@ -29,6 +29,7 @@ namespace simgp::SIMD_LANES_NAMESPACE {
 
 inline constexpr int bytes = SIMD_LANES_BYTES;
 inline constexpr int blocks = bytes / 16;
+inline constexpr bool moves_pointers = true;
 
 template <typename T>
 struct vec {
@@ -363,6 +364,16 @@ inline u8v narrow(s16v low, s16v high) {
     });
 }
 
+// Within blocks: the means of two neighbouring bytes of a and the two of b at the same place, with
+// halves rounded up: the lower 8 bytes of a block from a0 and b0, the upper ones from a1 and b1.
+inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
+    return make<u8v>([&](int i) {
+        const int at = i / 16 * 16 + i % 8 * 2;
+        const u8v &a = i % 16 < 8 ? a0 : a1, &b = i % 16 < 8 ? b0 : b1;
+        return (a.lane[at] + a.lane[at + 1] + b.lane[at] + b.lane[at + 1] + 2) >> 2;
+    });
+}
+
 // Within blocks: granules of N bytes of the lower, or of the upper, halves of a's and b's block in
 // turn; N is 1, 2, 4 or 8.
 template <int N>
@@ -576,26 +587,27 @@ inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) { repack_to_565<4>(
 
 // `bytes` pixels of three bytes at q become pixels of four at p, and the other way round. The first
 // channel and the last may change places; alpha stands before or behind them, becomes 255, and is
-// dropped.
+// dropped. With the moves that the order takes, f(moves) is called once; their type may depend on
+// the order.
 struct channel_moves {
     bool exchange, alpha_first;
     int from(int channel) const { return exchange ? 2 - channel : channel; }
 };
-using widen_moves = channel_moves;
-inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
-    return {exchange, to_alpha_first};
+template <class F>
+inline void with_widen_moves(bool exchange, bool to_alpha_first, F f) {
+    f(channel_moves{exchange, to_alpha_first});
 }
-inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const channel_moves &m) {
     for (int i = 0; i < bytes; i++) {
         p[4 * i + (m.alpha_first ? 0 : 3)] = 255;
         for (int k = 0; k < 3; k++) p[4 * i + k + m.alpha_first] = q[3 * i + m.from(k)];
     }
 }
-using narrow_moves = channel_moves;
-inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
-    return {exchange, from_alpha_first};
+template <class F>
+inline void with_narrow_moves(bool exchange, bool from_alpha_first, F f) {
+    f(channel_moves{exchange, from_alpha_first});
 }
-inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const channel_moves &m) {
     for (int i = 0; i < bytes; i++)
         for (int k = 0; k < 3; k++) p[3 * i + k] = q[4 * i + m.from(k) + m.alpha_first];
 }

@@ -13,6 +13,7 @@ namespace simgp::neon {
 
 inline constexpr int bytes = 16;
 inline constexpr int blocks = 1;
+inline constexpr bool moves_pointers = true;
 
 using u8v = uint8x16_t;
 using u16v = uint16x8_t;
@@ -26,8 +27,13 @@ inline s16v as_s16(u16v v) { return vreinterpretq_s16_u16(v); }
 inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
 inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
+#ifdef __aarch64__
+    const uint8x8_t none = vdup_n_u8(0);  // which the loads write
+    return vzip1q_u8(vcombine_u8(vld1_u8(p), none), vcombine_u8(vld1_u8(q), none));
+#else
     const uint8x8x2_t zip = vzip_u8(vld1_u8(p), vld1_u8(q));
     return vcombine_u8(zip.val[0], zip.val[1]);
+#endif
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
@@ -198,6 +204,11 @@ inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
 inline u16v widen_high(u8v v) { return vmovl_u8(vget_high_u8(v)); }
 inline u8v narrow(s16v low, s16v high) { return vcombine_u8(vqmovun_s16(low), vqmovun_s16(high)); }
 
+inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
+    return vcombine_u8(vrshrn_n_u16(vpadalq_u8(vpaddlq_u8(a0), b0), 2),
+                       vrshrn_n_u16(vpadalq_u8(vpaddlq_u8(a1), b1), 2));
+}
+
 // 32-bit ARM interleaves whole vectors with one instruction; of a pair zip_low and zip_high of the
 // same vectors the compiler makes one.
 #ifdef __aarch64__
@@ -265,9 +276,8 @@ inline pair_u8 load_split(const uint8_t *p) {
     return {v.val[0], v.val[1]};
 }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
-    const uint8x8x2_t split = vuzp_u8(vget_low_u8(v), vget_high_u8(v));
-    vst1_u8(p, split.val[0]);
-    vst1_u8(q, split.val[1]);
+    vst1_u8(p, vmovn_u16(as_u16(v)));
+    vst1_u8(q, vshrn_n_u16(as_u16(v), 8));
 }
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
@@ -391,36 +401,47 @@ inline void repack_8888_to_565(uint8_t *p, const uint8_t *q) {
     store_565(p, v.val[0], v.val[1], v.val[2]);
 }
 
-struct channel_moves {
-    bool exchange, alpha_first;
-};
-using widen_moves = channel_moves;
-inline widen_moves set_widen_moves(bool exchange, bool to_alpha_first) {
-    return {exchange, to_alpha_first};
+// Loads and stores of structures have the order in their registers: a loop for each.
+template <bool Exchange, bool AlphaFirst>
+struct channel_moves {};
+template <class F>
+[[gnu::always_inline]] inline void with_moves(bool exchange, bool alpha_first, F f) {
+    if (exchange && alpha_first) return f(channel_moves<true, true>{});
+    if (exchange) return f(channel_moves<true, false>{});
+    if (alpha_first) return f(channel_moves<false, true>{});
+    f(channel_moves<false, false>{});
 }
-inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, const widen_moves &m) {
+template <class F>
+[[gnu::always_inline]] inline void with_widen_moves(bool exchange, bool to_alpha_first, F f) {
+    with_moves(exchange, to_alpha_first, f);
+}
+template <bool Exchange, bool AlphaFirst>
+inline void repack_888_to_8888(uint8_t *p, const uint8_t *q, channel_moves<Exchange, AlphaFirst>) {
     const uint8x16x3_t v = vld3q_u8(q);
-    const u8v first = m.exchange ? v.val[2] : v.val[0], last = m.exchange ? v.val[0] : v.val[2],
-              a = set_u8(255);
-    const uint8x16x4_t before = {{a, first, v.val[1], last}}, behind = {{first, v.val[1], last, a}};
-    if (m.alpha_first)
-        vst4q_u8(p, before);
+    const u8v first = v.val[Exchange ? 2 : 0], last = v.val[Exchange ? 0 : 2], a = set_u8(255);
+    if constexpr (AlphaFirst)
+        store_zip4(p, a, first, v.val[1], last);
     else
-        vst4q_u8(p, behind);
+        store_zip4(p, first, v.val[1], last, a);
 }
-using narrow_moves = channel_moves;
-inline narrow_moves set_narrow_moves(bool exchange, bool from_alpha_first) {
-    return {exchange, from_alpha_first};
+template <class F>
+[[gnu::always_inline]] inline void with_narrow_moves(bool exchange, bool from_alpha_first, F f) {
+    with_moves(exchange, from_alpha_first, f);
 }
-inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, const narrow_moves &m) {
+template <bool Exchange, bool AlphaFirst>
+inline void repack_8888_to_888(uint8_t *p, const uint8_t *q, channel_moves<Exchange, AlphaFirst>) {
+    constexpr int first = AlphaFirst + (Exchange ? 2 : 0), last = AlphaFirst + (Exchange ? 0 : 2);
+#if defined __aarch64__ || defined __clang__
     const uint8x16x4_t v = vld4q_u8(q);
-    const u8v first = m.alpha_first ? v.val[1] : v.val[0],
-              mid = m.alpha_first ? v.val[2] : v.val[1], last = m.alpha_first ? v.val[3] : v.val[2];
-    const uint8x16x3_t kept = {{first, mid, last}}, exchanged = {{last, mid, first}};
-    if (m.exchange)
-        vst3q_u8(p, exchanged);
-    else
-        vst3q_u8(p, kept);
+    store_zip3(p, v.val[first], v.val[AlphaFirst + 1], v.val[last]);
+#else
+    // GCC moves parts of four vectors through the stack.
+    for (int k = 0; k < 2; k++) {
+        const uint8x8x4_t v = vld4_u8(q + 32 * k);
+        const uint8x8x3_t to = {{v.val[first], v.val[AlphaFirst + 1], v.val[last]}};
+        vst3_u8(p + 24 * k, to);
+    }
+#endif
 }
 
 inline void exchange_888(uint8_t *p, const uint8_t *q) {

@@ -13,6 +13,7 @@ namespace simgp::sse41 {
 
 inline constexpr int bytes = 16;
 inline constexpr int blocks = 1;
+inline constexpr bool moves_pointers = false;
 
 // One register type stands for all lanes.
 using u8v = __m128i;

@@ -30,6 +30,14 @@ inline u16v even_dot(rgb_v v) {
     return add(dot<A, B, C>(v.ac_even, v.b_even), set_u16(static_cast<uint16_t>(D)));
 }
 
+inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
+    const u8v one = set_u8(1);
+    const auto sums = [&](u8v a, u8v b) {
+        return sar<2>(add(add(dot_pairs(a, one), dot_pairs(b, one)), set_u16(2)));
+    };
+    return narrow(sums(a0, b0), sums(a1, b1));
+}
+
 // The same with factors that are known at run time.
 struct channel_factors {
     u8v ac;
@@ -53,6 +61,16 @@ struct channels_v {
 inline channels_v channels_of(rgb_v v) {
     return {join(even(v.ac_even), v.ac_odd), join(v.b_even, v.b_odd),
             join_high(v.ac_even, v.ac_odd)};
+}
+
+// A shuffle is the same code for all orders.
+template <class F>
+[[gnu::always_inline]] inline void with_widen_moves(bool exchanged, bool to_alpha_first, F f) {
+    f(set_widen_moves(exchanged, to_alpha_first));
+}
+template <class F>
+[[gnu::always_inline]] inline void with_narrow_moves(bool exchanged, bool from_alpha_first, F f) {
+    f(set_narrow_moves(exchanged, from_alpha_first));
 }
 
 // Pixels of four bytes, a vector's worth of each quarter of what is read.

@@ -343,9 +343,9 @@ static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t
     constexpr int size = int(Kind) + 2;
     constexpr int chroma_size = Out == chroma_out::none ? 0 : Out == chroma_out::pairs ? 2 : 1;
     const any_yuv_matrix<Kind> m(w);
-    row_of_steps<Out != chroma_out::none>(
-        width, [](ptrdiff_t x) { return x; },
-        [&](ptrdiff_t x, ptrdiff_t) {
+    row_of_steps_apart<Out != chroma_out::none>(
+        width,
+        [&](ptrdiff_t x) {
             const auto p = load_pixels<Kind>(src0 + size * x);
             store(y0 + x, m.luma(p));
             if constexpr (Out == chroma_out::half) store_split(u + x / 2, v + x / 2, m.chroma(p));

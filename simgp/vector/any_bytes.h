@@ -36,14 +36,15 @@ inline rgb_v load_pixels(const uint8_t *p) {
 template <rgb_in In>
 static void split_pixels_vectors(const uint8_t *src, uint8_t *const channels[3], ptrdiff_t count) {
     constexpr int size = size_in<In>;
-    row_of_steps<false>(
-        count, [&](ptrdiff_t x) { return load_pixels<In>(src + size * x); },
-        [&](ptrdiff_t x, rgb_v p) {
-            const channels_v c = channels_of(p);
-            for (int k = 0; k < 3; k++) store(channels[k] + x, c.c[k]);
-        },
-        [&](ptrdiff_t x, int part) {
-            split_part(split_pixels_vectors<In>, size, src, channels, x, part);
+    if (count < bytes) {
+        split_part(split_pixels_vectors<In>, size, src, channels, 0, int(count));
+        return;
+    }
+    move_steps<2>(
+        count, lines_in<size>{{src}}, lines_out<1, 1, 1>{{channels[0], channels[1], channels[2]}},
+        [](const uint8_t *const *p) { return channels_of(load_pixels<In>(p[0])); },
+        [](uint8_t *const *q, const channels_v &c) {
+            for (int k = 0; k < 3; k++) store(q[k], c.c[k]);
         });
 }
 
@@ -82,14 +83,14 @@ struct repack_sizes {
 // Calls convert(p, q) for every `bytes` pixels of Size bytes at q that become pixels of ToSize bytes
 // at p. What is left is done by `row`, which is the caller.
 template <int Size, int ToSize, class Convert>
-inline void repack_in_steps(repack_row *row, const repacking &order, const uint8_t *src,
-                            uint8_t *dst, ptrdiff_t count, Convert convert) {
-    row_of_steps<false>(
-        count, [&](ptrdiff_t x) { return src + Size * x; },
-        [&](ptrdiff_t x, const uint8_t *from) { convert(dst + ToSize * x, from); },
-        [&](ptrdiff_t x, int part) {
-            repack_part(row, {Size, ToSize}, order, src, dst, x, part);
-        });
+[[gnu::always_inline]] inline void repack_in_steps(repack_row *row, const repacking &order,
+                                                   const uint8_t *src, uint8_t *dst,
+                                                   ptrdiff_t count, Convert convert) {
+    if (count < bytes) return repack_part(row, {Size, ToSize}, order, src, dst, 0, int(count));
+    move_steps(
+        count, lines_in<Size>{{src}}, lines_out<ToSize>{{dst}},
+        [](const uint8_t *const *p) { return p[0]; },
+        [&](uint8_t *const *q, const uint8_t *from) { convert(q[0], from); });
 }
 
 template <rgb_in In, pixel_kind To>
@@ -115,15 +116,17 @@ static void exchange_three(const repacking &order, const uint8_t *src, uint8_t *
 }
 static void three_to_four(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
-    const widen_moves m = set_widen_moves(order.exchange, order.to_alpha_first);
-    repack_in_steps<3, 4>(three_to_four, order, src, dst, count,
-                          [&](uint8_t *p, const uint8_t *q) { repack_888_to_8888(p, q, m); });
+    with_widen_moves(order.exchange, order.to_alpha_first, [&](const auto &m) {
+        repack_in_steps<3, 4>(three_to_four, order, src, dst, count,
+                              [&](uint8_t *p, const uint8_t *q) { repack_888_to_8888(p, q, m); });
+    });
 }
 static void four_to_three(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
-    const narrow_moves m = set_narrow_moves(order.exchange, order.from_alpha_first);
-    repack_in_steps<4, 3>(four_to_three, order, src, dst, count,
-                          [&](uint8_t *p, const uint8_t *q) { repack_8888_to_888(p, q, m); });
+    with_narrow_moves(order.exchange, order.from_alpha_first, [&](const auto &m) {
+        repack_in_steps<4, 3>(four_to_three, order, src, dst, count,
+                              [&](uint8_t *p, const uint8_t *q) { repack_8888_to_888(p, q, m); });
+    });
 }
 
 // The first byte of each byte's pixel, from the start of the block.
@@ -164,66 +167,81 @@ static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *ds
 // YUV to YUV
 // ------------------------------------------------------------------------------------------------
 
-static void any_split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
-                             ptrdiff_t pairs, bool luma_first) {
-    in_steps<bytes / 2>(
-        pairs,
-        [&](ptrdiff_t i) {
-            const pair_u8 p = load_split_natural(src + 4 * i);
-            store(y + 2 * i, luma_first ? p.even : p.odd);
-            store_split(u + i, v + i, luma_first ? p.odd : p.even);
+// Groups of two pixels, luma first or chroma first: rows of those, in steps of `bytes` pixels.
+constexpr int groups_of_step = bytes / 2;
+
+template <bool LumaFirst>
+static void split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t pairs) {
+    move_line<2, groups_of_step>(
+        pairs, lines_in<4>{{src}}, lines_out<2, 1, 1>{{y, u, v}},
+        [](const uint8_t *const *p) { return load_split_natural(p[0]); },
+        [](uint8_t *const *q, const pair_u8 &p) {
+            store(q[0], LumaFirst ? p.even : p.odd);
+            store_split(q[1], q[2], LumaFirst ? p.odd : p.even);
         },
-        [&](ptrdiff_t i) {
-            const uint8_t *const luma = src + 4 * i + !luma_first;
-            const uint8_t *const chroma = src + 4 * i + luma_first;
-            y[2 * i] = luma[0];
-            y[2 * i + 1] = luma[2];
-            u[i] = chroma[0];
-            v[i] = chroma[2];
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            const uint8_t *const luma = p[0] + !LumaFirst, *const chroma = p[0] + LumaFirst;
+            q[0][0] = luma[0];
+            q[0][1] = luma[2];
+            *q[1] = chroma[0];
+            *q[2] = chroma[2];
         });
 }
+static void any_split_groups(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v,
+                             ptrdiff_t pairs, bool luma_first) {
+    (luma_first ? split_groups<true> : split_groups<false>)(src, y, u, v, pairs);
+}
 
+template <bool LumaFirst>
+static void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
+                        ptrdiff_t pairs) {
+    move_line<2, groups_of_step>(
+        pairs, lines_in<2, 1, 1>{{y, u, v}}, lines_out<4>{{dst}},
+        [](const uint8_t *const *p) {
+            const u8v luma = natural_to_by8(load(p[0]));
+            const u8v chroma = natural_to_by8(load_zip(p[1], p[2]));
+            return LumaFirst ? pair_u8{luma, chroma} : pair_u8{chroma, luma};
+        },
+        [](uint8_t *const *q, const pair_u8 &p) { store_zip8(q[0], p.even, p.odd); },
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            uint8_t *const luma = q[0] + !LumaFirst, *const chroma = q[0] + LumaFirst;
+            luma[0] = p[0][0];
+            luma[2] = p[0][1];
+            chroma[0] = *p[1];
+            chroma[2] = *p[2];
+        });
+}
 static void any_join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
                             ptrdiff_t pairs, bool luma_first) {
-    in_steps<bytes / 2>(
-        pairs,
-        [&](ptrdiff_t i) {
-            const u8v luma = natural_to_by8(load(y + 2 * i));
-            const u8v chroma = natural_to_by8(load_zip(u + i, v + i));
-            store_zip8(dst + 4 * i, luma_first ? luma : chroma, luma_first ? chroma : luma);
-        },
-        [&](ptrdiff_t i) {
-            uint8_t *const luma = dst + 4 * i + !luma_first, *const chroma =
-                                                                 dst + 4 * i + luma_first;
-            luma[0] = y[2 * i];
-            luma[2] = y[2 * i + 1];
-            chroma[0] = u[i];
-            chroma[2] = v[i];
-        });
+    (luma_first ? join_groups<true> : join_groups<false>)(y, u, v, dst, pairs);
 }
 
 template <bool LumaFirst, bool Pairs>
 static void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0, uint8_t *y1,
                           uint8_t *u, uint8_t *v, ptrdiff_t pairs) {
-    in_steps<bytes / 2>(
-        pairs,
-        [&](ptrdiff_t i) {
-            const pair_u8 p = load_split(src0 + 4 * i);
-            const pair_u8 q = load_split(src1 + 4 * i);
-            const u8v chroma = by8_to_natural(LumaFirst ? p.odd : p.even);
-            store(y0 + 2 * i, by8_to_natural(LumaFirst ? p.even : p.odd));
-            store(y1 + 2 * i, by8_to_natural(LumaFirst ? q.even : q.odd));
+    struct two_lines {
+        pair_u8 first, second;
+    };
+    constexpr int chroma_size = Pairs ? 2 : 1;
+    move_line<2, groups_of_step>(
+        pairs, lines_in<4, 4>{{src0, src1}},
+        lines_out<2, 2, chroma_size, chroma_size>{{y0, y1, u, Pairs ? u : v}},
+        [](const uint8_t *const *p) { return two_lines{load_split(p[0]), load_split(p[1])}; },
+        [](uint8_t *const *q, const two_lines &p) {
+            const u8v chroma = by8_to_natural(LumaFirst ? p.first.odd : p.first.even);
+            store(q[0], by8_to_natural(LumaFirst ? p.first.even : p.first.odd));
+            store(q[1], by8_to_natural(LumaFirst ? p.second.even : p.second.odd));
             if constexpr (Pairs)
-                store(u + 2 * i, chroma);
+                store(q[2], chroma);
             else
-                store_split(u + i, v + i, chroma);
+                store_split(q[2], q[3], chroma);
         },
-        [&](ptrdiff_t i) {
+        [](uint8_t *const *q, const uint8_t *const *p) {
             constexpr int luma = LumaFirst ? 0 : 1, chroma = 1 - luma;
             for (int k = 0; k < 2; k++) {
-                y0[2 * i + k] = src0[4 * i + 2 * k + luma];
-                y1[2 * i + k] = src1[4 * i + 2 * k + luma];
-                *(Pairs ? u + 2 * i + k : k ? v + i : u + i) = src0[4 * i + 2 * k + chroma];
+                q[0][k] = p[0][2 * k + luma];
+                q[1][k] = p[1][2 * k + luma];
+                *(Pairs ? q[2] + k : q[2 + k]) = p[0][2 * k + chroma];
             }
         });
 }
@@ -235,53 +253,56 @@ static void any_groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t 
 }
 
 static void any_mean_of_lines(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    in_steps(
-        count, [&](ptrdiff_t x) { store(dst + x, avg_u8(load(a + x), load(b + x))); },
-        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[x] + b[x] + 1) >> 1); });
+    move_line<2>(
+        count, lines_in<1, 1>{{a, b}}, lines_out<1>{{dst}},
+        [](const uint8_t *const *p) { return avg_u8(load(p[0]), load(p[1])); },
+        [](uint8_t *const *q, u8v v) { store(q[0], v); },
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            *q[0] = static_cast<uint8_t>((*p[0] + *p[1] + 1) >> 1);
+        });
 }
 static void any_mean_of_pairs(const uint8_t *a, const uint8_t *, uint8_t *dst, ptrdiff_t count) {
-    in_steps(
-        count,
-        [&](ptrdiff_t x) {
-            const pair_u8 p = load_split_natural(a + 2 * x);
-            store(dst + x, avg_u8(p.even, p.odd));
-        },
-        [&](ptrdiff_t x) { dst[x] = static_cast<uint8_t>((a[2 * x] + a[2 * x + 1] + 1) >> 1); });
+    move_line<2>(
+        count, lines_in<2>{{a}}, lines_out<1>{{dst}},
+        [](const uint8_t *const *p) { return load_split_natural(p[0]); },
+        [](uint8_t *const *q, const pair_u8 &v) { store(q[0], avg_u8(v.even, v.odd)); },
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            *q[0] = static_cast<uint8_t>((p[0][0] + p[0][1] + 1) >> 1);
+        });
 }
 static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t count) {
-    const s16v two = as_s16(set_u16(2));
-    in_steps(
-        count,
-        [&](ptrdiff_t x) {
-            const auto sums = [&](ptrdiff_t at) {
-                const u8v of_a = load(a + at), of_b = load(b + at);
-                const s16v of_even = add(as_s16(even(of_a)), as_s16(even(of_b)));
-                const s16v of_odd = add(as_s16(odd(of_a)), as_s16(odd(of_b)));
-                return sar<2>(add(add(of_even, of_odd), two));
-            };
-            store(dst + x, by8_to_natural(narrow(sums(2 * x), sums(2 * x + bytes))));
+    struct lines_of_two {
+        u8v a[2], b[2];
+    };
+    move_line<2>(
+        count, lines_in<2, 2>{{a, b}}, lines_out<1>{{dst}},
+        [](const uint8_t *const *p) {
+            return lines_of_two{{load(p[0]), load(p[0] + bytes)}, {load(p[1]), load(p[1] + bytes)}};
         },
-        [&](ptrdiff_t x) {
-            const int sum = a[2 * x] + a[2 * x + 1] + b[2 * x] + b[2 * x + 1];
-            dst[x] = static_cast<uint8_t>((sum + 2) >> 2);
+        [](uint8_t *const *q, const lines_of_two &v) {
+            store(q[0], by8_to_natural(mean_of_pairs(v.a[0], v.b[0], v.a[1], v.b[1])));
+        },
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            const int sum = p[0][0] + p[0][1] + p[1][0] + p[1][1];
+            *q[0] = static_cast<uint8_t>((sum + 2) >> 2);
         });
 }
 
 // What follows the last sample may lie behind the line.
 static void any_every_second(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
-    in_steps(
-        count - 1, [&](ptrdiff_t x) { store(dst + x, load_split_natural(a + 2 * x).even); },
-        [&](ptrdiff_t x) { dst[x] = a[2 * x]; });
+    move_line<2>(
+        count - 1, lines_in<2>{{a}}, lines_out<1>{{dst}},
+        [](const uint8_t *const *p) { return load_split_natural(p[0]).even; },
+        [](uint8_t *const *q, u8v v) { store(q[0], v); },
+        [](uint8_t *const *q, const uint8_t *const *p) { *q[0] = *p[0]; });
     dst[count - 1] = a[2 * (count - 1)];
 }
 static void any_twice(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
-    in_steps(
-        count / 2,
-        [&](ptrdiff_t i) {
-            const u8v v = natural_to_by8(load(a + i));
-            store_zip8(dst + 2 * i, v, v);
-        },
-        [&](ptrdiff_t i) { dst[2 * i] = dst[2 * i + 1] = a[i]; });
+    move_line<2>(
+        count / 2, lines_in<1>{{a}}, lines_out<2>{{dst}},
+        [](const uint8_t *const *p) { return natural_to_by8(load(p[0])); },
+        [](uint8_t *const *q, u8v v) { store_zip8(q[0], v, v); },
+        [](uint8_t *const *q, const uint8_t *const *p) { q[0][0] = q[0][1] = *p[0]; });
     if (count & 1) dst[count - 1] = a[count / 2];
 }
 

@@ -8,30 +8,31 @@
 namespace simgp::SIMD_TARGET {
 
 static void pack_pairs(const uint8_t *a, const uint8_t *b, uint8_t *dst, ptrdiff_t pairs) {
-    in_pair_steps(
-        pairs,
-        [&](ptrdiff_t i) {
-            store_zip8(dst + 2 * i, natural_to_by8(load(a + i)), natural_to_by8(load(b + i)));
+    move_pairs(
+        pairs, lines_in<1, 1>{{a, b}}, lines_out<2>{{dst}},
+        [](const uint8_t *const *p) {
+            return pair_u8{natural_to_by8(load(p[0])), natural_to_by8(load(p[1]))};
         },
-        [&](ptrdiff_t i) { store(dst + 2 * i, load_zip(a + i, b + i)); },
-        [&](ptrdiff_t i) {
-            dst[2 * i] = a[i];
-            dst[2 * i + 1] = b[i];
+        [](uint8_t *const *q, const pair_u8 &v) { store_zip8(q[0], v.even, v.odd); },
+        [](uint8_t *const *q, const uint8_t *const *p) { store(q[0], load_zip(p[0], p[1])); },
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            q[0][0] = *p[0];
+            q[0][1] = *p[1];
         });
 }
 
 static void unpack_pairs(const uint8_t *src, uint8_t *a, uint8_t *b, ptrdiff_t pairs) {
-    in_pair_steps(
-        pairs,
-        [&](ptrdiff_t i) {
-            const pair_u8 v = load_split_natural(src + 2 * i);
-            store(a + i, v.even);
-            store(b + i, v.odd);
+    move_pairs(
+        pairs, lines_in<2>{{src}}, lines_out<1, 1>{{a, b}},
+        [](const uint8_t *const *p) { return load_split_natural(p[0]); },
+        [](uint8_t *const *q, const pair_u8 &v) {
+            store(q[0], v.even);
+            store(q[1], v.odd);
         },
-        [&](ptrdiff_t i) { store_split(a + i, b + i, load(src + 2 * i)); },
-        [&](ptrdiff_t i) {
-            a[i] = src[2 * i];
-            b[i] = src[2 * i + 1];
+        [](uint8_t *const *q, const uint8_t *const *p) { store_split(q[0], q[1], load(p[0])); },
+        [](uint8_t *const *q, const uint8_t *const *p) {
+            *q[0] = p[0][0];
+            *q[1] = p[0][1];
         });
 }
 

@@ -77,9 +77,8 @@ struct rgb_to_yuv_step {
     static constexpr bool planar = Layout == yuv_layout::half;
     static constexpr int chroma_size = planar ? 1 : 2;
 
-    static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + from::size * x; }
-    static void write(const yuv_row_out &out, ptrdiff_t x, const uint8_t *pixels) {
-        const rgb_v p = from::load(pixels);
+    static void convert(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x) {
+        const rgb_v p = from::load(in + from::size * x);
         store(out.y + x, matrix::luma(p));
         if constexpr (Layout == yuv_layout::grey) return;
         const u16v u = matrix::u(p), v = matrix::v(p);
@@ -113,12 +112,11 @@ struct rgb_to_rgb565_step {
     static constexpr bool four_bytes = size == 4;
     static_assert(size >= 3 && at.r == 0 && at.g == 1 && at.b == 2);
 
-    static const uint8_t *load(const uint8_t *in, ptrdiff_t x) { return in + size * x; }
-    static void write(uint8_t *out, ptrdiff_t x, const uint8_t *pixels) {
+    static void convert(const uint8_t *in, uint8_t *out, ptrdiff_t x) {
         if constexpr (four_bytes)
-            repack_8888_to_565(out + 2 * x, pixels);
+            repack_8888_to_565(out + 2 * x, in + size * x);
         else
-            repack_888_to_565(out + 2 * x, pixels);
+            repack_888_to_565(out + 2 * x, in + size * x);
     }
     static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
         part_to_rgb565(to_rgb565_row<Packing>, size, in, out, x, count);
@@ -127,12 +125,12 @@ struct rgb_to_rgb565_step {
 
 template <rgb_packing Packing, yuv_layout Layout>
 static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    row_of_steps<rgb_to_yuv_step<Packing, Layout>>(src, yuv_row_out{y, u, v}, width);
+    row_of_steps_apart<rgb_to_yuv_step<Packing, Layout>>(src, yuv_row_out{y, u, v}, width);
 }
 
 template <rgb_packing Packing>
 static void to_rgb565_row(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
-    row_of_steps<rgb_to_rgb565_step<Packing>>(src, dst, width);
+    row_of_steps_apart<rgb_to_rgb565_step<Packing>>(src, dst, width);
 }
 
 template <rgb_packing Packing, yuv_layout Layout>

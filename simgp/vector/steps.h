@@ -48,21 +48,70 @@ namespace simgp::SIMD_TARGET {
 // Steps
 // ------------------------------------------------------------------------------------------------
 
+// Calls step(x) for every Step of `count` >= Step samples. The last step ends at the last sample and
+// may do some again.
+template <int Step = bytes, class F>
+inline void whole_steps(ptrdiff_t count, F step) {
+    ptrdiff_t x = 0;
+    for (;;) {
+        // Nothing in here depends on where the row ends.
+        do {
+            step(x);
+            x += Step;
+        } while (x <= count - Step);
+        if (x == count) return;
+        x = count - Step;
+    }
+}
+
+// The same with step(x, pixels), for which load(x) is called one step ahead.
+template <class Load, class F>
+inline void whole_steps_ahead(ptrdiff_t count, Load load, F step) {
+    const ptrdiff_t last = count - bytes;
+    ptrdiff_t x = 0;
+    auto pixels = load(0);
+    if constexpr (moves_pointers) {
+        ptrdiff_t next = last < bytes ? last : bytes;
+        for (;;) {
+            // Nothing in here depends on where the row ends.
+            do {
+                const auto ahead = load(next);
+                step(x, pixels);
+                pixels = ahead;
+                x += bytes;
+                next += bytes;
+            } while (next <= last);
+            // The last pixels have been loaded and stored, or loaded, or neither.
+            if (x == count) return;
+            if (x > last) x = last;
+            next = last;
+        }
+    }
+    for (;;) {
+        const ptrdiff_t next = x + bytes <= last ? x + bytes : last;
+        const auto ahead = load(next);
+        step(x, pixels);
+        if (next == x) return;
+        x = next;
+        pixels = ahead;
+    }
+}
+
 // The same as row_of_steps below, by functions.
 template <bool PixelsInPairs, class Load, class Write, class Part>
 inline void row_of_steps(ptrdiff_t width, Load load, Write write, Part part) {
     const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
     if (whole < bytes) return part(0, int(width));
-    ptrdiff_t x = 0;
-    auto pixels = load(0);
-    for (;;) {
-        const ptrdiff_t next = x + 2 * bytes <= whole ? x + bytes : whole - bytes;
-        const auto ahead = load(next);
-        write(x, pixels);
-        if (next == x) break;
-        x = next;
-        pixels = ahead;
-    }
+    whole_steps_ahead(whole, load, write);
+    if (whole < width) part(whole, 1);
+}
+
+// The same where output lies over no samples: convert(x) loads and stores.
+template <bool PixelsInPairs, class Convert, class Part>
+inline void row_of_steps_apart(ptrdiff_t width, Convert convert, Part part) {
+    const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
+    if (whole < bytes) return part(0, int(width));
+    whole_steps(whole, convert);
     if (whole < width) part(whole, 1);
 }
 
@@ -88,30 +137,109 @@ inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
         [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
 }
 
+// The same where output lies over no samples. A Step has convert(in, out, x) for load and write.
+template <class Step, class In, class Out>
+inline void row_of_steps_apart(const In &in, const Out &out, ptrdiff_t width) {
+    row_of_steps_apart<Step::pixels_in_pairs>(
+        width, [&](ptrdiff_t x) { Step::convert(in, out, x); },
+        [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
+}
+
 // Samples in steps of `Step`: vector(x) does so many of them from x on, one(x) one. The last step
 // ends at the last sample and may do some again.
 template <int Step = bytes, class Vector, class One>
 inline void in_steps(ptrdiff_t count, Vector vector, One one) {
-    if (count < Step) {
+    if (count < Step)
         for (ptrdiff_t x = 0; x < count; x++) one(x);
-        return;
-    }
-    for (ptrdiff_t x = 0; x + Step < count; x += Step) vector(x);
-    vector(count - Step);
+    else
+        whole_steps<Step>(count, vector);
 }
 
-// Moves `pairs` >= 1 pairs in steps of a vector: whole(i) does `bytes` of them from pair i on,
-// half(i) half as many, one(i) one. The last step ends at the last pair and may do some again.
-template <class Whole, class Half, class One>
-inline void in_pair_steps(ptrdiff_t pairs, Whole whole, Half half, One one) {
+// Lines and what little is done to them
+// ------------------------------------------------------------------------------------------------
+
+// Where lines are read or written; a sample of each has so many bytes.
+template <class T, int... Sizes>
+struct lines {
+    T *p[sizeof...(Sizes)];
+};
+template <int... Sizes>
+using lines_in = lines<const uint8_t, Sizes...>;
+template <int... Sizes>
+using lines_out = lines<uint8_t, Sizes...>;
+
+// The same lines `count` samples further on.
+template <class T, int... Sizes>
+[[gnu::always_inline]] inline lines<T, Sizes...> further(lines<T, Sizes...> l, ptrdiff_t count) {
+    int k = 0;
+    ((l.p[k++] += Sizes * count), ...);
+    return l;
+}
+
+// store(out.p, load(in.p)) for every Step of `count` >= Step samples. The last step ends at the last
+// sample and may do some again; nothing may overlap. Where loads and stores move pointers, so many
+// steps are loaded at once, so that one need not wait for the other.
+template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, class Store>
+[[gnu::always_inline]] inline void move_steps(ptrdiff_t count, In in, Out out, Load load,
+                                              Store store) {
+    if constexpr (!moves_pointers) {
+        whole_steps<Step>(
+            count, [&](ptrdiff_t x) { store(further(out, x).p, load(further(in, x).p)); });
+        return;
+    }
+    const size_t all = size_t(count) / Step;
+    size_t steps = AtOnce == 2 ? all % 2 : all;
+    ptrdiff_t rest = ptrdiff_t(size_t(count) % Step);
+    if constexpr (AtOnce == 2)
+        for (size_t twice = all / 2; twice != 0; twice--) {
+            const auto a = load(in.p);
+            in = further(in, Step);
+            const auto b = load(in.p);
+            in = further(in, Step);
+            store(out.p, a);
+            out = further(out, Step);
+            store(out.p, b);
+            out = further(out, Step);
+        }
+    for (;;) {
+        for (; steps != 0; steps--) {
+            store(out.p, load(in.p));
+            in = further(in, Step);
+            out = further(out, Step);
+        }
+        if (rest == 0) return;
+        in = further(in, rest - Step);
+        out = further(out, rest - Step);
+        steps = 1;
+        rest = 0;
+    }
+}
+
+// The same of any number of samples; one(out.p, in.p) does one of those of less than a step.
+template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, class Store, class One>
+[[gnu::always_inline]] inline void move_line(ptrdiff_t count, In in, Out out, Load load,
+                                             Store store, One one) {
+    if (count < Step)
+        for (ptrdiff_t x = 0; x < count; x++) one(further(out, x).p, further(in, x).p);
+    else
+        move_steps<AtOnce, Step>(count, in, out, load, store);
+}
+
+// The same of `pairs` >= 1 pairs: half(out.p, in.p) does half a step of them, one(out.p, in.p) one.
+template <class In, class Out, class Load, class Store, class Half, class One>
+inline void move_pairs(ptrdiff_t pairs, In in, Out out, Load load, Store store, Half half,
+                       One one) {
+    const auto at = [&](ptrdiff_t i, const auto &f) { f(further(out, i).p, further(in, i).p); };
     if (pairs < bytes / 2) {
-        for (ptrdiff_t i = 0; i < pairs; i++) one(i);
+        for (ptrdiff_t i = 0; i < pairs; i++) at(i, one);
         return;
     }
     if (pairs < bytes) {
-        half(0);
-        return half(pairs - bytes / 2);
+        at(0, half);
+        return at(pairs - bytes / 2, half);
     }
+    if constexpr (moves_pointers) return move_steps<2>(pairs, in, out, load, store);
+    const auto whole = [&](ptrdiff_t i) { store(further(out, i).p, load(further(in, i).p)); };
     ptrdiff_t i = 0;
     for (; i + 2 * bytes <= pairs; i += 2 * bytes) {
         whole(i);
