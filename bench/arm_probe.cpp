@@ -65,7 +65,7 @@ CALL(call_unpack, unpack_row, a, d, e, n)
 CALL(call_dither, dither_row, a, b, c, d, n)
 CALL(call_any, any_to_rgb_row, to_rgb_how, a, b, c, d, n)
 CALL(call_any_pair, any_to_rgb_row_pair, to_rgb_how, a, a + second, b, c, d, d + second, n)
-CALL(call_any_to_yuv, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, e, f, n)
+CALL(call_any_to_yuv, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, e, f, n)
 CALL(call_chroma, chroma_row, to_yuv_how, channels_in, d, e, n)
 CALL(call_split_pixels, split_pixels_row, a, channels, n)
 CALL(call_repack, repack_row, order, a, d, n)
@@ -166,8 +166,8 @@ void list_any(const any_rows &n, const any_rows &s) {
                 s.to_rgb_pair[l][k], call_any_pair, 2);
         }
         for (size_t l = 0; l < size_t(chroma_out::count); l++)
-            add(named("any %s to %s, two", kinds[k], chroma_outs[l]), n.to_yuv[k][l],
-                s.to_yuv[k][l], call_any_to_yuv, 2);
+            add(named("any %s to %s", kinds[k], chroma_outs[l]), n.to_yuv[k][l], s.to_yuv[k][l],
+                call_any_to_yuv);
         for (size_t to = 0; to < size_t(pixel_kind::count); to++)
             add(named("any %s to %s", kinds[k], kinds[to]), n.repack[k][to], s.repack[k][to],
                 call_repack);

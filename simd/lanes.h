@@ -557,7 +557,7 @@ inline u16v even_dot(rgb_v v) {
 }
 // Factors that are known at run time, in the limits of the other two, of which these are the same
 // without D: (a c0 + b c1 + c c2) >> 8 of each pixel, for factors of 0 or more, and the sum of the
-// even pixels.
+// even pixels, for factors in -128 ... 127.
 struct channel_factors {
     int a, b, c;
 };
@@ -617,11 +617,15 @@ inline void exchange_888(uint8_t *p, const uint8_t *q) {
     for (int i = 0; i < 3 * bytes; i++) p[i] = q[i / 3 * 3 + 2 - i % 3];
 }
 
-// `bytes` pixels of four bytes at p, of which one has no weight, the first or the last.
+// Calls f(load), where load(p) loads `bytes` pixels of four bytes at p, of which one has no weight,
+// the first or the last.
 struct quads_v {
     const uint8_t *p;
 };
-inline quads_v load_quads(const uint8_t *p) { return {p}; }
+template <class F>
+inline void with_load_quads(bool, F f) {
+    f([](const uint8_t *p) { return quads_v{p}; });
+}
 struct quad_factors {
     int a, b, c, d;
     bool skips_first;

@@ -364,22 +364,27 @@ inline u16v even_dot(rgb_v v) {
     sum = add_product<B>(sum, evens(v.val[1]));
     return add_product<C>(sum, evens(v.val[2]));
 }
-// The same with factors that are known at run time.
+// The same with factors that are known at run time, each in all bytes. Those of the sum are signed;
+// of samples less 128 the products are signed as well, and the offset makes up for these.
 struct channel_factors {
-    int16_t a, b, c;
+    u8v a, b, c;
+    s16v offset;
 };
 inline channel_factors set_channel_factors(int a, int b, int c) {
-    return {static_cast<int16_t>(a), static_cast<int16_t>(b), static_cast<int16_t>(c)};
+    const auto all = [](int k) { return vdupq_n_u8(static_cast<uint8_t>(k)); };
+    return {all(a), all(b), all(c), vdupq_n_s16(static_cast<int16_t>(128 * (a + b + c)))};
 }
 inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    const u8v a = vdupq_n_u8(static_cast<uint8_t>(f.a)), b = vdupq_n_u8(static_cast<uint8_t>(f.b)),
-              c = vdupq_n_u8(static_cast<uint8_t>(f.c));
-    return vcombine_u8(vshrn_n_u16(dot_low(v, a, b, c), 8), vshrn_n_u16(dot_upper(v, a, b, c), 8));
+    return vcombine_u8(vshrn_n_u16(dot_low(v, f.a, f.b, f.c), 8),
+                       vshrn_n_u16(dot_upper(v, f.a, f.b, f.c), 8));
 }
 inline s16v even_dot(rgb_v v, const channel_factors &f) {
-    s16v sum = vmulq_n_s16(as_s16(even(v.val[0])), f.a);
-    sum = vmlaq_n_s16(sum, as_s16(even(v.val[1])), f.b);
-    return vmlaq_n_s16(sum, as_s16(even(v.val[2])), f.c);
+    const auto low = [](u8v k) { return vreinterpret_s8_u8(vget_low_u8(k)); };
+    const auto evens = [&](u8v c) {
+        return vreinterpret_s8_u8(vmovn_u16(as_u16(veorq_u8(c, vdupq_n_u8(128)))));
+    };
+    const s16v sum = vmlal_s8(f.offset, evens(v.val[0]), low(f.a));
+    return vmlal_s8(vmlal_s8(sum, evens(v.val[1]), low(f.b)), evens(v.val[2]), low(f.c));
 }
 
 struct channels_v {
@@ -450,32 +455,31 @@ inline void exchange_888(uint8_t *p, const uint8_t *q) {
     vst3q_u8(p, exchanged);
 }
 
-using quads_v = uint8x16x4_t;
-inline quads_v load_quads(const uint8_t *p) { return vld4q_u8(p); }
-inline rgb_v weighted(const quads_v &v, bool skips_first) {
-    return {{skips_first ? v.val[1] : v.val[0], skips_first ? v.val[2] : v.val[1],
-             skips_first ? v.val[3] : v.val[2]}};
+// A loop for each of the two kinds: the byte without a weight is left where it is.
+using quads_v = rgb_v;
+template <class F>
+[[gnu::always_inline]] inline void with_load_quads(bool skips_first, F f) {
+    if (skips_first)
+        f([](const uint8_t *p) { return load_8888<1>(p); });
+    else
+        f([](const uint8_t *p) { return load_8888<0>(p); });
 }
-struct quad_factors {
+struct quad_weights {
     channel_factors factors;
-    bool skips_first;
-};
-struct quad_weights : quad_factors {
     u8v d;
 };
-inline quad_weights set_quad_weights(bool skips_first, int a, int b, int c, int d) {
-    return {{set_channel_factors(a, b, c), skips_first}, set_u8(static_cast<uint8_t>(d))};
+inline quad_weights set_quad_weights(bool, int a, int b, int c, int d) {
+    return {set_channel_factors(a, b, c), set_u8(static_cast<uint8_t>(d))};
 }
 inline u8v dot_high(const quads_v &v, const quad_weights &w) {
-    return vaddq_u8(dot_high(weighted(v, w.skips_first), w.factors), w.d);
+    return vaddq_u8(dot_high(v, w.factors), w.d);
 }
-inline quad_factors set_quad_factors(bool skips_first, int a, int b, int c) {
-    return {set_channel_factors(a, b, c), skips_first};
+using quad_factors = channel_factors;
+inline quad_factors set_quad_factors(bool, int a, int b, int c) {
+    return set_channel_factors(a, b, c);
 }
 inline u8v even_dots_high(const quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const auto dot = [&](const quad_factors &k) {
-        return as_u16(sub_sat(c, even_dot(weighted(v, k.skips_first), k.factors)));
-    };
+    const auto dot = [&](const quad_factors &k) { return as_u16(sub_sat(c, even_dot(v, k))); };
     return join_high(dot(f), dot(g));
 }
 

@@ -80,6 +80,10 @@ struct quads_v {
 inline quads_v load_quads(const uint8_t *p) {
     return {{load(p), load(p + bytes), load(p + 2 * bytes), load(p + 3 * bytes)}};
 }
+template <class F>
+[[gnu::always_inline]] inline void with_load_quads(bool, F f) {
+    f([](const uint8_t *p) { return load_quads(p); });
+}
 inline u8v set_quad(bool skips_first, int a, int b, int c) {
     const auto byte = [](int k) { return uint32_t(static_cast<uint8_t>(k)); };
     const uint32_t all = byte(a) | byte(b) << 8 | byte(c) << 16;

@@ -308,12 +308,13 @@ struct any_yuv_matrix<pixel_kind::four> {
     }
 };
 
-template <pixel_kind Kind>
-inline auto load_pixels(const uint8_t *p) {
+// Calls f(load), where load(p) loads the pixels at p.
+template <pixel_kind Kind, class F>
+[[gnu::always_inline]] inline void with_load(const rgb_weights &w, F f) {
     if constexpr (Kind == pixel_kind::four)
-        return load_quads(p);
+        with_load_quads(w.alpha_first, f);
     else
-        return load_pixels<rgb_in(Kind)>(p);
+        f([](const uint8_t *p) { return load_pixels<rgb_in(Kind)>(p); });
 }
 
 // Less than a vector goes through the stack, by the row itself. A pixel has `size` bytes, and the
@@ -337,25 +338,56 @@ struct any_yuv_sizes {
     if (of.chroma_size == 1) copy_few(v + x / 2, to_v, samples);
 }
 
+// Whole steps of a line, luma alone, and with chroma.
+template <pixel_kind Kind>
+[[gnu::noinline]] static void any_luma_line(const rgb_weights &w, const uint8_t *src, uint8_t *y,
+                                            ptrdiff_t width) {
+    const any_yuv_matrix<Kind> m(w);
+    with_load<Kind>(w, [&](const auto &load) {
+        move_steps<2>(
+            width, lines_in<int(Kind) + 2>{{src}}, lines_out<1>{{y}},
+            [&](const uint8_t *const *p) { return load(p[0]); },
+            [&](uint8_t *const *q, const auto &p) { store(q[0], m.luma(p)); });
+    });
+}
+template <pixel_kind Kind, chroma_out Out>
+inline void any_yuv_line(const rgb_weights &w, const uint8_t *src, uint8_t *y, uint8_t *u,
+                         uint8_t *v, ptrdiff_t width) {
+    constexpr bool pairs = Out == chroma_out::pairs;
+    const any_yuv_matrix<Kind> m(w);
+    with_load<Kind>(w, [&](const auto &load) {
+        constexpr int chroma_size = pairs ? 2 : 1;
+        move_steps<1, bytes / 2>(
+            width / 2, lines_in<2 * (int(Kind) + 2)>{{src}},
+            lines_out<2, chroma_size, chroma_size>{{y, u, pairs ? u : v}},
+            [&](const uint8_t *const *p) { return load(p[0]); },
+            [&](uint8_t *const *q, const auto &p) {
+                store(q[0], m.luma(p));
+                if constexpr (pairs)
+                    store(q[1], m.chroma(p));
+                else
+                    store_split(q[1], q[2], m.chroma(p));
+            });
+    });
+}
+
 template <pixel_kind Kind, chroma_out Out>
 static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
                         uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     constexpr int size = int(Kind) + 2;
     constexpr int chroma_size = Out == chroma_out::none ? 0 : Out == chroma_out::pairs ? 2 : 1;
-    const any_yuv_matrix<Kind> m(w);
-    row_of_steps_apart<Out != chroma_out::none>(
-        width,
-        [&](ptrdiff_t x) {
-            const auto p = load_pixels<Kind>(src0 + size * x);
-            store(y0 + x, m.luma(p));
-            if constexpr (Out == chroma_out::half) store_split(u + x / 2, v + x / 2, m.chroma(p));
-            if constexpr (Out == chroma_out::pairs) store(u + x, m.chroma(p));
-            if (src1) store(y1 + x, m.luma(load_pixels<Kind>(src1 + size * x)));
-        },
-        [&](ptrdiff_t x, int count) {
-            any_yuv_part(any_yuv_row<Kind, Out>, {size, chroma_size}, w, src0, src1, y0, y1, u, v,
-                         x, count);
-        });
+    const ptrdiff_t whole = chroma_size ? width & ~ptrdiff_t(1) : width;
+    const auto part = [&](ptrdiff_t x, int count) {
+        any_yuv_part(any_yuv_row<Kind, Out>, {size, chroma_size}, w, src0, src1, y0, y1, u, v, x,
+                     count);
+    };
+    if (whole < bytes) return part(0, int(width));
+    if constexpr (chroma_size)
+        any_yuv_line<Kind, Out>(w, src0, y0, u, v, whole);
+    else
+        any_luma_line<Kind>(w, src0, y0, whole);
+    if (src1) any_luma_line<Kind>(w, src1, y1, whole);
+    if (whole < width) part(whole, 1);
 }
 
 static void any_chroma_row(const rgb_weights &w, const uint8_t *const channels[3], uint8_t *u,

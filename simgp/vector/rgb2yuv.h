@@ -62,75 +62,65 @@ struct yuv_row_sizes {
     if (of.chroma_size == 1) copy_few(out.v + x / 2, v, chroma);
 }
 
-template <rgb_packing Packing, yuv_layout Layout>
-static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width);
-template <rgb_packing Packing>
-static void to_rgb565_row(const uint8_t *src, uint8_t *dst, ptrdiff_t width);
-
 // Chroma goes to plane u in samples or pairs of `chroma_size` bytes, and to plane v where there are
 // samples.
 template <rgb_packing Packing, yuv_layout Layout>
-struct rgb_to_yuv_step {
+static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     using from = unpacker<Packing>;
     using matrix = rgb_matrix<from::blue_first>;
-    static constexpr bool pixels_in_pairs = Layout != yuv_layout::grey;
-    static constexpr bool planar = Layout == yuv_layout::half;
-    static constexpr int chroma_size = planar ? 1 : 2;
-
-    static void convert(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x) {
-        const rgb_v p = from::load(in + from::size * x);
-        store(out.y + x, matrix::luma(p));
-        if constexpr (Layout == yuv_layout::grey) return;
-        const u16v u = matrix::u(p), v = matrix::v(p);
-        uint8_t *at = out.u + chroma_size * (x / 2);
-        if constexpr (planar) {
-            store_high(at, u);
-            store_high(out.v + x / 2, v);
-        } else {
-            store(at, Layout == yuv_layout::uv ? join_high(u, v) : join_high(v, u));
-        }
-    }
-    static void part(const uint8_t *in, const yuv_row_out &out, ptrdiff_t x, int count) {
-        part_to_yuv(to_yuv_row<Packing, Layout>, {from::size, pixels_in_pairs ? chroma_size : 0},
-                    in, out, x, count);
-    }
-};
-
-[[gnu::noinline]] static void part_to_rgb565(rgb_to_rgb_row *row, int size, const uint8_t *in,
-                                             uint8_t *out, ptrdiff_t x, int count) {
-    uint8_t pixels[bytes * 4], words[2 * bytes];
-    stage_few(pixels, size, in + size * x, count, size);
-    row(pixels, words, bytes);
-    copy_few(out + 2 * x, words, 2 * ptrdiff_t(count));
+    constexpr bool grey = Layout == yuv_layout::grey, planar = Layout == yuv_layout::half;
+    constexpr int chroma_size = planar ? 1 : 2;
+    const auto part = [&](ptrdiff_t x, int count) {
+        part_to_yuv(to_yuv_row<Packing, Layout>, {from::size, grey ? 0 : chroma_size}, src,
+                    {y, u, v}, x, count);
+    };
+    const ptrdiff_t whole = grey ? width : width & ~ptrdiff_t(1);
+    if (whole < bytes) return part(0, int(width));
+    const auto load = [](const uint8_t *const *p) { return from::load(p[0]); };
+    if constexpr (grey)
+        move_steps<2>(width, lines_in<from::size>{{src}}, lines_out<1>{{y}}, load,
+                      [](uint8_t *const *q, const rgb_v &p) { store(q[0], matrix::luma(p)); });
+    else
+        move_steps<1, bytes / 2>(whole / 2, lines_in<2 * from::size>{{src}},
+                                 lines_out<2, chroma_size, chroma_size>{{y, u, planar ? v : u}},
+                                 load, [](uint8_t *const *q, const rgb_v &p) {
+                                     store(q[0], matrix::luma(p));
+                                     const u16v of_u = matrix::u(p), of_v = matrix::v(p);
+                                     if constexpr (planar) {
+                                         store_high(q[1], of_u);
+                                         store_high(q[2], of_v);
+                                     } else {
+                                         constexpr bool uv = Layout == yuv_layout::uv;
+                                         store(q[1], uv ? join_high(of_u, of_v)
+                                                        : join_high(of_v, of_u));
+                                     }
+                                 });
+    if (whole < width) part(whole, 1);
 }
 
-template <rgb_packing Packing>
-struct rgb_to_rgb565_step {
-    static constexpr bool pixels_in_pairs = false;
-    static constexpr pixel_bytes at = pixels_of[size_t(Packing)];
-    static constexpr int size = at.size;
-    static constexpr bool four_bytes = size == 4;
-    static_assert(size >= 3 && at.r == 0 && at.g == 1 && at.b == 2);
-
-    static void convert(const uint8_t *in, uint8_t *out, ptrdiff_t x) {
-        if constexpr (four_bytes)
-            repack_8888_to_565(out + 2 * x, in + size * x);
-        else
-            repack_888_to_565(out + 2 * x, in + size * x);
-    }
-    static void part(const uint8_t *in, uint8_t *out, ptrdiff_t x, int count) {
-        part_to_rgb565(to_rgb565_row<Packing>, size, in, out, x, count);
-    }
-};
-
-template <rgb_packing Packing, yuv_layout Layout>
-static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    row_of_steps_apart<rgb_to_yuv_step<Packing, Layout>>(src, yuv_row_out{y, u, v}, width);
+[[gnu::noinline]] static void part_to_rgb565(rgb_to_rgb_row *row, int size, const uint8_t *in,
+                                             uint8_t *out, int count) {
+    uint8_t pixels[bytes * 4], words[2 * bytes];
+    stage_few(pixels, size, in, count, size);
+    row(pixels, words, bytes);
+    copy_few(out, words, 2 * ptrdiff_t(count));
 }
 
 template <rgb_packing Packing>
 static void to_rgb565_row(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
-    row_of_steps_apart<rgb_to_rgb565_step<Packing>>(src, dst, width);
+    constexpr pixel_bytes at = pixels_of[size_t(Packing)];
+    static_assert(at.size >= 3 && at.r == 0 && at.g == 1 && at.b == 2);
+    if (width < bytes)
+        return part_to_rgb565(to_rgb565_row<Packing>, at.size, src, dst, int(width));
+    move_steps(
+        width, lines_in<at.size>{{src}}, lines_out<2>{{dst}},
+        [](const uint8_t *const *p) { return p[0]; },
+        [](uint8_t *const *q, const uint8_t *p) {
+            if constexpr (at.size == 4)
+                repack_8888_to_565(q[0], p);
+            else
+                repack_888_to_565(q[0], p);
+        });
 }
 
 template <rgb_packing Packing, yuv_layout Layout>

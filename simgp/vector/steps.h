@@ -106,15 +106,6 @@ inline void row_of_steps(ptrdiff_t width, Load load, Write write, Part part) {
     if (whole < width) part(whole, 1);
 }
 
-// The same where output lies over no samples: convert(x) loads and stores.
-template <bool PixelsInPairs, class Convert, class Part>
-inline void row_of_steps_apart(ptrdiff_t width, Convert convert, Part part) {
-    const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
-    if (whole < bytes) return part(0, int(width));
-    whole_steps(whole, convert);
-    if (whole < width) part(whole, 1);
-}
-
 // A Step converts `bytes` pixels at a time:
 //   pixels_in_pairs         whether a step must begin at an even pixel
 //   load(in, x)             the samples of pixels x ... x + bytes - 1
@@ -134,14 +125,6 @@ inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
     row_of_steps<Step::pixels_in_pairs>(
         width, [&](ptrdiff_t x) { return Step::load(in, x); },
         [&](ptrdiff_t x, const auto &pixels) { Step::write(out, x, pixels); },
-        [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
-}
-
-// The same where output lies over no samples. A Step has convert(in, out, x) for load and write.
-template <class Step, class In, class Out>
-inline void row_of_steps_apart(const In &in, const Out &out, ptrdiff_t width) {
-    row_of_steps_apart<Step::pixels_in_pairs>(
-        width, [&](ptrdiff_t x) { Step::convert(in, out, x); },
         [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
 }
 
