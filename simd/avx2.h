@@ -19,6 +19,8 @@ inline constexpr bool moves_pointers = false;
 using u8v = __m256i;
 using u16v = __m256i;
 using s16v = __m256i;
+using pairs_v = u8v;
+using pair_bytes = u16v;
 
 inline u8v as_u8(u16v v) { return v; }
 inline u16v as_u16(u8v v) { return v; }

@@ -212,14 +212,6 @@ inline s16v mul_round(s16v a, s16v b) {
 inline u16v avg_u16(u16v a, u16v b) {
     return make<u16v>([&](int i) { return (a.lane[i] + b.lane[i] + 1) >> 1; });
 }
-// floor(k v / 2), with a factor that is known at run time; k is 0 ... 511, lanes are 0 ... 255.
-struct half_factor {
-    int k;
-};
-inline half_factor set_half_factor(int k) { return {k}; }
-inline u16v half_product(u16v v, half_factor k) {
-    return make<u16v>([&](int i) { return k.k * v.lane[i] >> 1; });
-}
 
 // Sums and differences of bytes, saturating.
 inline u8v add_sat_u8(u8v a, u8v b) {
@@ -298,37 +290,6 @@ inline u16v sum_pairs(u16v low, u16v high) {
     });
 }
 
-// A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the
-// same sign, and A + B is at most 255 in size.
-template <int A, int B, int C>
-inline s16v pair_dot(u8v v) {
-    static_assert(limits::centred_pair<A, B>);
-    return make<s16v>([&](int i) {
-        return int16_t(A * (v.lane[2 * i] - 128) + B * (v.lane[2 * i + 1] - 128) + C);
-    });
-}
-// floor(K high byte / 2) + C of each byte pair, kept to 16 bits; K is 0 ... 511. And the same of
-// the low byte.
-template <int K, int C>
-inline s16v half_product_high(u8v v) {
-    static_assert(limits::half_factor<K>);
-    return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i + 1] >> 1) + C); });
-}
-template <int K, int C>
-inline s16v half_product_low(u8v v) {
-    static_assert(limits::half_factor<K>);
-    return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i] >> 1) + C); });
-}
-// 256 (low byte - 128) of each byte pair.
-inline s16v low_minus_128_shl8(u8v v) {
-    return make<s16v>([&](int i) { return 256 * (v.lane[2 * i] - 128); });
-}
-
-// The same of the high byte.
-inline s16v high_minus_128_shl8(u8v v) {
-    return make<s16v>([&](int i) { return 256 * (v.lane[2 * i + 1] - 128); });
-}
-
 // Byte pairs: lane i of even and odd is byte 2i and 2i + 1.
 inline u16v even(u8v v) {
     return make<u16v>([&](int i) { return v.lane[2 * i]; });
@@ -340,6 +301,61 @@ inline u16v odd(u8v v) {
 inline u8v join(u16v even, u16v odd) {
     return make<u8v>([&](int i) { return (i & 1 ? odd : even).lane[i / 2]; });
 }
+// Byte pairs that are only taken apart, and one byte of each pair: a layer may have them in what form
+// it likes. Loads from `bytes` bytes, or from bytes / 2 at p, the even ones, and as many at q.
+using pairs_v = u8v;
+using pair_bytes = u16v;
+inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
+inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+// The even bytes of u and v as pairs, and the odd ones.
+inline pairs_v pair_evens(pairs_v u, pairs_v v) {
+    return make<u8v>([&](int i) { return (i & 1 ? v : u).lane[i / 2 * 2]; });
+}
+inline pairs_v pair_odds(pairs_v u, pairs_v v) {
+    return make<u8v>([&](int i) { return (i & 1 ? v : u).lane[i / 2 * 2 + 1]; });
+}
+// Factors of 0 ... 255 that are known at run time, and products; their low 16 bits, unsigned.
+inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+// floor(k v / 2), with a factor that is known at run time; k is 0 ... 511.
+struct half_factor {
+    int k;
+};
+inline half_factor set_half_factor(int k) { return {k}; }
+inline u16v half_product(pair_bytes v, half_factor k) {
+    return make<u16v>([&](int i) { return k.k * v.lane[i] >> 1; });
+}
+
+// A (low byte - 128) + B (high byte - 128) + C of each byte pair, kept to 16 bits. A and B have the
+// same sign, and A + B is at most 255 in size.
+template <int A, int B, int C>
+inline s16v pair_dot(pairs_v v) {
+    static_assert(limits::centred_pair<A, B>);
+    return make<s16v>([&](int i) {
+        return int16_t(A * (v.lane[2 * i] - 128) + B * (v.lane[2 * i + 1] - 128) + C);
+    });
+}
+// floor(K high byte / 2) + C of each byte pair, kept to 16 bits; K is 0 ... 511. And the same of
+// the low byte.
+template <int K, int C>
+inline s16v half_product_high(pairs_v v) {
+    static_assert(limits::half_factor<K>);
+    return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i + 1] >> 1) + C); });
+}
+template <int K, int C>
+inline s16v half_product_low(pairs_v v) {
+    static_assert(limits::half_factor<K>);
+    return make<s16v>([&](int i) { return int16_t((K * v.lane[2 * i] >> 1) + C); });
+}
+// 256 (low byte - 128) of each byte pair.
+inline s16v low_minus_128_shl8(pairs_v v) {
+    return make<s16v>([&](int i) { return 256 * (v.lane[2 * i] - 128); });
+}
+
+// The same of the high byte.
+inline s16v high_minus_128_shl8(pairs_v v) {
+    return make<s16v>([&](int i) { return 256 * (v.lane[2 * i + 1] - 128); });
+}
+
 // Byte 2i = clamp(even lane i >> N), byte 2i + 1 = clamp(odd lane i >> N), to 0 ... 255; N is
 // 1 ... 8.
 template <int N>
@@ -461,6 +477,25 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
         q[i] = v.lane[2 * i + 1];
     }
 }
+
+// Groups of four bytes, which begin with luma: its pairs and those of chroma, in the same orders; and
+// those of groups that begin with chroma.
+struct luma_chroma {
+    pairs_v y, pairs;
+};
+inline luma_chroma load_groups(const uint8_t *p) {
+    const pair_u8 v = load_split(p);
+    return {v.even, v.odd};
+}
+inline luma_chroma load_groups_natural(const uint8_t *p) {
+    const pair_u8 v = load_split_natural(p);
+    return {v.even, v.odd};
+}
+inline luma_chroma load_groups_by4(const uint8_t *p) {
+    const pair_u8 v = load_split_by4(p);
+    return {v.even, v.odd};
+}
+inline luma_chroma exchanged(const luma_chroma &v) { return {v.pairs, v.y}; }
 
 // Stores of 2, 3 and 4 vectors: the bytes of two vectors in by8 order, in turn; the words of the
 // even and the odd pixels in by8 order, in turn; the bytes of three vectors in natural order, in

@@ -94,15 +94,6 @@ inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
 inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 inline u16v avg_u16(u16v a, u16v b) { return vrhaddq_u16(a, b); }
-struct half_factor {
-    u16v half, odd;  // of an odd factor the bits of v
-};
-inline half_factor set_half_factor(int k) {
-    return {vdupq_n_u16(static_cast<uint16_t>(k >> 1)), vdupq_n_u16(k & 1 ? 255 : 0)};
-}
-inline u16v half_product(u16v v, half_factor k) {
-    return vsraq_n_u16(vmulq_u16(v, k.half), vandq_u16(v, k.odd), 1);
-}
 inline s16v mul_round(s16v a, s16v b) { return vqrdmulhq_s16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
@@ -162,36 +153,67 @@ inline u16v sum_pairs(u16v low, u16v high) {
     return vaddq_u16(v.val[0], vshlq_n_u16(v.val[1], __builtin_ctz(B)));
 }
 
-// The offsets of 128 go into the constant, and the products are accumulated on it.
-template <int A, int B, int C>
-inline s16v pair_dot(u8v v) {
-    static_assert(limits::centred_pair<A, B>);
-    s16v sum = vdupq_n_s16(static_cast<int16_t>(C - 128 * (A + B)));
-    if constexpr (A != 0) sum = vmlaq_n_s16(sum, as_s16(even(v)), A);
-    if constexpr (B != 0) sum = vmlaq_n_s16(sum, as_s16(odd(v)), B);
+// Byte pairs lie apart in 64-bit registers, as loads of structures leave them and as products of
+// bytes want them: such a product is one instruction of one cycle where that of 16-bit lanes often
+// takes two, and no byte has to be widened before.
+struct pairs_v {
+    uint8x8_t even, odd;
+};
+using pair_bytes = uint8x8_t;
+inline pairs_v load_pairs(const uint8_t *p) {
+    const uint8x8x2_t v = vld2_u8(p);
+    return {v.val[0], v.val[1]};
+}
+inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return {vld1_u8(p), vld1_u8(q)}; }
+inline pairs_v pair_evens(pairs_v u, pairs_v v) { return {u.even, v.even}; }
+inline pairs_v pair_odds(pairs_v u, pairs_v v) { return {u.odd, v.odd}; }
+inline pair_bytes even(pairs_v v) { return v.even; }
+inline pair_bytes odd(pairs_v v) { return v.odd; }
+inline pair_bytes set_pair_bytes(int k) { return vdup_n_u8(static_cast<uint8_t>(k)); }
+inline u16v mul(pair_bytes a, pair_bytes b) { return vmull_u8(a, b); }
+// floor(k v / 2) = (k >> 1) v + (k & 1) (v >> 1)
+struct half_factor {
+    uint8x8_t half, odd;
+};
+inline half_factor set_half_factor(int k) {
+    return {vdup_n_u8(static_cast<uint8_t>(k >> 1)), vdup_n_u8(k & 1)};
+}
+inline u16v half_product(pair_bytes v, half_factor k) {
+    return vmlal_u8(vmull_u8(v, k.half), vshr_n_u8(v, 1), k.odd);
+}
+
+template <int K>
+inline u16v add_product(u16v sum, uint8x8_t x) {
+    if constexpr (K > 0) return vmlal_u8(sum, x, vdup_n_u8(K));
+    if constexpr (K < 0) return vmlsl_u8(sum, x, vdup_n_u8(-K));
     return sum;
 }
-template <int K, int C>
-inline s16v half_product(u16v v) {
-    const u16v sum = vmlaq_n_u16(vdupq_n_u16(static_cast<uint16_t>(C)), v, K / 2);
-    return as_s16(K & 1 ? vsraq_n_u16(sum, v, 1) : sum);
+// The offsets of 128 go into the constant, and the products are accumulated on it.
+template <int A, int B, int C>
+inline s16v pair_dot(pairs_v v) {
+    static_assert(limits::centred_pair<A, B>);
+    const u16v c = vdupq_n_u16(static_cast<uint16_t>(C - 128 * (A + B)));
+    return as_s16(add_product<B>(add_product<A>(c, v.even), v.odd));
 }
 template <int K, int C>
-inline s16v half_product_high(u8v v) {
+inline s16v half_product(uint8x8_t v) {
     static_assert(limits::half_factor<K>);
-    return half_product<K, C>(odd(v));
+    const u16v sum = add_product<K / 2>(vdupq_n_u16(static_cast<uint16_t>(C)), v);
+    return as_s16(K & 1 ? vaddw_u8(sum, vshr_n_u8(v, 1)) : sum);
 }
 template <int K, int C>
-inline s16v half_product_low(u8v v) {
-    static_assert(limits::half_factor<K>);
-    return half_product<K, C>(even(v));
+inline s16v half_product_high(pairs_v v) {
+    return half_product<K, C>(v.odd);
 }
-inline s16v low_minus_128_shl8(u8v v) {
-    return as_s16(veorq_u16(vshlq_n_u16(as_u16(v), 8), vdupq_n_u16(0x8000)));
+template <int K, int C>
+inline s16v half_product_low(pairs_v v) {
+    return half_product<K, C>(v.even);
 }
-inline s16v high_minus_128_shl8(u8v v) {
-    return as_s16(veorq_u16(vandq_u16(as_u16(v), vdupq_n_u16(0xFF00)), vdupq_n_u16(0x8000)));
+inline s16v minus_128_shl8(uint8x8_t v) {
+    return as_s16(veorq_u16(vshll_n_u8(v, 8), vdupq_n_u16(0x8000)));
 }
+inline s16v low_minus_128_shl8(pairs_v v) { return minus_128_shl8(v.even); }
+inline s16v high_minus_128_shl8(pairs_v v) { return minus_128_shl8(v.odd); }
 
 template <int N>
 inline u8v narrow_join(s16v even, s16v odd) {
@@ -267,6 +289,8 @@ inline u16v pack565(s16v hi, s16v mid, s16v lo) {
 inline u8v natural_to_by8(u8v v) { return v; }
 inline u8v natural_to_by4(u8v v) { return v; }
 inline u8v by8_to_natural(u8v v) { return v; }
+inline pairs_v natural_to_by8(pairs_v v) { return v; }
+inline pairs_v natural_to_by4(pairs_v v) { return v; }
 
 struct pair_u8 {
     u8v even, odd;
@@ -281,6 +305,19 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
 }
 inline pair_u8 load_split_natural(const uint8_t *p) { return load_split(p); }
 inline pair_u8 load_split_by4(const uint8_t *p) { return load_split(p); }
+// GCC keeps structures in memory that are copied as parts of others: hence one register at a time.
+struct luma_chroma {
+    pairs_v y, pairs;
+};
+inline luma_chroma load_groups(const uint8_t *p) {
+    const uint8x8x4_t v = vld4_u8(p);
+    return {{v.val[0], v.val[2]}, {v.val[1], v.val[3]}};
+}
+inline luma_chroma load_groups_natural(const uint8_t *p) { return load_groups(p); }
+inline luma_chroma load_groups_by4(const uint8_t *p) { return load_groups(p); }
+inline luma_chroma exchanged(const luma_chroma &v) {
+    return {{v.pairs.even, v.pairs.odd}, {v.y.even, v.y.odd}};
+}
 
 // Some compilers have macros for stores of several vectors, which take no braces: hence the names.
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
@@ -326,12 +363,6 @@ inline rgb_v load_8888(const uint8_t *p) {
     return {{v.val[First], v.val[First + 1], v.val[First + 2]}};
 }
 
-template <int K>
-inline u16v add_product(u16v sum, uint8x8_t x) {
-    if constexpr (K > 0) return vmlal_u8(sum, x, vdup_n_u8(K));
-    if constexpr (K < 0) return vmlsl_u8(sum, x, vdup_n_u8(-K));
-    return sum;
-}
 // Dot products of the low and of the high half, by factors that are the same in all lanes. 64-bit
 // ARM multiplies high halves where they lie.
 inline u16v dot_low(rgb_v v, u8v a, u8v b, u8v c) {

@@ -12,6 +12,23 @@
 
 namespace simgp::SIMD_TARGET {
 
+// Byte pairs are best left in vectors.
+inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
+inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+inline pairs_v pair_evens(pairs_v u, pairs_v v) { return join(even(u), even(v)); }
+inline pairs_v pair_odds(pairs_v u, pairs_v v) { return join(odd(u), odd(v)); }
+inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+struct luma_chroma {
+    pairs_v y, pairs;
+};
+inline luma_chroma groups_of(const pair_u8 &v) { return {v.even, v.odd}; }
+inline luma_chroma load_groups(const uint8_t *p) { return groups_of(load_split(p)); }
+inline luma_chroma load_groups_natural(const uint8_t *p) {
+    return groups_of(load_split_natural(p));
+}
+inline luma_chroma load_groups_by4(const uint8_t *p) { return groups_of(load_split_by4(p)); }
+inline luma_chroma exchanged(const luma_chroma &v) { return {v.pairs, v.y}; }
+
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline u16v dot(u8v ac, u16v b) {
@@ -65,12 +82,12 @@ inline channels_v channels_of(rgb_v v) {
 
 // A shuffle is the same code for all orders.
 template <class F>
-[[gnu::always_inline]] inline void with_widen_moves(bool exchanged, bool to_alpha_first, F f) {
-    f(set_widen_moves(exchanged, to_alpha_first));
+[[gnu::always_inline]] inline void with_widen_moves(bool swap, bool to_alpha_first, F f) {
+    f(set_widen_moves(swap, to_alpha_first));
 }
 template <class F>
-[[gnu::always_inline]] inline void with_narrow_moves(bool exchanged, bool from_alpha_first, F f) {
-    f(set_narrow_moves(exchanged, from_alpha_first));
+[[gnu::always_inline]] inline void with_narrow_moves(bool swap, bool from_alpha_first, F f) {
+    f(set_narrow_moves(swap, from_alpha_first));
 }
 
 // Pixels of four bytes, a vector's worth of each quarter of what is read.

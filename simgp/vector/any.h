@@ -49,38 +49,37 @@ struct any_order {
 };
 
 struct any_matrix {
-    u16v luma, green_u, green_v, blue1;
+    pair_bytes luma, green_u, green_v, blue1;
     half_factor red, blue2;
     s16v luma_c, red_c, green_c, blue1_c, blue2_c;
     any_order order;
 
     static s16v constant(int c) { return as_s16(set_u16(static_cast<uint16_t>(c))); }
-    static u16v factor(int k) { return set_u16(static_cast<uint16_t>(k)); }
 
     explicit any_matrix(const yuv_to_rgb &how) {
         const yuv_weights &w = how.weights;
         const int offset = w.black ? 3248 : 0, bias = offset + 64;
         const int of_blue1 = w.blue / 4 * 2, of_blue2 = w.blue - of_blue1;
-        luma = factor(w.luma / 2);
+        luma = set_pair_bytes(w.luma / 2);
         luma_c = constant(-w.luma / 2 * w.black - offset);
         red = set_half_factor(w.red);
         red_c = constant(bias - 64 * w.red);
-        green_u = factor(w.green_u);
-        green_v = factor(w.green_v);
+        green_u = set_pair_bytes(w.green_u);
+        green_v = set_pair_bytes(w.green_v);
         green_c = constant(bias + 64 * (w.green_u + w.green_v));
-        blue1 = factor(of_blue1 / 2);
+        blue1 = set_pair_bytes(of_blue1 / 2);
         blue1_c = constant(-64 * of_blue1);
         blue2 = set_half_factor(of_blue2);
         blue2_c = constant(bias - 64 * of_blue2);
         order = {how.blue_first, how.alpha_first};
     }
 
-    any_terms terms(u16v u, u16v v) const {
+    any_terms terms(pair_bytes u, pair_bytes v) const {
         return {add(as_s16(half_product(v, red)), red_c),
                 sub(green_c, as_s16(avg_u16(mul(u, green_u), mul(v, green_v)))),
                 add(as_s16(mul(u, blue1)), blue1_c), add(as_s16(half_product(u, blue2)), blue2_c)};
     }
-    any_rgb apply(u16v y, const any_terms &c) const {
+    any_rgb apply(pair_bytes y, const any_terms &c) const {
         const s16v l = add(as_s16(mul(y, luma)), luma_c);
         return {add_sat(l, c.r), add_sat(l, c.g), add_sat(add_sat(l, c.b1), c.b2)};
     }
@@ -127,7 +126,7 @@ struct any_packer<pixel_kind::four> {
 
 // Chroma of the even and of the odd pixels; the same where they share it.
 struct any_chroma {
-    u16v u, v;
+    pair_bytes u, v;
 };
 
 template <chroma_in>
@@ -135,18 +134,18 @@ struct any_source;
 template <>
 struct any_source<chroma_in::half> : source<yuv_layout::half> {
     explicit any_source(const yuv_to_rgb &) {}
-    static any_chroma chroma(u8v pairs) { return {even(pairs), odd(pairs)}; }
+    static any_chroma chroma(pairs_v pairs) { return {even(pairs), odd(pairs)}; }
 };
 template <>
 struct any_source<chroma_in::full> : source<yuv_layout::full> {
     explicit any_source(const yuv_to_rgb &) {}
-    static any_chroma chroma(u8v pairs) { return {even(pairs), odd(pairs)}; }
+    static any_chroma chroma(pairs_v pairs) { return {even(pairs), odd(pairs)}; }
 };
 template <>
 struct any_source<chroma_in::pairs> : source<yuv_layout::uv> {
     bool v_first;
     explicit any_source(const yuv_to_rgb &how) : v_first(how.v_first) {}
-    any_chroma chroma(u8v from) const {
+    any_chroma chroma(pairs_v from) const {
         any_chroma c{even(from), odd(from)};
         if (v_first) c = {c.v, c.u};
         return c;
@@ -157,12 +156,12 @@ struct any_source<chroma_in::groups> {
     static constexpr bool pixels_in_pairs = true;
     bool luma_first;
     explicit any_source(const yuv_to_rgb &how) : luma_first(how.luma_first) {}
-    static any_chroma chroma(u8v pairs) { return {even(pairs), odd(pairs)}; }
+    static any_chroma chroma(pairs_v pairs) { return {even(pairs), odd(pairs)}; }
 
     template <pixel_order Order>
     yuv_half load(const samples &s, ptrdiff_t x) const {
-        yuv_half p = source<yuv_layout::yuyv>::load<Order>(s, x);
-        if (!luma_first) p = {p.pairs, p.y};
+        luma_chroma p = load_groups_for<Order>(s.y + 2 * x);
+        if (!luma_first) p = exchanged(p);
         return p;
     }
     samples stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
@@ -195,7 +194,7 @@ static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, c
         to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.order);
     };
     const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
-        const auto half = [&](u16v luma, u8v pairs) {
+        const auto half = [&](pair_bytes luma, pairs_v pairs) {
             return m.apply(luma, m.terms(even(pairs), odd(pairs)));
         };
         to::store(dst + x * to::size, half(even(p.y), p.pairs_even), half(odd(p.y), p.pairs_odd),
@@ -229,7 +228,7 @@ static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t
     using to = any_packer<Kind>;
     struct pixels_pair {
         yuv_half first;
-        u8v second_y;
+        pairs_v second_y;
     };
     const any_matrix m(how);
     const any_source<In> from(how);

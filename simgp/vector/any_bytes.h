@@ -226,7 +226,9 @@ static void groups_to_420(const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
     move_line<2, groups_of_step>(
         pairs, lines_in<4, 4>{{src0, src1}},
         lines_out<2, 2, chroma_size, chroma_size>{{y0, y1, u, Pairs ? u : v}},
-        [](const uint8_t *const *p) { return two_lines{load_split(p[0]), load_split(p[1])}; },
+        [](const uint8_t *const *p) {
+            return two_lines{load_split(p[0]), load_split(p[1])};
+        },
         [](uint8_t *const *q, const two_lines &p) {
             const u8v chroma = by8_to_natural(LumaFirst ? p.first.odd : p.first.even);
             store(q[0], by8_to_natural(LumaFirst ? p.first.even : p.first.odd));

@@ -57,11 +57,11 @@ struct matrix_s7 {
     static constexpr int luma_128 = LUMA * (128 - 16) - offset;
 
     // The luma terms of the even and of the odd pixels.
-    static s16v luma_even(u8v y) { return pair_dot<LUMA, 0, luma_128>(y); }
-    static s16v luma_odd(u8v y) { return pair_dot<0, LUMA, luma_128>(y); }
+    static s16v luma_even(pairs_v y) { return pair_dot<LUMA, 0, luma_128>(y); }
+    static s16v luma_odd(pairs_v y) { return pair_dot<0, LUMA, luma_128>(y); }
 
     template <pair_order Order>
-    static chroma_terms chroma(u8v pairs) {
+    static chroma_terms chroma(pairs_v pairs) {
         constexpr bool uv = Order == pair_order::uv;
         chroma_terms t;
         t.r = uv ? half_product_high<RED, chroma_bias - 64 * RED>(pairs)

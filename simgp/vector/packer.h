@@ -13,8 +13,8 @@ namespace simgp::SIMD_TARGET {
 enum class pixel_order { natural, by8, by4 };
 
 // Brings samples from natural order into the order of a packer.
-template <pixel_order Order>
-inline u8v arrange(u8v v) {
+template <pixel_order Order, class V>
+inline V arrange(V v) {
     return Order == pixel_order::by8   ? natural_to_by8(v)
            : Order == pixel_order::by4 ? natural_to_by4(v)
                                        : v;

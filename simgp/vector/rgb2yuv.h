@@ -91,8 +91,8 @@ static void to_yuv_row(const uint8_t *src, uint8_t *y, uint8_t *u, uint8_t *v, p
                                          store_high(q[2], of_v);
                                      } else {
                                          constexpr bool uv = Layout == yuv_layout::uv;
-                                         store(q[1], uv ? join_high(of_u, of_v)
-                                                        : join_high(of_v, of_u));
+                                         store(q[1],
+                                               uv ? join_high(of_u, of_v) : join_high(of_v, of_u));
                                      }
                                  });
     if (whole < width) part(whole, 1);
@@ -110,8 +110,7 @@ template <rgb_packing Packing>
 static void to_rgb565_row(const uint8_t *src, uint8_t *dst, ptrdiff_t width) {
     constexpr pixel_bytes at = pixels_of[size_t(Packing)];
     static_assert(at.size >= 3 && at.r == 0 && at.g == 1 && at.b == 2);
-    if (width < bytes)
-        return part_to_rgb565(to_rgb565_row<Packing>, at.size, src, dst, int(width));
+    if (width < bytes) return part_to_rgb565(to_rgb565_row<Packing>, at.size, src, dst, int(width));
     move_steps(
         width, lines_in<at.size>{{src}}, lines_out<2>{{dst}},
         [](const uint8_t *const *p) { return p[0]; },

@@ -1,7 +1,7 @@
 // Sources: how the samples of a span of pixels are read.
 //
 // A source loads the samples of `bytes` pixels, in the order of pixels that the packer wants: luma
-// as one vector, chroma as byte pairs, one pair for two pixels or, with full chroma, a vector of
+// as byte pairs, chroma as byte pairs, one pair for two pixels or, with full chroma, a vector of
 // pairs for the even pixels and one for the odd.
 #ifndef SIMGP_VECTOR_SOURCE_H
 #define SIMGP_VECTOR_SOURCE_H
@@ -24,15 +24,13 @@ struct staged {
 };
 
 template <pixel_order Order>
-inline u8v load_luma(const uint8_t *y, ptrdiff_t x) {
-    return arrange<Order>(load(y + x));
+inline pairs_v load_luma(const uint8_t *y, ptrdiff_t x) {
+    return arrange<Order>(load_pairs(y + x));
 }
 
-struct yuv_half {
-    u8v y, pairs;
-};
+using yuv_half = luma_chroma;
 struct yuv_full {
-    u8v y, pairs_even, pairs_odd;
+    pairs_v y, pairs_even, pairs_odd;
 };
 
 template <yuv_layout>
@@ -45,7 +43,8 @@ struct source<yuv_layout::half> {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        return {load_luma<Order>(s.y, x), arrange<Order>(load_zip(s.u + x / 2, s.v + x / 2))};
+        return {load_luma<Order>(s.y, x),
+                arrange<Order>(load_pairs(s.u + (x >> 1), s.v + (x >> 1)))};
     }
     static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         stage_few(to.y, 1, s.y + x, count, 1);
@@ -62,9 +61,8 @@ struct source<yuv_layout::full> {
 
     template <pixel_order Order>
     static yuv_full load(const samples &s, ptrdiff_t x) {
-        const u8v u = arrange<Order>(SIMD_TARGET::load(s.u + x));
-        const u8v v = arrange<Order>(SIMD_TARGET::load(s.v + x));
-        return {load_luma<Order>(s.y, x), join(even(u), even(v)), join(odd(u), odd(v))};
+        const pairs_v u = load_luma<Order>(s.u, x), v = load_luma<Order>(s.v, x);
+        return {load_luma<Order>(s.y, x), pair_evens(u, v), pair_odds(u, v)};
     }
     static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         stage_few(to.y, 1, s.y + x, count, 1);
@@ -81,7 +79,7 @@ struct source_pairs {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        return {load_luma<Order>(s.y, x), arrange<Order>(SIMD_TARGET::load(s.u + x))};
+        return {load_luma<Order>(s.y, x), load_luma<Order>(s.u, x)};
     }
     static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
         stage_few(to.y, 1, s.y + x, count, 1);
@@ -91,6 +89,15 @@ struct source_pairs {
 };
 
 // Packed 4:2:2: every other byte is luma, the others are pairs U V.
+template <pixel_order Order>
+inline luma_chroma load_groups_for(const uint8_t *p) {
+    if constexpr (Order == pixel_order::by8)
+        return load_groups(p);
+    else if constexpr (Order == pixel_order::by4)
+        return load_groups_by4(p);
+    else
+        return load_groups_natural(p);
+}
 template <bool LUMA_FIRST>
 struct source_packed {
     static constexpr pair_order pairs = pair_order::uv;
@@ -98,11 +105,11 @@ struct source_packed {
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
-        const uint8_t *const at = s.y + 2 * x;
-        const pair_u8 p = Order == pixel_order::by8   ? load_split(at)
-                          : Order == pixel_order::by4 ? load_split_by4(at)
-                                                      : load_split_natural(at);
-        return {LUMA_FIRST ? p.even : p.odd, LUMA_FIRST ? p.odd : p.even};
+        const luma_chroma p = load_groups_for<Order>(s.y + 2 * x);
+        if constexpr (LUMA_FIRST)
+            return p;
+        else
+            return exchanged(p);
     }
     // A last group of one pixel gets the V of the group before.
     static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {

@@ -166,8 +166,8 @@ template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, cla
 [[gnu::always_inline]] inline void move_steps(ptrdiff_t count, In in, Out out, Load load,
                                               Store store) {
     if constexpr (!moves_pointers) {
-        whole_steps<Step>(
-            count, [&](ptrdiff_t x) { store(further(out, x).p, load(further(in, x).p)); });
+        whole_steps<Step>(count,
+                          [&](ptrdiff_t x) { store(further(out, x).p, load(further(in, x).p)); });
         return;
     }
     const size_t all = size_t(count) / Step;

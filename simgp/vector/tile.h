@@ -67,10 +67,10 @@ static void tile_to_rgb(const uint8_t *luma, const uint8_t *chroma, uint8_t *dst
     using to = packer<Packing>;
     for (ptrdiff_t r = 0; r < height; r += 2)
         for (ptrdiff_t x = 0; x < tile_width; x += bytes) {
-            const u8v pairs = arrange<to::order>(load(chroma + tile_width * (r / 2) + x));
+            const pairs_v pairs = arrange<to::order>(load_pairs(chroma + tile_width * (r / 2) + x));
             const chroma_terms c = bt601::chroma<pair_order::uv>(pairs);
             const auto write_row = [&](ptrdiff_t row) {
-                const u8v y = arrange<to::order>(load(luma + tile_width * row + x));
+                const pairs_v y = arrange<to::order>(load_pairs(luma + tile_width * row + x));
                 to::store(dst + row * stride + x * to::size, bt601::apply(bt601::luma_even(y), c),
                           bt601::apply(bt601::luma_odd(y), c));
             };

@@ -43,11 +43,11 @@ struct yuv_step : source<Layout> {
         return chroma_terms_full{Matrix::template chroma<from::pairs>(p.pairs_even),
                                  Matrix::template chroma<from::pairs>(p.pairs_odd)};
     }
-    static void apply(uint8_t *out, ptrdiff_t x, u8v y, const chroma_terms &c) {
+    static void apply(uint8_t *out, ptrdiff_t x, pairs_v y, const chroma_terms &c) {
         to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c),
                   Matrix::apply(Matrix::luma_odd(y), c));
     }
-    static void apply(uint8_t *out, ptrdiff_t x, u8v y, const chroma_terms_full &c) {
+    static void apply(uint8_t *out, ptrdiff_t x, pairs_v y, const chroma_terms_full &c) {
         to::store(out + x * size, Matrix::apply(Matrix::luma_even(y), c.even),
                   Matrix::apply(Matrix::luma_odd(y), c.odd));
     }
@@ -94,7 +94,7 @@ struct pair_step : Step {
     template <class Pixels>
     struct pixels_pair {
         Pixels first;
-        u8v second_y;
+        pairs_v second_y;
     };
 
     static auto load(const samples_pair &in, ptrdiff_t x) {
@@ -119,7 +119,9 @@ struct yuv_step<yuv_layout::grey, bt601, Packing> {
     static constexpr bool pixels_in_pairs = false;
     static constexpr int size = 2;
 
-    static u8v load(const samples &in, ptrdiff_t x) { return load_luma<pixel_order::by8>(in.y, x); }
+    static u8v load(const samples &in, ptrdiff_t x) {
+        return arrange<pixel_order::by8>(SIMD_TARGET::load(in.y + x));
+    }
     static samples stage(staged &to, const samples &in, ptrdiff_t x, int count) {
         stage_few(to.y, 1, in.y + x, count, 1);
         return {to.y, to.y, to.y};
