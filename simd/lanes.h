@@ -607,6 +607,16 @@ inline s16v even_dot(rgb_v v, const channel_factors &f) {
         return f.a * v.c[0].lane[2 * i] + f.b * v.c[1].lane[2 * i] + f.c * v.c[2].lane[2 * i];
     });
 }
+// Words of 5, 6 and 5 bits from three channels in by8 order, the first in the highest bits; the low
+// bits of each are dropped.
+inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
+    a = by8_to_natural(a), b = by8_to_natural(b), c = by8_to_natural(c);
+    for (int i = 0; i < bytes; i++) {
+        const int word = a.lane[i] >> 3 << 11 | b.lane[i] >> 2 << 5 | c.lane[i] >> 3;
+        p[2 * i] = static_cast<uint8_t>(word);
+        p[2 * i + 1] = static_cast<uint8_t>(word >> 8);
+    }
+}
 // `bytes` pixels of 3 or 4 bytes at q become words of 5, 6 and 5 bits at p, the first channel in
 // the highest bits; the low bits of each channel are dropped, and so is the fourth byte.
 template <int Size>

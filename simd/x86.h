@@ -80,6 +80,14 @@ inline channels_v channels_of(rgb_v v) {
             join_high(v.ac_even, v.ac_odd)};
 }
 
+// Bits of bytes, by shifts of words: those that come from the neighbour are dropped.
+inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
+    const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
+    const u8v high = bit_or(bit_and(a, set_u8(0xF8)), bits(shr<5>(as_u16(b)), 0x07));
+    const u8v low = bit_or(bits(shl<3>(as_u16(b)), 0xE0), bits(shr<3>(as_u16(c)), 0x1F));
+    store_zip8(p, low, high);
+}
+
 // A shuffle is the same code for all orders.
 template <class F>
 [[gnu::always_inline]] inline void with_widen_moves(bool swap, bool to_alpha_first, F f) {

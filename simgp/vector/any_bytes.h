@@ -59,11 +59,7 @@ inline void store_channels(uint8_t *dst, u8v first, u8v g, u8v last, bool alpha_
         else
             store_zip4(dst, first, g, last, set_u8(255));
     } else {
-        // Bits of bytes, by shifts of words: those that come from the neighbour are dropped.
-        const auto bits = [](u16v v, uint8_t mask) { return bit_and(as_u8(v), set_u8(mask)); };
-        const u8v high = bit_or(bit_and(first, set_u8(0xF8)), bits(shr<5>(as_u16(g)), 0x07));
-        const u8v low = bit_or(bits(shl<3>(as_u16(g)), 0xE0), bits(shr<3>(as_u16(last)), 0x1F));
-        store_zip8(dst, natural_to_by8(low), natural_to_by8(high));
+        store_565(dst, natural_to_by8(first), natural_to_by8(g), natural_to_by8(last));
     }
 }
 
@@ -96,12 +92,14 @@ template <int Size, int ToSize, class Convert>
 template <rgb_in In, pixel_kind To>
 static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
-    repack_in_steps<size_in<In>, int(To) + 2>(
-        repack_pixels<In, To>, order, src, dst, count, [&](uint8_t *p, const uint8_t *q) {
-            channels_v c = channels_of(load_pixels<In>(q));
-            if (order.exchange) c = {{c.c[2], c.c[1], c.c[0]}};
-            store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
-        });
+    with_flag(order.exchange, [&](auto exchange) {
+        repack_in_steps<size_in<In>, int(To) + 2>(
+            repack_pixels<In, To>, order, src, dst, count, [&](uint8_t *p, const uint8_t *q) {
+                channels_v c = channels_of(load_pixels<In>(q));
+                if (exchange) c = {{c.c[2], c.c[1], c.c[0]}};
+                store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
+            });
+    });
 }
 static void four_to_words(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {

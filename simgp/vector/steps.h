@@ -198,7 +198,23 @@ template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, cla
     }
 }
 
-// The same of any number of samples; one(out.p, in.p) does one of those of less than a step.
+// Calls f(flag): where loops are that short, one for each of its values, which it knows.
+template <bool Flag>
+struct known_flag {
+    constexpr operator bool() const { return Flag; }
+};
+template <class F>
+[[gnu::always_inline]] inline void with_flag(bool flag, F f) {
+    if constexpr (!moves_pointers)
+        f(flag);
+    else if (flag)
+        f(known_flag<true>());
+    else
+        f(known_flag<false>());
+}
+
+// What move_steps does, of any number of samples; one(out.p, in.p) does one of those of less than a
+// step.
 template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, class Store, class One>
 [[gnu::always_inline]] inline void move_line(ptrdiff_t count, In in, Out out, Load load,
                                              Store store, One one) {

@@ -176,6 +176,7 @@ static const operation operations[] = {
     MEMORY("load_565, channels_of", 3 * bytes, const channels_v v = channels_of(load_565(in - 2 * bytes)); for (int k = 0; k < 3; k++) put(out + k * bytes, v.c[k])),
     MEMORY("load_888, channels_of", 3 * bytes, const channels_v v = channels_of(load_888(in - 3 * bytes)); for (int k = 0; k < 3; k++) put(out + k * bytes, v.c[k])),
     MEMORY("load_8888, channels_of", 3 * bytes, const channels_v v = channels_of(load_8888<1>(in - 4 * bytes)); for (int k = 0; k < 3; k++) put(out + k * bytes, v.c[k])),
+    MEMORY("store_565", 2 * bytes, store_565(out, u8(in, 0), u8(in, 1), u8(in, 2))),
     MEMORY("repack_888_to_565", 2 * bytes, repack_888_to_565(out, in - 3 * bytes)),
     MEMORY("repack_8888_to_565", 2 * bytes, repack_8888_to_565(out, in - 4 * bytes)),
     MEMORY("repack_888_to_8888", 4 * bytes, with_widen_moves(false, false, [&](const auto &m) { repack_888_to_8888(out, in - 3 * bytes, m); })),
