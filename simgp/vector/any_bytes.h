@@ -92,11 +92,11 @@ template <int Size, int ToSize, class Convert>
 template <rgb_in In, pixel_kind To>
 static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
                           ptrdiff_t count) {
-    with_flag(order.exchange, [&](auto exchange) {
+    with_flag(order.exchange, [&](auto swaps) {
         repack_in_steps<size_in<In>, int(To) + 2>(
             repack_pixels<In, To>, order, src, dst, count, [&](uint8_t *p, const uint8_t *q) {
                 channels_v c = channels_of(load_pixels<In>(q));
-                if (exchange) c = {{c.c[2], c.c[1], c.c[0]}};
+                if (swaps) c = {{c.c[2], c.c[1], c.c[0]}};
                 store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
             });
     });
