@@ -183,7 +183,7 @@ static const operation operations[] = {
            const rgb_v v = block_means(load_888(in - 3 * bytes), load_888(in - 6 * bytes));
            put(out, even_dot(v, set_channel_factors(1, 0, 0))); put(out + bytes, even_dot(v, set_channel_factors(0, 1, 0)));
            put(out + 2 * bytes, even_dot(v, set_channel_factors(0, 0, 1)))),
-    MEMORY("block_means of load_565", bytes, put(out, even_dot(block_means(load_565(in - 2 * bytes), load_565(in - 4 * bytes)), set_channel_factors(-128, 255, 127)))),
+    MEMORY("block_means of load_565", bytes, put(out, even_dot(block_means(load_565(in - 2 * bytes), load_565(in - 4 * bytes)), set_channel_factors(-128, 121, 127)))),
     MEMORY("store_565", 2 * bytes, store_565(out, u8(in, 0), u8(in, 1), u8(in, 2))),
     MEMORY("repack_888_to_565", 2 * bytes, repack_888_to_565(out, in - 3 * bytes)),
     MEMORY("repack_8888_to_565", 2 * bytes, repack_8888_to_565(out, in - 4 * bytes)),
