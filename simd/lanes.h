@@ -72,6 +72,9 @@ inline u8v load(const uint8_t *p) {
     return r;
 }
 inline void store(uint8_t *p, u8v v) { memcpy(p, &v, bytes); }
+// Says that p has been moved by a constant to where the next load or store is.
+template <class T>
+inline void step_pointer(T *&) {}
 // bytes / 2 bytes from p and as many from q, in turn.
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return make<u8v>([&](int i) {

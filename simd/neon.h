@@ -24,6 +24,16 @@ inline u16v as_u16(u8v v) { return vreinterpretq_u16_u8(v); }
 inline u16v as_u16(s16v v) { return vreinterpretq_u16_s16(v); }
 inline s16v as_s16(u16v v) { return vreinterpretq_s16_u16(v); }
 
+// Says that p has been moved to where the next load or store is. On 32-bit ARM, GCC would otherwise
+// keep two pointers at a distance, as it does where instructions take offsets; those of vectors do
+// not, but move their pointer for nothing.
+template <class T>
+[[gnu::always_inline]] inline void step_pointer([[maybe_unused]] T *&p) {
+#if !defined __aarch64__ && !defined __clang__
+    asm("" : "+r"(p));
+#endif
+}
+
 inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
 inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {

@@ -12,6 +12,9 @@
 
 namespace simgp::SIMD_TARGET {
 
+template <class T>
+inline void step_pointer(T *&) {}
+
 // Byte pairs are best left in vectors.
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }

@@ -158,6 +158,13 @@ template <class T, int... Sizes>
     ((l.p[k++] += Sizes * count), ...);
     return l;
 }
+// The next step's lines.
+template <int Step, class T, int... Sizes>
+[[gnu::always_inline]] inline lines<T, Sizes...> next(lines<T, Sizes...> l) {
+    int k = 0;
+    ((l.p[k] += Sizes * Step, step_pointer(l.p[k++])), ...);
+    return l;
+}
 
 // store(out.p, load(in.p)) for every Step of `count` >= Step samples. The last step ends at the last
 // sample and may do some again; nothing may overlap. Where loads and stores move pointers, so many
@@ -176,19 +183,19 @@ template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, cla
     if constexpr (AtOnce == 2)
         for (size_t twice = all / 2; twice != 0; twice--) {
             const auto a = load(in.p);
-            in = further(in, Step);
+            in = next<Step>(in);
             const auto b = load(in.p);
-            in = further(in, Step);
+            in = next<Step>(in);
             store(out.p, a);
-            out = further(out, Step);
+            out = next<Step>(out);
             store(out.p, b);
-            out = further(out, Step);
+            out = next<Step>(out);
         }
     for (;;) {
         for (; steps != 0; steps--) {
             store(out.p, load(in.p));
-            in = further(in, Step);
-            out = further(out, Step);
+            in = next<Step>(in);
+            out = next<Step>(out);
         }
         if (rest == 0) return;
         in = further(in, rest - Step);
