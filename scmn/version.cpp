@@ -8,12 +8,12 @@
 
 // Kept in one piece, where a compiler would make immediate operands of it: the stamp of a binary can then be
 // read without running it.
-[[gnu::used]] static constexpr char text[] = SCMN_BUILD_DATE " " SCMN_BUILD_TIME "\n";
+[[gnu::used]] static constexpr char stamp[] = SCMN_BUILD_DATE " " SCMN_BUILD_TIME "\n";
 
 const char *scmn_version(void) {
     static char buffer[64];
     // Any number of threads may write the same text here at once.
-    for (unsigned i = 0; i < sizeof text; i++)
-        __atomic_store_n(&buffer[i], text[i], __ATOMIC_RELAXED);
+    for (unsigned i = 0; i < sizeof stamp; i++)
+        __atomic_store_n(&buffer[i], stamp[i], __ATOMIC_RELAXED);
     return buffer;
 }
