@@ -343,9 +343,33 @@ template <pixel_kind Kind, class F>
     if (v) copy_few(v + x / 2, to_v, samples);
 }
 
+template <pixel_kind Kind>
+static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width);
+
+// A line of luma alone.
+template <pixel_kind Kind>
+[[gnu::noinline]] static void any_luma_line(const rgb_weights &w, const uint8_t *src, uint8_t *y,
+                                            ptrdiff_t width) {
+    constexpr int size = int(Kind) + 2;
+    if (width < bytes) {
+        any_yuv_part(any_yuv_row<Kind>, size, w, src, nullptr, y, nullptr, nullptr, nullptr, 0,
+                     int(width));
+        return;
+    }
+    const any_yuv_matrix<Kind> m(w);
+    with_load<Kind>(w, [&](const auto &load) {
+        move_steps<2>(
+            width, lines_in<size>{{src}}, lines_out<1>{{y}},
+            [&](const uint8_t *const *p) { return load(p[0]); },
+            [&](uint8_t *const *q, const auto &p) { store(q[0], m.luma(p)); });
+    });
+}
+
+// Luma and chroma: of a line, or, with means, of two where there are two.
 template <pixel_kind Kind, bool Mean>
-static void any_yuv_row_of(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
-                           uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+static void any_yuv_lines(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
+                          uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     constexpr int size = int(Kind) + 2;
     const any_yuv_matrix<Kind> m(w);
     with_load<Kind>(w, [&](const auto &load) {
@@ -361,25 +385,28 @@ static void any_yuv_row_of(const rgb_weights &w, const uint8_t *src0, const uint
                     else
                         store(u + x, chroma);
                 };
-                if (!Mean && u) put_chroma(m.even_pixels(p));
+                if constexpr (!Mean) return put_chroma(m.even_pixels(p));
                 auto below = p;
                 if (src1) {
                     below = load(src1 + size * x);
                     store(y1 + x, m.luma(below));
                 }
-                if (Mean) put_chroma(block_means(p, below));
+                put_chroma(block_means(p, below));
             },
             [&](ptrdiff_t x, int count) {
-                any_yuv_part(any_yuv_row_of<Kind, Mean>, size, w, src0, src1, y0, y1, u, v, x,
-                             count);
+                any_yuv_part(any_yuv_row<Kind>, size, w, src0, src1, y0, y1, u, v, x, count);
             });
     });
 }
 template <pixel_kind Kind>
 static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
                         uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    (w.mean && u ? any_yuv_row_of<Kind, true> : any_yuv_row_of<Kind, false>)(w, src0, src1, y0, y1,
-                                                                             u, v, width);
+    if (u && w.mean) return any_yuv_lines<Kind, true>(w, src0, src1, y0, y1, u, v, width);
+    if (u)
+        any_yuv_lines<Kind, false>(w, src0, nullptr, y0, nullptr, u, v, width);
+    else
+        any_luma_line<Kind>(w, src0, y0, width);
+    if (src1) any_luma_line<Kind>(w, src1, y1, width);
 }
 
 [[gnu::noinline]] static void chroma_plane(const int16_t *of, const uint8_t *const channels[3],
