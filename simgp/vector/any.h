@@ -349,8 +349,8 @@ static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t
 
 // A line of luma alone.
 template <pixel_kind Kind>
-[[gnu::noinline]] static void any_luma_line(const rgb_weights &w, const uint8_t *src, uint8_t *y,
-                                            ptrdiff_t width) {
+[[gnu::noinline, maybe_unused]] static void any_luma_line(const rgb_weights &w, const uint8_t *src,
+                                                          uint8_t *y, ptrdiff_t width) {
     constexpr int size = int(Kind) + 2;
     if (width < bytes) {
         any_yuv_part(any_yuv_row<Kind>, size, w, src, nullptr, y, nullptr, nullptr, nullptr, 0,
@@ -366,7 +366,11 @@ template <pixel_kind Kind>
     });
 }
 
-// Luma and chroma: of a line, or, with means, of two where there are two.
+// Whether a second line has a loop of its own: it has where loops move their pointers. Elsewhere two lines at
+// once spare small pictures the way there.
+constexpr bool lines_apart = moves_pointers;
+
+// Luma and chroma of a line, or of two; without means only where they are not apart.
 template <pixel_kind Kind, bool Mean>
 static void any_yuv_lines(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
                           uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
@@ -385,13 +389,14 @@ static void any_yuv_lines(const rgb_weights &w, const uint8_t *src0, const uint8
                     else
                         store(u + x, chroma);
                 };
-                if constexpr (!Mean) return put_chroma(m.even_pixels(p));
+                if (!Mean && (lines_apart || u)) put_chroma(m.even_pixels(p));
+                if (!Mean && lines_apart) return;
                 auto below = p;
                 if (src1) {
                     below = load(src1 + size * x);
                     store(y1 + x, m.luma(below));
                 }
-                put_chroma(block_means(p, below));
+                if (Mean) put_chroma(block_means(p, below));
             },
             [&](ptrdiff_t x, int count) {
                 any_yuv_part(any_yuv_row<Kind>, size, w, src0, src1, y0, y1, u, v, x, count);
@@ -402,6 +407,8 @@ template <pixel_kind Kind>
 static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
                         uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     if (u && w.mean) return any_yuv_lines<Kind, true>(w, src0, src1, y0, y1, u, v, width);
+    if constexpr (!lines_apart)
+        return any_yuv_lines<Kind, false>(w, src0, src1, y0, y1, u, v, width);
     if (u)
         any_yuv_lines<Kind, false>(w, src0, nullptr, y0, nullptr, u, v, width);
     else
