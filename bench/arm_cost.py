@@ -56,12 +56,12 @@ PEERS = {
     "any pairs to three, two": {"NV12ToRGB24Row": 1},
     "any pairs to four, two": {"NV12ToARGBRow": 1},
     "any groups to four": {"YUY2ToARGBRow": 1},
-    "any three to grey, two": {"RAWToYRow": 1},
-    "any four to grey, two": {"ARGBToYRow": 1},
-    "any words to grey, two": {"RGB565ToYRow": 1},
-    "any three to half, two": {"RAWToYRow": 1, "RAWToUVRow": .5},
-    "any four to half, two": {"ARGBToYRow": 1, "ARGBToUVRow": .5},
-    "any words to half, two": {"RGB565ToYRow": 1, "RGB565ToUVRow": .5},
+    "any three to grey": {"RAWToYRow": 1},
+    "any four to grey": {"ARGBToYRow": 1},
+    "any words to grey": {"RGB565ToYRow": 1},
+    "any three to yuv420": {"RAWToYRow": 1, "RAWToUVRow": .5},
+    "any four to yuv420": {"ARGBToYRow": 1, "ARGBToUVRow": .5},
+    "any words to yuv420": {"RGB565ToYRow": 1, "RGB565ToUVRow": .5},
     "any three to means, two": {"RAWToYRow": 1, "RAWToUVRow": .5},
     "any four to means, two": {"ARGBToYRow": 1, "ARGBToUVRow": .5},
     "any words to means, two": {"RGB565ToYRow": 1, "RGB565ToUVRow": .5},
@@ -84,7 +84,7 @@ PEERS = {
 }
 # Of two lines, one gives luma alone.
 SUMS = {f"{p} to yuv420": {f"{p} to half": .5, f"{p} to grey": .5}
-        for p in ("rgb888", "bgr888", "rgb565")}
+        for p in ("rgb888", "bgr888", "rgb565", "any words", "any three", "any four")}
 
 
 def inner_loop(short, long):

@@ -66,10 +66,9 @@ CALL(call_unpack, unpack_rows, a, 0, d, 0, e, 0, n, 1)
 CALL(call_dither, dither_row, a, b, c, d, n)
 CALL(call_any, any_to_rgb_row, to_rgb_how, a, b, c, d, n)
 CALL(call_any_pair, any_to_rgb_row_pair, to_rgb_how, a, a + second, b, c, d, d + second, n)
-CALL(call_any_to_grey, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, nullptr, nullptr,
-     n)
-CALL(call_any_to_half, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, e, f, n)
-CALL(call_any_to_pairs, any_to_yuv_row, to_yuv_how, a, a + second, d, d + second, e, nullptr, n)
+CALL(call_any_to_grey, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, nullptr, nullptr, n)
+CALL(call_any_to_half, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, e, f, n)
+CALL(call_any_to_pairs, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, e, nullptr, n)
 CALL(call_any_to_means, any_to_yuv_row, to_yuv_means, a, a + second, d, d + second, e, nullptr, n)
 CALL(call_chroma, chroma_row, to_yuv_how, channels_in, d, e, n)
 CALL(call_split_pixels, split_pixels_row, a, channels, n)
@@ -174,13 +173,13 @@ void list_any(const any_rows &n, const any_rows &s) {
             add(named("any %s to %s, two", chroma_ins[l], kinds[k]), n.to_rgb_pair[l][k],
                 s.to_rgb_pair[l][k], call_any_pair, 2);
         }
-        const auto to_yuv = [&](const char *out, auto call) {
-            add(named("any %s to %s, two", kinds[k], out), n.to_yuv[k], s.to_yuv[k], call, 2);
+        const auto to_yuv = [&](const char *to, auto call, int lines) {
+            add(named(to, kinds[k]), n.to_yuv[k], s.to_yuv[k], call, lines);
         };
-        to_yuv("grey", call_any_to_grey);
-        to_yuv("half", call_any_to_half);
-        to_yuv("pairs", call_any_to_pairs);
-        to_yuv("means", call_any_to_means);
+        to_yuv("any %s to grey", call_any_to_grey, 1);
+        to_yuv("any %s to half", call_any_to_half, 1);
+        to_yuv("any %s to pairs", call_any_to_pairs, 1);
+        to_yuv("any %s to means, two", call_any_to_means, 2);
         for (size_t to = 0; to < size_t(pixel_kind::count); to++)
             add(named("any %s to %s", kinds[k], kinds[to]), n.repack[k][to], s.repack[k][to],
                 call_repack);
