@@ -33,11 +33,6 @@ inline column column_of(const row_table &rows, bool steps_of_pairs, ptrdiff_t na
     return {width - 1, 1};
 }
 
-// Whether lines of a destination lie apart, so that the order in which they are written is not seen.
-inline bool lie_apart(const lines &dst, ptrdiff_t bytes) {
-    return dst.stride >= bytes || dst.stride <= -bytes;
-}
-
 // Copies `count` short lines.
 void copy_column(const const_lines &from, const lines &to, ptrdiff_t bytes, ptrdiff_t count);
 

@@ -67,6 +67,11 @@ void unpack_plane(const const_lines &src, const lines &a, const lines &b, ptrdif
                   ptrdiff_t height) {
     if (bytes < 1 || height < 1) return;
     ptrdiff_t pairs = bytes / 2;
+    if (bytes % 2 && height > 1 && !lie_apart(a, pairs + 1)) {
+        for (ptrdiff_t y = 0; y < height; y++)
+            unpack_plane(src.from(0, y), a.from(0, y), b.from(0, y), bytes, 1);
+        return;
+    }
     if (bytes % 2 == 0) join_rows(pairs, height, a.stride, b.stride, src.stride);
     if (pairs > 0)
         live_rows(2 * pairs).layout.unpack(src.first, src.stride, a.first, a.stride, b.first,

@@ -35,6 +35,11 @@ inline lines lines_of(void *plane, ptrdiff_t stride) {
     return {static_cast<uint8_t *>(plane), stride};
 }
 
+// Whether lines of a destination lie apart, so that the order in which they are written is not seen.
+inline bool lie_apart(const lines &dst, ptrdiff_t bytes) {
+    return dst.stride >= bytes || dst.stride <= -bytes;
+}
+
 // Copies `height` lines of `width` bytes, which must not overlap.
 void copy_lines(const const_lines &src, const lines &dst, ptrdiff_t width, ptrdiff_t height);
 

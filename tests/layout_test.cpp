@@ -171,6 +171,24 @@ TEST(layout, pairs_are_taken_apart_to_the_last_odd_byte) {
     });
 }
 
+// Lines of a that overlap are written from top to bottom, each with its last odd byte.
+TEST(layout, the_odd_byte_of_a_line_goes_under_the_next_line) {
+    constexpr int width = 71, height = 5, pairs = width / 2;
+    uint8_t src[height * width], a[height * (pairs + 1)], b[height * pairs];
+    for (int i = 0; i < height * width; i++) src[i] = uint8_t(i * 37);
+    for (int stride : {pairs, pairs - 3, 1}) {
+        std::vector<uint8_t> expected(sizeof a);
+        for (int y = 0; y < height; y++)
+            for (int i = 0; i <= pairs; i++)
+                expected[size_t(y * stride + i)] = src[y * width + 2 * i];
+        rig::for_each_target([&](const rig::target_rows &) {
+            memset(a, 0, sizeof a);
+            simgp_csc_8b8b_unpck(src, width, height, width, stride, pairs, a, b);
+            EXPECT_EQ(memcmp(a, expected.data(), sizeof a), 0) << "stride " << stride;
+        });
+    }
+}
+
 TEST(layout, two_planes_are_interleaved) {
     rig::check_jobs("simgp_csc_8b8b_pck", {}, [](int w, int h) {
         return rig::job{{rig::samples(w, h), rig::samples(w, h)},
