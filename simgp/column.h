@@ -33,9 +33,6 @@ inline column column_of(const row_table &rows, bool steps_of_pairs, ptrdiff_t na
     return {width - 1, 1};
 }
 
-// Copies `count` short lines.
-void copy_column(const const_lines &from, const lines &to, ptrdiff_t bytes, ptrdiff_t count);
-
 // Calls f(first, count) for blocks of `height` lines, at most `block` each and about the same number. No line
 // is done twice: the first time may have written over its samples.
 template <class F>
@@ -86,9 +83,9 @@ void convert_column(const const_lines &in, int in_bytes, const lines &out, int o
     uint8_t from[column_pixels * 4], to[column_pixels * 4];
     const ptrdiff_t in_line = in_bytes * c.width, out_line = out_bytes * c.width;
     in_column_blocks(height, column_pixels / c.width, [&](ptrdiff_t y, ptrdiff_t count) {
-        copy_column(in.from(in_bytes * c.x, y), {from, in_line}, in_line, count);
+        copy_lines(in.from(in_bytes * c.x, y), {from, in_line}, in_line, count);
         row(from, to, c.width * count);
-        copy_column(const_lines{to, out_line}, out.from(out_bytes * c.x, y), out_line, count);
+        copy_lines(const_lines{to, out_line}, out.from(out_bytes * c.x, y), out_line, count);
     });
 }
 

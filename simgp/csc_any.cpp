@@ -481,19 +481,19 @@ void convert_rgb_column(const job &j, const rgb_weights &w, any_to_yuv_row *row,
     in_column_blocks(j.height / at_once, column_pixels / 2, [&](ptrdiff_t first, ptrdiff_t count) {
         const const_lines in = j.in(0);
         for (ptrdiff_t r = 0; r < at_once; r++)
-            copy_column({in.line(at_once * first + r) + size * last, at_once * in.stride},
-                        {pixels[r], 2 * size}, size, count);
+            copy_lines({in.line(at_once * first + r) + size * last, at_once * in.stride},
+                       {pixels[r], 2 * size}, size, count);
         row(w, pixels[0], at_once == 2 ? pixels[1] : nullptr, y[0], y[1],
             chroma_bytes ? u : nullptr, chroma_bytes == 1 ? v : nullptr, 2 * count);
         for (ptrdiff_t r = 0; r < at_once; r++)
-            copy_column(const_lines{y[r], 2}, lines_of_plane(0, last, at_once * first + r, at_once),
-                        1, count);
+            copy_lines(const_lines{y[r], 2}, lines_of_plane(0, last, at_once * first + r, at_once),
+                       1, count);
         if (!chroma_bytes) return;
         const ptrdiff_t x = chroma_bytes * (last / 2);
-        copy_column(const_lines{u, chroma_bytes}, lines_of_plane(j.to.u, x, first, 1), chroma_bytes,
-                    count);
+        copy_lines(const_lines{u, chroma_bytes}, lines_of_plane(j.to.u, x, first, 1), chroma_bytes,
+                   count);
         if (chroma_bytes == 1)
-            copy_column(const_lines{v, 1}, lines_of_plane(j.to.v, x, first, 1), 1, count);
+            copy_lines(const_lines{v, 1}, lines_of_plane(j.to.v, x, first, 1), 1, count);
     });
 }
 

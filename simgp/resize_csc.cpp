@@ -269,8 +269,9 @@ class fused {
                              of_chroma.dst_height, m.chroma.ring[k], m.chroma.lines[k]);
         };
         const auto walk = [&](auto &&u, auto &&v) {
-            walk_yuv_to_rgb<like, formats::RGB565, yuv_rule::usual>(
-                y, u, v, dst_, {at.x, at.columns, of_luma.dst_height}, 0);
+            const auto how = conversion_of<like, formats::RGB565, yuv_rule::usual>();
+            walk_rows(simgp::rows_of(how, live_rows(at.columns)).two, y, u, v,
+                      dst_.from(2 * at.x, 0), at.columns, of_luma.dst_height, 0);
         };
         if constexpr (chroma_planes == 1)
             walk(plane(From.u, 0), no_lines());

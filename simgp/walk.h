@@ -28,60 +28,7 @@ constexpr bool is_needed(yuv_layout layout, bool two_rows, rgb_packing packing, 
     return found;
 }
 
-// The row, or the row for a pair of rows, from YUV to RGB.
-template <const format &From, const format &To, yuv_rule Rule>
-auto *yuv_to_rgb_row_of(const row_table &live) {
-    constexpr yuv_matrix matrix = matrix_of(Rule);
-    static_assert(is_needed(From.layout, serves_two_rows(From), To.packing, matrix),
-                  "rows/conversions.h has no kernel with such a row");
-    const size_t m = size_t(matrix), l = size_t(From.layout), p = size_t(To.packing);
-    if constexpr (serves_two_rows(From))
-        return live.yuv2rgb.pair[m][l][p];
-    else
-        return live.yuv2rgb.row[m][l][p];
-}
-
-// 1 where the first chroma line serves one row alone, else 0 (see yuv_rule).
-constexpr int lead_of(yuv_rule rule, ptrdiff_t width, ptrdiff_t height) {
-    return rule == yuv_rule::first_line_alone && width & 3 ? int(height & 1) : 0;
-}
-
-// Columns x ... x + width - 1 of a picture of `height` rows, as a walk sees them: the sources' lines
-// begin at column x, those of the destination at column 0.
-struct walk_span {
-    ptrdiff_t x, width, height;
-};
-
-// Converts the rows of a span from top to bottom, by a row for each of them or by one for pairs, where
-// chroma lines serve two. Row y then takes chroma line (y + lead) >> 1. `at` is the way in bytes from the
-// destination's column 0 to its first pixel.
-template <class Luma, class U, class V>
-void walk_rows(yuv_to_rgb_row *row, Luma &luma, U &u, V &v, const lines &dst, ptrdiff_t at,
-               const walk_span &span, int) {
-    for (ptrdiff_t y = 0; y < span.height; y++)
-        row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y) + at, span.width);
-}
-template <class Luma, class U, class V>
-void walk_rows(yuv_to_rgb_row_pair *rows, Luma &luma, U &u, V &v, const lines &dst, ptrdiff_t at,
-               const walk_span &span, int lead) {
-    for (ptrdiff_t y = 0; y < span.height;) {
-        const ptrdiff_t chroma = (y + lead) >> 1;
-        // The row below, or the row again where it has its chroma line to itself.
-        const ptrdiff_t below = y + 1 < span.height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
-        const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
-        rows(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y) + at,
-             dst.line(below) + at, span.width);
-        y = below + 1;
-    }
-}
-template <const format &From, const format &To, yuv_rule Rule, class Luma, class U, class V>
-void walk_yuv_to_rgb(Luma &&luma, U &&u, V &&v, const lines &dst, const walk_span &span, int lead) {
-    auto *const row = yuv_to_rgb_row_of<From, To, Rule>(live_rows(span.width));
-    if (span.width < 1) return;
-    walk_rows(row, luma, u, v, dst, span.x * To.bytes[0], span, lead);
-}
-
-// A conversion of whole pictures, as an argument: one walk serves them all.
+// A conversion, as an argument: one walk serves them all.
 struct yuv_to_rgb_conversion {
     const format &from, &to;
     yuv_rule rule;
@@ -93,6 +40,42 @@ constexpr yuv_to_rgb_conversion conversion_of() {
     return {From, To, Rule};
 }
 
+// Its rows: one of the two, as its chroma lines serve one row or two.
+struct yuv_to_rgb_rows {
+    yuv_to_rgb_row *one;
+    yuv_to_rgb_row_pair *two;
+};
+inline yuv_to_rgb_rows rows_of(const yuv_to_rgb_conversion &c, const row_table &live) {
+    const size_t m = size_t(matrix_of(c.rule)), l = size_t(c.from.layout), p = size_t(c.to.packing);
+    return {live.yuv2rgb.row[m][l][p], live.yuv2rgb.pair[m][l][p]};
+}
+
+// 1 where the first chroma line serves one row alone, else 0 (see yuv_rule).
+constexpr int lead_of(yuv_rule rule, ptrdiff_t width, ptrdiff_t height) {
+    return rule == yuv_rule::first_line_alone && width & 3 ? int(height & 1) : 0;
+}
+
+// Converts rows from top to bottom, by a row for each of them or by one for pairs, where chroma lines serve
+// two. Row y then takes chroma line (y + lead) >> 1.
+template <class Luma, class U, class V>
+void walk_rows(yuv_to_rgb_row *row, Luma &&luma, U &&u, V &&v, const lines &dst, ptrdiff_t width,
+               ptrdiff_t height) {
+    for (ptrdiff_t y = 0; y < height; y++)
+        row(luma.fetch(y), u.fetch(y), v.fetch(y), dst.line(y), width);
+}
+template <class Luma, class U, class V>
+void walk_rows(yuv_to_rgb_row_pair *rows, Luma &&luma, U &&u, V &&v, const lines &dst,
+               ptrdiff_t width, ptrdiff_t height, int lead) {
+    for (ptrdiff_t y = 0; y < height;) {
+        const ptrdiff_t chroma = (y + lead) >> 1;
+        // The row below, or the row again where it has its chroma line to itself.
+        const ptrdiff_t below = y + 1 < height && (y + 1 + lead) >> 1 == chroma ? y + 1 : y;
+        const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
+        rows(first, second, u.fetch(chroma), v.fetch(chroma), dst.line(y), dst.line(below), width);
+        y = below + 1;
+    }
+}
+
 // Converts the picture of a kernel, its luma from wherever it comes.
 template <class Luma>
 void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&luma) {
@@ -100,15 +83,11 @@ void convert_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a, Luma &&lu
     if (width < 1) return;
     const const_lines u = src_lines(a, plane_of_u(c.from)), v = src_lines(a, plane_of_v(c.from));
     const lines dst = dst_lines(a, 0);
-    const yuv2rgb_rows &live = live_rows(width).yuv2rgb;
-    const size_t m = size_t(matrix_of(c.rule)), l = size_t(c.from.layout);
-    const size_t p = size_t(c.to.packing);
-    const walk_span span{0, width, height};
-    const int lead = lead_of(c.rule, width, height);
+    const yuv_to_rgb_rows rows = rows_of(c, live_rows(width));
     if (serves_two_rows(c.from))
-        walk_rows(live.pair[m][l][p], luma, u, v, dst, 0, span, lead);
+        walk_rows(rows.two, luma, u, v, dst, width, height, lead_of(c.rule, width, height));
     else
-        walk_rows(live.row[m][l][p], luma, u, v, dst, 0, span, lead);
+        walk_rows(rows.one, luma, u, v, dst, width, height);
 }
 
 // Converts the first `width` pixels of rows, but all of those that have a chroma line to themselves.

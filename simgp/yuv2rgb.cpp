@@ -40,18 +40,8 @@ void fill_yuv2rgb(yuv2rgb_rows &t) {
 
 }  // namespace scalar
 
-namespace {
-
-struct rows_to_rgb {
-    yuv_to_rgb_row *one;
-    yuv_to_rgb_row_pair *two;
-};
-
-}  // namespace
-
 void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a) {
     const format &from = c.from, &to = c.to;
-    const size_t m = size_t(matrix_of(c.rule)), l = size_t(from.layout), k = size_t(to.packing);
     planes_to_rgb p{from.layout,
                     serves_two_rows(from),
                     src_lines(a, 0),
@@ -68,9 +58,7 @@ void convert_planes_to_rgb(const yuv_to_rgb_conversion &c, const csc_args &a) {
         p.height = 1;
     }
     // The shortest vectors have 16 bytes.
-    convert_planes(p, 16, [=](const row_table &t) {
-        return rows_to_rgb{t.yuv2rgb.row[m][l][k], t.yuv2rgb.pair[m][l][k]};
-    });
+    convert_planes(p, 16, [&](const row_table &live) { return rows_of(c, live); });
 }
 
 }  // namespace simgp
