@@ -51,14 +51,19 @@ struct from_windows {
     SIMD_INLINE two_vectors weights(int32_t t) const {
         return {load(plan[t].weight[0]), load(plan[t].weight[1])};
     }
-    // A step with many windows reaches over several lines of the cache.
+    // A step reaches over several lines of the cache where there are many windows, or large ones.
     SIMD_INLINE void fetch_ahead(const uint8_t *row, ptrdiff_t ahead, int32_t t) const {
         const step_plan<W> &p = plan[t];
-        fetch(row, ahead + p.at[0][0][0]);
-        if constexpr (W > 1) fetch(row, ahead + p.at[1][0][0]);
-        if constexpr (W > 2) {
-            fetch(row, ahead + p.at[0][0][windows - 1]);
-            fetch(row, ahead + p.at[1][0][windows - 1]);
+        if constexpr (window_bytes > 16) {
+            for (int v = 0; v < 2; v++)
+                for (int w = 0; w < W; w++) fetch(row, ahead + p.at[v][w][0]);
+        } else {
+            fetch(row, ahead + p.at[0][0][0]);
+            if constexpr (W > 1) fetch(row, ahead + p.at[1][0][0]);
+            if constexpr (W > 2) {
+                fetch(row, ahead + p.at[0][0][windows - 1]);
+                fetch(row, ahead + p.at[1][0][windows - 1]);
+            }
         }
     }
 };
@@ -69,6 +74,9 @@ struct from_shared_windows : from_windows<1> {
     SIMD_INLINE two_vectors pairs(const uint8_t *row, int32_t t) const {
         const u8v v = gather_windows(row, plan[t].at[0][0]);
         return {pick(v, load(plan[t].index[0][0])), pick(v, load(plan[t].index[1][0]))};
+    }
+    SIMD_INLINE void fetch_ahead(const uint8_t *row, ptrdiff_t ahead, int32_t t) const {
+        fetch(row, ahead + plan[t].at[0][0][0]);
     }
 };
 
