@@ -267,6 +267,8 @@ TEST_F(play_test, a_test_card_step_by_step_and_the_screen_holds_what_is_saved) {
     const shot later = shoot_after("space");
     EXPECT_GT(later.time, 5 / 25.);
     EXPECT_EQ(shoot().time, later.time);
+    // It has no key frames.
+    EXPECT_EQ(shoot_after("Left Right").time, later.time);
     EXPECT_EQ(finish(), 0);
 }
 
