@@ -538,6 +538,13 @@ TEST_F(convert_test, headers_of_edited_video_are_right) {
     EXPECT_EQ(header("--resize 8x2"), "YUV4MPEG2 W8 H2 F25:1 I? A2:3 C422");
     EXPECT_EQ(header("--resize 8x4 --rotate 90r"), "YUV4MPEG2 W8 H4 F25:1 I? A3:16 C444");
     EXPECT_EQ(header("--thumbnail"), "YUV4MPEG2 W1 H2 F25:1 I? A3:4 C444");
+
+    // Shapes of pixels that are unknown, or no shapes.
+    for (const std::string aspect : {"0:0", "0:1", "1:0", "2000000:1", "1:2000000", "1:-1", "3"}) {
+        write("in.y4m",
+              "YUV4MPEG2 W4 H2 F25:1 Ip A" + aspect + " Cmono\nFRAME\n" + std::string(8, 'x'));
+        EXPECT_EQ(header("--resize 8x2"), "YUV4MPEG2 W8 H2 F25:1 Ip A" + aspect + " Cmono");
+    }
 }
 
 // In every colour the card is drawn, written, read and shown as what it is, and as nothing else.

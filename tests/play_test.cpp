@@ -267,6 +267,8 @@ TEST_F(play_test, a_test_card_step_by_step_and_the_screen_holds_what_is_saved) {
     const shot later = shoot_after("space");
     EXPECT_GT(later.time, 5 / 25.);
     EXPECT_EQ(shoot().time, later.time);
+    // It has no key frames.
+    EXPECT_EQ(shoot_after("Left Right").time, later.time);
     EXPECT_EQ(finish(), 0);
 }
 
@@ -339,6 +341,8 @@ TEST_F(play_test, colours_of_the_stream) {
          "yuv422n 160x120 bt2020 (stream) limited (stream)"},
         {"-c:v mjpeg -pix_fmt yuvj420p -q:v 2", "--colour bt601-full",
          "yuv420 160x120 bt601 (stream) full (stream)"},
+        {"-c:v ffv1 -pix_fmt yuv420p -color_range pc", "--colour bt601-full",
+         "yuv420 160x120 bt601 (by size) full (stream)"},
     };
     for (const auto &clip : clips) {
         encode("clip.mkv", clip.options);
@@ -430,6 +434,13 @@ TEST_F(play_test, the_picture_takes_the_size_of_the_window) {
                   size);
         expect_same(on_screen(), s.p, "screen");
     }
+    // Of the flattest pictures a line is left.
+    const auto fitted = [&](const std::string &card, const std::string &size) {
+        play("testcard:" + card + " --size 100x50");
+        expect_in(shoot().p, converted("testcard:" + card, "--to bgra8888 --resize " + size), card);
+    };
+    fitted("600x2", "100x1");
+    fitted("2x600", "1x50");
 }
 
 // FFmpeg itself turns them when it converts.
@@ -449,6 +460,10 @@ TEST_F(play_test, pixels_that_are_not_square_give_the_window_its_width) {
     play("clip.mp4");
     expect_same(shoot().p, converted("clip.y4m", "--resize 320x120"), "upright");
     expect_in(shoot_after("r").p, converted("clip.y4m", "--resize 45x120 --rotate 90r"), "turned");
+    // Of a film that lies on its side, the height.
+    shell("ffmpeg -v error -i clip.mp4 -c copy -metadata:s:v rotate=90 lying.mp4");
+    play("lying.mp4");
+    expect_same(shoot().p, converted("clip.y4m", "--resize 120x320 --rotate 90l"), "lying");
 }
 
 TEST_F(play_test, ends_by_itself_after_its_frames) {

@@ -354,6 +354,46 @@ TEST_F(probe_test, sizes_and_profiles_come_from_the_headers) {
         352);
 }
 
+// As ITU-T H.264, A.2 and A.3, names them; two of the flags count.
+TEST_F(probe_test, h264_profiles_and_levels) {
+    const struct {
+        uint32_t profile, flags, level;
+        const char *text;
+    } cases[] = {
+        {66, 0, 11, "Baseline, level 1.1"},
+        {66, 0x40, 30, "Constrained Baseline, level 3"},
+        {66, 0x50, 11, "Constrained Baseline, level 1b"},
+        {77, 0x40, 11, "Main, level 1.1"},
+        {77, 0x10, 11, "Main, level 1b"},
+        {77, 0x10, 12, "Main, level 1.2"},
+        {88, 0, 21, "Extended, level 2.1"},
+        {100, 0, 9, "High, level 1b"},
+        {100, 0x10, 11, "High, level 1.1"},
+        {110, 0x40, 40, "High 10, level 4"},
+        {110, 0x10, 40, "High 10 Intra, level 4"},
+        {122, 0, 41, "High 4:2:2, level 4.1"},
+        {122, 0x10, 41, "High 4:2:2 Intra, level 4.1"},
+        {244, 0, 62, "High 4:4:4 Predictive, level 6.2"},
+        {244, 0x10, 62, "High 4:4:4 Intra, level 6.2"},
+        {44, 0x10, 51, "CAVLC 4:4:4 Intra, level 5.1"},
+        {99, 0, 10, "profile 99, level 1"},
+    };
+    for (const auto &c : cases) {
+        std::vector<bit_field> fields = {{c.profile, 8}, {c.flags, 8}, {c.level, 8}, ue(0)};
+        if (c.profile >= 100 || c.profile == 44)
+            fields.insert(fields.end(), {ue(1), ue(0), ue(0), {0, 1}, {0, 1}});
+        fields.insert(fields.end(),
+                      {ue(0), ue(2), ue(1), {0, 1}, ue(10), ue(8), {1, 1}, {1, 1}, {0, 1}, {0, 1}});
+        const std::string path =
+            place.write("stream", nal(0x67, fields, true) + picture_set + slice(true, 0, 0));
+        const program::outcome got = program::run(place, probe + " --summary " + path);
+        EXPECT_NE(got.out.find("  176x144, " + std::string(c.text) + "; 1 picture"),
+                  std::string::npos)
+            << c.text << "\n"
+            << got.out;
+    }
+}
+
 TEST_F(probe_test, tags) {
     const struct {
         const char *tag;
