@@ -3,7 +3,7 @@
 
 namespace simgp {
 
-resampling::resampling(resize_kind kind, int32_t step_x, int32_t step_y)
+resampling::resampling(resize_kind kind, int32_t step_x, int32_t step_y, bool mirrored)
     : pixel_bytes(resized_pixel_bytes[size_t(kind)]),
       loops(live_rows().resize.of[size_t(kind)]),
       x(step_x),
@@ -12,6 +12,7 @@ resampling::resampling(resize_kind kind, int32_t step_x, int32_t step_y)
     constexpr uint32_t short_step = (5 << 18) / 4;
     strip_.step = x.step;
     strip_.shift = x.shift;
+    strip_.mirrored = mirrored;
     strip_.keeps = y.shift == 0 && y.step < short_step;
     loops.measure(strip_);
 }

@@ -103,7 +103,8 @@ class resampling {
     // Where the step from a line to the next is short, most rows are wanted for several lines:
     // they are blended across once, and the two latest kept. The other way, two rows are blended at
     // once for each line, and a source must be able to hand over four rows at a time.
-    resampling(resize_kind kind, int32_t step_x, int32_t step_y);
+    // The columns of mirrored strips go from right to left.
+    resampling(resize_kind kind, int32_t step_x, int32_t step_y, bool mirrored = false);
 
     const ptrdiff_t pixel_bytes;
     const resize_loops &loops;

@@ -41,7 +41,7 @@ struct column {
     int phase;
 
     column(const resize_strip &s, ptrdiff_t i) {
-        const uint32_t at = uint32_t(s.x + i) * s.step;
+        const uint32_t at = uint32_t(s.x + (s.mirrored ? s.columns - 1 - i : i)) * s.step;
         left = ptrdiff_t(int32_t(at) >> 18) * (1 << s.shift) - s.first;
         phase = int(at >> 15 & 7);
         right = phase ? left + (1 << s.shift) : left;
