@@ -260,8 +260,10 @@ scmn_irsz_ctx *make_whole(const scmn_irsz_ctx &c) {
 // One block for the object and its strips, and one for the line.
 scmn_irsz_ctx *make_for_bands(const scmn_irsz_ctx &c, const irsz_format &f, int32_t src_w) {
     const resampling r(f.kind, c.inc_x << 3 | c.shift_x, c.inc_y << 3 | c.shift_y);
-    // As wide as those of the kernels are, so that what a strip works on stays in the cache.
-    const ptrdiff_t columns = r.strip_width(c.dst_w, strip_memory(f.packs), most_columns(f.packs));
+    // As wide as those of the kernels are, so that what a strip works on stays in the cache; twice that
+    // where rows are kept, as each band is short work for a strip, and the cache has room for it.
+    const ptrdiff_t memory_of_strip = strip_memory(f.packs) * (r.keeps() ? 2 : 1);
+    const ptrdiff_t columns = r.strip_width(c.dst_w, memory_of_strip, most_columns(f.packs));
     const ptrdiff_t count = (c.dst_w + columns - 1) / columns;
     const ptrdiff_t strip_bytes = r.plan_bytes(columns) + r.ring_bytes(columns);
     const uint64_t size = sizeof(band_resizer) + resize_alignment +
