@@ -17,12 +17,13 @@ resampling::resampling(resize_kind kind, int32_t step_x, int32_t step_y, bool mi
     loops.measure(strip_);
 }
 
-ptrdiff_t resampling::strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t most) const {
-    const ptrdiff_t step = strip_.plan_bytes + (keeps() ? 2 * ptrdiff_t(strip_.kept_bytes) : 0);
+ptrdiff_t resampling::strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t beside) const {
+    const ptrdiff_t step = strip_.plan_bytes + (keeps() ? 2 * ptrdiff_t(strip_.kept_bytes) : 0) +
+                           (beside * strip_.step_bytes + pixel_bytes - 1) / pixel_bytes;
+    ptrdiff_t most = PTRDIFF_MAX;
     if (step != 0) {
         constexpr ptrdiff_t loss = 3 * (resize_alignment - 1);  // of the plan and two rows
-        const ptrdiff_t fit = (memory - loss) / step * strip_.step_bytes / pixel_bytes;
-        if (fit < most) most = fit;
+        most = (memory - loss) / step * strip_.step_bytes / pixel_bytes;
     }
     if (width <= most) return width;
     const ptrdiff_t strips = (width + most - 1) / most;

@@ -138,7 +138,7 @@ void resize(resize_kind kind, const resize_args &a) {
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
-    resample_plane(r, src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t) {
+    resample_plane(r, src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t, uint8_t *) {
         made.make(0, a.height, dst.first + x * unit, dst.stride);
     });
 }

@@ -105,7 +105,7 @@ void half_turn(const turned_samples &of, const resize_args &args) {
     const resize_args a = whole_samples(args, int(of.size));
     const lines dst = a.dst.upside_down(a.height);
     const resampling r(of.resized_as, a.step_x, a.step_y, true);
-    resample_plane(r, a.src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t columns) {
+    resample_plane(r, a.src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t columns, uint8_t *) {
         made.make(0, a.height, dst.first + (a.width - x - columns) * of.size, dst.stride);
     });
 }
