@@ -31,7 +31,8 @@ struct resize_strip {
     uint32_t step;      // from a column to the next: 18 fractional bits, in units of 2^shift pixels
     int32_t shift;      // 0 ... 4
     bool keeps;         // for `across` and `down`; else for `both`. `measure` may choose the first
-    int32_t x;          // the first column of the destination
+    bool mirrored;      // the columns are made from right to left; not of pixels of 3 bytes
+    int32_t x;          // the first column of the destination, before any turn
     int32_t columns;    // at least 1
     int32_t first;      // the column of the source at which the rows begin that are handed over
     int32_t row_bytes;  // and so many bytes of them, at least 1, may be read

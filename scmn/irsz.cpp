@@ -21,14 +21,9 @@ struct irsz_format {
     int32_t unit;  // bytes that lengths count in
 };
 
-// Lines that become words wait in a part of the stack, as many as the resampler makes at once, which
-// strips of so many columns leave for them.
-constexpr ptrdiff_t lines_packed = 2, most_packed = 512,
-                    packed_memory = lines_packed * most_packed * 3;
-constexpr ptrdiff_t most_columns(bool packs) { return packs ? most_packed : PTRDIFF_MAX; }
-constexpr ptrdiff_t strip_memory(bool packs) {
-    return resample_stack - (packs ? packed_memory : 0);
-}
+// Lines that become words wait beside a strip's plan, as many as the resampler makes at once.
+constexpr ptrdiff_t lines_packed = 2;
+constexpr ptrdiff_t packed_bytes(bool packs) { return packs ? lines_packed * 3 : 0; }
 
 // Packs a line. The two lines below come next: a strip's short lines are too many streams for the
 // processor to see what will be written.
@@ -57,13 +52,13 @@ struct band_source {
     }
 };
 
-// Writes lines first ... first + count - 1 of a strip.
+// Writes lines first ... first + count - 1 of a strip, for which there is room for `some` if they are
+// packed.
 template <bool Packs>
 void write_lines(resampled_lines<band_source> &made, ptrdiff_t columns, ptrdiff_t first,
-                 ptrdiff_t count, const lines &dst) {
+                 ptrdiff_t count, const lines &dst, [[maybe_unused]] uint8_t *some) {
     if constexpr (Packs) {
         const ptrdiff_t stride = columns * 3;
-        uint8_t some[packed_memory];
         const auto pack = live_rows().rgb2yuv.to_rgb565[size_t(rgb_packing::rgb888)];
         for (ptrdiff_t y = 0; y < count;) {
             const ptrdiff_t end = y + made.make_some(first + y, first + count, some, stride);
@@ -78,12 +73,12 @@ void write_lines(resampled_lines<band_source> &made, ptrdiff_t columns, ptrdiff_
 template <bool Packs>
 void resize_as(const irsz_format &f, const resampling &r, const band &src, ptrdiff_t width,
                ptrdiff_t first, ptrdiff_t count, const lines &dst) {
-    resample_plane<strip_memory(Packs)>(
+    resample_plane(
         r, band_source{&src, src.given.stride}, width,
-        [&](auto &made, ptrdiff_t x, ptrdiff_t columns) {
-            write_lines<Packs>(made, columns, first, count, dst.from(x * f.dst_bytes, 0));
+        [&](auto &made, ptrdiff_t x, ptrdiff_t columns, uint8_t *some) {
+            write_lines<Packs>(made, columns, first, count, dst.from(x * f.dst_bytes, 0), some);
         },
-        most_columns(Packs));
+        packed_bytes(Packs));
 }
 void resize(const irsz_format &f, const resampling &r, const band &src, ptrdiff_t width,
             ptrdiff_t first, ptrdiff_t count, const lines &dst) {
@@ -126,11 +121,13 @@ struct band_strip {
                const band_source &source, uint8_t *memory)
         : x(at),
           plan(r.plan(at, columns, span, memory)),
-          made(r, plan, source, memory + r.plan_bytes(columns)) {}
+          made(r, plan, source, memory + r.plan_bytes(columns)),
+          some(memory + r.plan_bytes(columns) + r.ring_bytes(columns)) {}
 
     const ptrdiff_t x;
     const resize_strip plan;
     resampled_lines<band_source> made;
+    uint8_t *const some;
 };
 
 // The object for bands: behind what everyone sees lie the strips, and behind them their memory.
@@ -167,9 +164,9 @@ void resize_band(const irsz_format &f, band_resizer &b, const uint8_t *src, int3
         const lines dst = lines_of(b.dst, stride).from(0, next);
         for (ptrdiff_t k = 0; k < b.count; k++) {
             band_strip &s = b.strips[k];
-            (f.packs ? write_lines<true> : write_lines<false>)(s.made, s.plan.columns, next,
-                                                               row - next,
-                                                               dst.from(s.x * f.dst_bytes, 0));
+            (f.packs ? write_lines<true>
+                     : write_lines<false>)(s.made, s.plan.columns, next, row - next,
+                                           dst.from(s.x * f.dst_bytes, 0), s.some);
         }
     }
 
@@ -260,10 +257,14 @@ scmn_irsz_ctx *make_whole(const scmn_irsz_ctx &c) {
 // One block for the object and its strips, and one for the line.
 scmn_irsz_ctx *make_for_bands(const scmn_irsz_ctx &c, const irsz_format &f, int32_t src_w) {
     const resampling r(f.kind, c.inc_x << 3 | c.shift_x, c.inc_y << 3 | c.shift_y);
-    // As wide as those of the kernels are, so that what a strip works on stays in the cache.
-    const ptrdiff_t columns = r.strip_width(c.dst_w, strip_memory(f.packs), most_columns(f.packs));
+    // As wide as those of the kernels are, so that what a strip works on stays in the cache; twice that
+    // where rows are kept, as each band is short work for a strip, and the cache has room for it.
+    const ptrdiff_t memory_of_strip = resample_stack * (r.keeps() ? 2 : 1);
+    const ptrdiff_t columns = r.strip_width(c.dst_w, memory_of_strip, packed_bytes(f.packs));
     const ptrdiff_t count = (c.dst_w + columns - 1) / columns;
-    const ptrdiff_t strip_bytes = r.plan_bytes(columns) + r.ring_bytes(columns);
+    constexpr ptrdiff_t unit = resize_alignment;
+    const ptrdiff_t packed = (columns * packed_bytes(f.packs) + unit - 1) / unit * unit;
+    const ptrdiff_t strip_bytes = r.plan_bytes(columns) + r.ring_bytes(columns) + packed;
     const uint64_t size = sizeof(band_resizer) + resize_alignment +
                           uint64_t(count) * (sizeof(band_strip) + uint64_t(strip_bytes));
     if (size > PTRDIFF_MAX) return nullptr;

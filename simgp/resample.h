@@ -2,7 +2,7 @@
 // source come. The kernels that resize share it:
 //
 //     const resampling r(resize_kind::bytes1, step_x, step_y);
-//     resample_plane(r, src, width, [&](auto &made, ptrdiff_t x, ptrdiff_t) {
+//     resample_plane(r, src, width, [&](auto &made, ptrdiff_t x, ptrdiff_t, uint8_t *) {
 //         made.make(0, height, dst.first + x * r.pixel_bytes, dst.stride);
 //     });
 #ifndef SIMGP_RESAMPLE_H
@@ -103,7 +103,8 @@ class resampling {
     // Where the step from a line to the next is short, most rows are wanted for several lines:
     // they are blended across once, and the two latest kept. The other way, two rows are blended at
     // once for each line, and a source must be able to hand over four rows at a time.
-    resampling(resize_kind kind, int32_t step_x, int32_t step_y);
+    // The columns of mirrored strips go from right to left.
+    resampling(resize_kind kind, int32_t step_x, int32_t step_y, bool mirrored = false);
 
     const ptrdiff_t pixel_bytes;
     const resize_loops &loops;
@@ -117,9 +118,9 @@ class resampling {
     ptrdiff_t ring_bytes(ptrdiff_t columns) const {
         return keeps() ? 2 * whole(columns, strip_.kept_bytes) : 0;
     }
-    // The width of strips whose plan and lines' rows fit the memory, of about the same width all, and
-    // of at most `most` columns.
-    ptrdiff_t strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t most = PTRDIFF_MAX) const;
+    // The width of strips whose plan and lines' rows fit the memory, of about the same width all, with
+    // `beside` more bytes for each column.
+    ptrdiff_t strip_width(ptrdiff_t width, ptrdiff_t memory, ptrdiff_t beside = 0) const;
     // Calls f(x, columns) for each of them.
     template <class F>
     void for_each_strip(ptrdiff_t width, ptrdiff_t columns, F f) const {
@@ -279,18 +280,19 @@ inline void resize_plane(simgp_rsz_fn *kernel, const simgp_img &src, const simgp
            step_x, step_y);
 }
 
-// Calls write(made, x, columns) for all strips of a plane of `width` columns: what is made are the
-// lines of the strip from column x on. No strip has more than `most` columns. The source is one of
-// whole rows.
-template <size_t Memory = resample_stack, class Source, class Write>
+// Calls write(made, x, columns, room) for all strips of a plane of `width` columns: what is made are
+// the lines of the strip from column x on, and `room` has `beside` bytes for each column. The source
+// is one of whole rows.
+template <class Source, class Write>
 void resample_plane(const resampling &r, const Source &src, ptrdiff_t width, Write write,
-                    ptrdiff_t most = PTRDIFF_MAX) {
-    resample_memory<Memory> memory;
-    const ptrdiff_t columns = r.strip_width(width, memory.size, most);
+                    ptrdiff_t beside = 0) {
+    resample_memory<resample_stack> memory;
+    const ptrdiff_t columns = r.strip_width(width, memory.size, beside);
     r.for_each_strip(width, columns, [&](ptrdiff_t x, ptrdiff_t n) {
         const resize_strip strip = r.plan(x, n, r.whole_rows(width), memory.bytes);
-        resampled_lines made(r, strip, src, memory.bytes + r.plan_bytes(n));
-        write(made, x, n);
+        uint8_t *const ring = memory.bytes + r.plan_bytes(n);
+        resampled_lines made(r, strip, src, ring);
+        write(made, x, n, ring + r.ring_bytes(n));
     });
 }
 

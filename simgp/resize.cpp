@@ -41,7 +41,7 @@ struct column {
     int phase;
 
     column(const resize_strip &s, ptrdiff_t i) {
-        const uint32_t at = uint32_t(s.x + i) * s.step;
+        const uint32_t at = uint32_t(s.x + (s.mirrored ? s.columns - 1 - i : i)) * s.step;
         left = ptrdiff_t(int32_t(at) >> 18) * (1 << s.shift) - s.first;
         phase = int(at >> 15 & 7);
         right = phase ? left + (1 << s.shift) : left;
@@ -138,7 +138,7 @@ void resize(resize_kind kind, const resize_args &a) {
     const int unit = int(r.pixel_bytes);
     const const_lines src = whole_pixel_lines(a.src, unit);
     const lines dst = whole_pixel_lines(a.dst, unit);
-    resample_plane(r, src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t) {
+    resample_plane(r, src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t, uint8_t *) {
         made.make(0, a.height, dst.first + x * unit, dst.stride);
     });
 }

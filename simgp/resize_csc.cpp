@@ -86,6 +86,9 @@ struct tiled_part {
     }
 };
 
+// From this size on, tiles are asked for ahead. Of 1920 x 1080 it costs as much as it brings.
+constexpr int64_t tiles_fetched_from = 1 << 22;
+
 // Its rows in one piece, as a source of lines: bands of rows that lie in the same tiles are put
 // together at once, and the latest of them stay.
 class untiled_rows {
@@ -105,6 +108,7 @@ class untiled_rows {
           bands_(rows_of(a) / band_),
           memory_(memory),
           stride_(stride),
+          fetch_(int64_t(part.width) * part.height >= tiles_fetched_from),
           detile_(live_rows().tile.detile) {}
 
     [[gnu::noinline]] const uint8_t *fetch(ptrdiff_t y) {
@@ -127,11 +131,18 @@ class untiled_rows {
   private:
     uint8_t *line(int band) const { return memory_ + band * band_ * stride_; }
 
+    // Of a large plane, the rows after next are asked for: they are two lines of the cache of each
+    // tile, and the processor does not foresee so many.
     void put_together(uint8_t *to, ptrdiff_t y) const {
         const ptrdiff_t rows = part_.rows - y < band_ ? part_.rows - y : band_;
         ptrdiff_t x = part_.first;
-        for (; x + tile_width <= part_.end; x += tile_width, to += tile_width)
-            detile_(part_.at(x, y), to, stride_, rows);
+        for (; x + tile_width <= part_.end; x += tile_width, to += tile_width) {
+            const uint8_t *const from = part_.at(x, y);
+            for (int k = 0; fetch_ && k < band_; k++)
+                __builtin_prefetch(reinterpret_cast<const void *>(
+                    reinterpret_cast<uintptr_t>(from) + uintptr_t((2 * band_ + k) * tile_width)));
+            detile_(from, to, stride_, rows);
+        }
         if (x < part_.end)
             copy_lines({part_.at(x, y), tile_width}, {to, stride_}, part_.end - x, rows);
     }
@@ -140,6 +151,7 @@ class untiled_rows {
     int band_, bands_;
     uint8_t *memory_;
     ptrdiff_t stride_;
+    bool fetch_;
     detile_rows *detile_;
     ptrdiff_t held_[max_bands] = {-1, -1, -1, -1};
     int next_ = 0;

@@ -60,24 +60,26 @@ void for_each_block_of_lines(const resampling &r, const const_lines &src, ptrdif
     }
 }
 
-// Lines are transposed `band` at a time. For a turn to the right they lie upside down in the block.
+// Lines are transposed `band` at a time, and no less than `least` where there are as many, which is what
+// vectors take. For a turn to the right they lie upside down in the block.
 // Of large planes the lines of the destination are asked for meanwhile, some whenever lines have been
 // made: they lie far apart, and no processor foresees them.
 void quarter_turn(const turned_samples &of, bool right, const resize_args &args) {
-    constexpr ptrdiff_t band = 32;
+    constexpr ptrdiff_t band = 32, least = 16;
     const ptrdiff_t size = of.size, side = of.block_side;
     const ptrdiff_t width = args.height, height = args.width;  // before the turn
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
     const lines dst = right ? a.dst : a.dst.upside_down(width);
-    transpose_block *const transpose = live_rows(band).rotate.transpose[size_t(of.kind)];
+    transpose_block *const transpose = live_rows(band * size).rotate.transpose[size_t(of.kind)];
     const resampling r(of.resized_as, a.step_x, a.step_y);
     const bool fetch = int64_t(width) * height * size >= fetch_from;
     for_each_block_of_lines(
         r, a.src, width, band,
         [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
-            for (ptrdiff_t y = 0; y < height; y += band) {
-                const ptrdiff_t rows = height - y < band ? height - y : band;
+            for (ptrdiff_t y = 0, rows; y < height; y += rows) {
+                const ptrdiff_t left = height - y;
+                rows = left <= band ? left : left < band + least ? left - least : band;
                 const lines in{block.first, block.stride};
                 const lines to = right ? in.upside_down(rows) : in;
                 const ptrdiff_t column = right ? height - y - rows : y;
@@ -97,24 +99,15 @@ void quarter_turn(const turned_samples &of, bool right, const resize_args &args)
         });
 }
 
+// The lines of mirrored strips, from the last one up.
 void half_turn(const turned_samples &of, const resize_args &args) {
-    constexpr ptrdiff_t band = 2;
-    const ptrdiff_t size = of.size;
     if (args.width < 1 || args.height < 1) return;
-    const resize_args a = whole_samples(args, int(size));
+    const resize_args a = whole_samples(args, int(of.size));
     const lines dst = a.dst.upside_down(a.height);
-    reverse_row *const reverse = live_rows().rotate.reverse[size_t(of.kind)];
-    const resampling r(of.resized_as, a.step_x, a.step_y);
-    for_each_block_of_lines(
-        r, a.src, a.width, band,
-        [&](ptrdiff_t x, ptrdiff_t columns, const line_block &block, auto &&made) {
-            const ptrdiff_t column = a.width - x - columns;
-            for (ptrdiff_t y = 0; y < a.height;) {
-                const int rows = made.make_some(y, a.height, block.first, block.stride);
-                for (ptrdiff_t k = 0; k < rows; k++, y++)
-                    reverse(block.first + k * block.stride, dst.line(y) + column * size, columns);
-            }
-        });
+    const resampling r(of.resized_as, a.step_x, a.step_y, true);
+    resample_plane(r, a.src, a.width, [&](auto &made, ptrdiff_t x, ptrdiff_t columns, uint8_t *) {
+        made.make(0, a.height, dst.first + (a.width - x - columns) * of.size, dst.stride);
+    });
 }
 
 }  // namespace

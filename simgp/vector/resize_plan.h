@@ -19,16 +19,6 @@ inline constexpr int group_lanes = window_bytes / 2;
 // Narrowed, the lanes of a step are in order.
 inline constexpr bool in_order_when_narrow = windows == blocks;
 
-// Of a step, the lanes that are planned at once: eight, from lane 8 k on. Their pairs lie in vector v,
-// from byte `at` on, which is in window j.
-struct pairs_place {
-    int v, j, at;
-    explicit pairs_place(int k)
-        : v(8 * k / group_lanes % 2),
-          j(8 * k / group_lanes / 2),
-          at(j * window_bytes + 16 * k % window_bytes) {}
-};
-
 // A step whose groups of lanes take W windows each.
 template <int W>
 struct step_plan {
@@ -93,19 +83,31 @@ inline int32_t begin_of_step(const resize_strip &s, int32_t step) {
     return step + 1 < s.steps ? step * bytes : s.last;
 }
 
-// Eight lanes are planned at once, in vectors of the compiler's, of which two are needed where they
-// have 16 bytes: there is a plan for every strip, and of a small picture it is a good part of the
-// work.
-using plan_vector = int32_t __attribute__((vector_size(bytes < 32 ? 16 : 32)));
+// Eight lanes are planned at once, or 16, in vectors of the compiler's, of which two are needed where
+// they have 16 bytes: there is a plan for every strip, and of a small picture it is a good part of
+// the work.
+inline constexpr int planned_lanes = bytes < 64 ? 8 : 16;
+using plan_vector = int32_t __attribute__((vector_size(bytes)));
 using unsigned_plan_vector = uint32_t __attribute__((vector_size(sizeof(plan_vector))));
 using plan_pairs = uint16_t __attribute__((vector_size(sizeof(plan_vector) / 2)));
-inline constexpr int plan_parts = 32 / sizeof(plan_vector);
+inline constexpr int plan_parts = planned_lanes * int(sizeof(int32_t)) / bytes;
+
+// Where the pairs of the lanes lie that are planned in turn k of a step: in vector v, from byte `at`
+// on, which is in window j.
+struct planned_place {
+    unsigned v, j, at;
+    explicit planned_place(unsigned k)
+        : v(planned_lanes * k / group_lanes % 2),
+          j(planned_lanes * k / group_lanes / 2),
+          at(j * window_bytes + 2 * planned_lanes * k % window_bytes) {}
+};
+inline constexpr unsigned planned_turns = bytes / planned_lanes;
 
 // Bytes low[0], high[0], low[1], ... of numbers 0 ... 255.
 [[gnu::always_inline]] inline plan_pairs pairs_of(const plan_vector &low, const plan_vector &high) {
     return __builtin_convertvector(low | high << 8, plan_pairs);
 }
-// Those of part h of eight.
+// Those of part h of the lanes.
 [[gnu::always_inline]] inline void put_pairs(uint8_t *to, int h, const plan_pairs &pairs) {
     memcpy(to + h * int(sizeof pairs), &pairs, sizeof pairs);
 }
@@ -117,12 +119,12 @@ struct plan_kind {
 
 // Pixel and channel of the lanes that follow one of channel k of its pixel, of C bytes.
 struct following_lanes {
-    alignas(32) int32_t pixel[10][8], channel[10][8];
+    alignas(bytes) int32_t pixel[10][planned_lanes], channel[10][planned_lanes];
     static constexpr int row(int C, int k) { return C * (C - 1) / 2 + k; }
     constexpr following_lanes() : pixel(), channel() {
         for (int C = 1; C <= 4; C++)
             for (int k = 0; k < C; k++)
-                for (int i = 0; i < 8; i++) {
+                for (int i = 0; i < planned_lanes; i++) {
                     pixel[row(C, k)][i] = (k + i) / C;
                     channel[row(C, k)][i] = (k + i) % C;
                 }
@@ -130,10 +132,9 @@ struct following_lanes {
 };
 static constexpr following_lanes following{};
 
-// Eight lanes: the bytes of the row that they need, those of q behind those of p, and their phases.
-struct eight_lanes {
+// The bytes of the row that some lanes need, those of q behind those of p, and their phases.
+struct some_lanes {
     plan_vector p[plan_parts], apart[plan_parts], phase[plan_parts];
-    int32_t first;  // the lowest of the bytes
 
     // The weights of p and q, 8 * scale together.
     [[gnu::always_inline]] void put_weights(uint8_t *to, int scale) const {
@@ -147,41 +148,48 @@ class lanes_in_turn {
   public:
     [[gnu::always_inline]] lanes_in_turn(const resize_strip &s, int32_t size)
         : C_(size),
-          ahead_(8 / size),
+          ahead_(planned_lanes / size),
           pitch_(size << s.shift),
           origin_(size * s.first),
           first_column_(s.x),
           last_column_(s.x + s.columns - 1),
-          step_(s.step) {}
+          reach_(s.mirrored ? (s.shared ? 2 : 1) * group_lanes / size - 1 : 0),
+          step_(s.mirrored ? 0 - s.step : s.step),
+          begin_(s.mirrored ? uint32_t(first_column_ + last_column_) * s.step : 0) {}
 
     [[gnu::always_inline]] void begin(int32_t lane) {
         column_ = first_column_ + lane / C_;
         k_ = lane % C_;
     }
+    // The lowest of the bytes that a group needs which begins here: that of the first lane, or channel 0
+    // of the next pixel where that lies before it. Mirrored, that of the last pixel of the group, or of
+    // two groups that share a window.
+    [[gnu::always_inline]] int32_t first_byte() const {
+        const int32_t first = byte(column_ + reach_) + k_;
+        if (k_ == 0) return first;
+        const int32_t second = byte(column_ + 1);
+        return second < first ? second : first;
+    }
     // Columns behind the last one stand for that.
-    [[gnu::always_inline]] eight_lanes next() {
-        eight_lanes l;
+    [[gnu::always_inline]] some_lanes next() {
+        some_lanes l;
         const int row = following_lanes::row(C_, k_);
         for (int h = 0; h < plan_parts; h++) {
             plan_vector x, channel;
-            memcpy(&x, following.pixel[row] + 8 / plan_parts * h, sizeof x);
-            memcpy(&channel, following.channel[row] + 8 / plan_parts * h, sizeof channel);
+            memcpy(&x, following.pixel[row] + planned_lanes / plan_parts * h, sizeof x);
+            memcpy(&channel, following.channel[row] + planned_lanes / plan_parts * h,
+                   sizeof channel);
             x += column_;
             const plan_vector inside = x < last_column_;
             x = (x & inside) | (last_column_ & ~inside);
-            const plan_vector eighths = (plan_vector)((unsigned_plan_vector)x * step_) >> 15;
+            const plan_vector eighths =
+                (plan_vector)((unsigned_plan_vector)x * step_ + begin_) >> 15;
             l.phase[h] = eighths & 7;
             l.p[h] = (eighths >> 3) * pitch_ + (channel - origin_);
             l.apart[h] = (l.phase[h] != 0) & pitch_;
         }
-        // That of the first lane, or channel 0 of the next pixel where that lies before it.
-        l.first = byte(column_) + k_;
-        if (k_ > 0) {
-            const int32_t second = byte(column_ + 1);
-            l.first = second < l.first ? second : l.first;
-        }
         column_ += ahead_;
-        if (C_ == 3 && (k_ += 2) >= 3) {
+        if (C_ == 3 && (k_ += planned_lanes % 3) >= 3) {
             k_ -= 3;
             column_++;
         }
@@ -191,11 +199,11 @@ class lanes_in_turn {
   private:
     int32_t byte(int32_t x) const {
         x = x < last_column_ ? x : last_column_;
-        return (int32_t(uint32_t(x) * step_) >> 18) * pitch_ - origin_;
+        return (int32_t(uint32_t(x) * step_ + begin_) >> 18) * pitch_ - origin_;
     }
 
-    const int32_t C_, ahead_, pitch_, origin_, first_column_, last_column_;
-    const uint32_t step_;
+    const int32_t C_, ahead_, pitch_, origin_, first_column_, last_column_, reach_;
+    const uint32_t step_, begin_;
     int32_t column_ = 0, k_ = 0;
 };
 
@@ -207,11 +215,12 @@ struct bytes_in_order {
 };
 static constexpr bytes_in_order in_order{};
 
-// Eight lanes of a group whose first byte is `first`. Returns whether their pairs lie in the row as
+// Some lanes of a group whose first byte is `first`. Returns whether their pairs lie in the row as
 // they are.
 template <int W>
-[[gnu::always_inline]] inline bool plan_eight(const eight_lanes &l, int32_t first, int32_t limit,
-                                              bool shared, step_plan<W> &p, const pairs_place &to) {
+[[gnu::always_inline]] inline bool plan_some(const some_lanes &l, int32_t first, int32_t limit,
+                                             bool shared, step_plan<W> &p,
+                                             const planned_place &to) {
     plan_pairs moved = {};
     for (int w = 0; w < W; w++) {
         const int32_t from = first + window_bytes * w;
@@ -230,15 +239,16 @@ template <int W>
             put_pairs(p.index[to.v][w] + to.at, h, index);
             if constexpr (W == 1) {
                 plan_pairs as_they_are;
-                memcpy(&as_they_are, in_order.at + to.at % window_bytes + 16 / plan_parts * h,
+                memcpy(&as_they_are, in_order.at + to.at % window_bytes + int(sizeof index) * h,
                        sizeof as_they_are);
                 moved |= index ^ as_they_are;
             }
         }
     }
-    uint64_t any[sizeof moved / 8];
-    memcpy(any, &moved, sizeof moved);
-    return W == 1 && (any[0] | any[sizeof moved / 8 - 1]) == 0;
+    uint64_t words[sizeof moved / 8], any = 0;
+    memcpy(words, &moved, sizeof moved);
+    for (const uint64_t word : words) any |= word;
+    return W == 1 && any == 0;
 }
 
 // A run of steps whose pairs lie in the row as they are, and end to end, is noted down: these need
@@ -257,12 +267,12 @@ static void plan_windows(resize_strip &s, plan_kind kind) {
         lanes.begin(begin_of_step(s, t));
         int32_t first = 0;
 #pragma GCC unroll 1
-        for (int k = 0; k < 2 * blocks; k++) {
-            const eight_lanes l = lanes.next();
-            const pairs_place to(k);
-            if (8 * k % group_lanes == 0) first = l.first;
+        for (unsigned k = 0; k < planned_turns; k++) {
+            const planned_place to(k);
+            if (planned_lanes * k % group_lanes == 0) first = lanes.first_byte();
+            const some_lanes l = lanes.next();
             l.put_weights(p.weight[to.v] + to.at, kind.scale);
-            direct &= plan_eight(l, first, limit, shared, p, to);
+            direct &= plan_some(l, first, limit, shared, p, to);
         }
         for (int j = 0; direct && j < windows; j++)
             for (int v = 0; v < 2; v++)
@@ -287,15 +297,15 @@ static void plan_far(resize_strip &s, plan_kind kind) {
     for (int32_t t = 0; t < s.steps; t++) {
         lanes.begin(begin_of_step(s, t));
 #pragma GCC unroll 1
-        for (int k = 0; k < 2 * blocks; k++) {
-            const pairs_place to(k);
-            const eight_lanes l = lanes.next();
+        for (unsigned k = 0; k < planned_turns; k++) {
+            const planned_place to(k);
+            const some_lanes l = lanes.next();
             l.put_weights(plan[t].weight[to.v] + to.at, kind.scale);
-            int32_t *const at = plan[t].at + to.v * bytes + to.at;
-            int32_t p[8], apart[8];
+            int32_t *const at = plan[t].at + to.v * unsigned(bytes) + to.at;
+            int32_t p[planned_lanes], apart[planned_lanes];
             memcpy(p, l.p, sizeof p);
             memcpy(apart, l.apart, sizeof apart);
-            for (int i = 0; i < 8; i++) {
+            for (int i = 0; i < planned_lanes; i++) {
                 at[2 * i] = p[i];
                 at[2 * i + 1] = p[i] + apart[i];
             }

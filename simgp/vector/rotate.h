@@ -142,6 +142,8 @@ struct transposition {
             // With its size known, the compiler unrolls the block.
             if (columns == side && rows == side)
                 squares<across, down>(src, src_stride, dst, dst_stride, side, side, next);
+            else if (S == sample_kind::bytes && columns == side && rows == side / 2)
+                squares<across, down / 2>(src, src_stride, dst, dst_stride, side, side / 2, 0);
             else
                 squares<across, down>(src, src_stride, dst, dst_stride, columns, rows, 0);
         }
