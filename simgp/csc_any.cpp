@@ -392,8 +392,10 @@ void yuv_to_rgb_pictures(const job &j) {
         const planar_band p = read_band(j, b, strip);
         uint8_t *const dst = out.line(b.y) + b.x * j.to.bytes[0];
         const ptrdiff_t second = b.rows - 1;
-        convert_line(line_rows(what, b.width),
-                     {{p.y[0], p.y[second]}, p.u[0], p.v[0], {dst, dst + second * out.stride}});
+        const line_rows rows(what, b.width);
+        convert_line(
+            rows,
+            rows.at({{p.y[0], p.y[second]}, p.u[0], p.v[0], {dst, dst + second * out.stride}}));
     });
 }
 

@@ -56,6 +56,8 @@ struct line_rows {
     ptrdiff_t least, width;  // pixels that the rows take at least, and pixels of a line
 
     line_rows(const rgb_from_yuv &of, ptrdiff_t line_width);
+    // Lines at a time, with the pixels that rows take of them.
+    lines_to_rgb at(const line_to_rgb &l) const { return {l, whole(), 1, 0, 0, 0, 0, what.how}; }
     // The pixels of a line that rows take; what is left is less than a vector.
     ptrdiff_t whole() const {
         const bool pairs = least > 1 && chroma_is_shared(what.layout);
@@ -64,8 +66,12 @@ struct line_rows {
     }
 };
 
-// Converts a line, or a pair of them, of any width.
-void convert_line(const line_rows &r, const line_to_rgb &l);
+// Converts a line, or a pair of them, of any width; l is r.at(...).
+void convert_rest(const line_rows &r, const line_to_rgb &l);
+inline void convert_line(const line_rows &r, const lines_to_rgb &l) {
+    if (l.width > 0) r.rows(l);
+    if (l.width < r.width) convert_rest(r, l);
+}
 
 // Converts rows from top to bottom, one by one or in pairs. Row y of pairs takes chroma line
 // (y + lead) >> 1.
@@ -73,15 +79,20 @@ template <class Luma, class U, class V>
 void walk_rows(const line_rows &rows, Luma &&luma, U &&u, V &&v, const lines &dst, ptrdiff_t height,
                int lead) {
     const bool two = rows.what.two_rows;
+    // The pointers are stored one by one, as the row reads them: it would wait for copies of them.
+    lines_to_rgb l = rows.at({});
     for (ptrdiff_t y = 0; y < height;) {
         const ptrdiff_t chroma = two ? (y + lead) >> 1 : y;
         // The row below, or the row again where it has its chroma line to itself.
         const bool pair = two && y + 1 < height && (y + 1 + lead) >> 1 == chroma;
         const ptrdiff_t below = y + int(pair);
-        const uint8_t *const first = luma.fetch(y), *const second = luma.fetch(below);
-        convert_line(
-            rows,
-            {{first, second}, u.fetch(chroma), v.fetch(chroma), {dst.line(y), dst.line(below)}});
+        l.y[0] = luma.fetch(y);
+        l.y[1] = luma.fetch(below);
+        l.u = u.fetch(chroma);
+        l.v = v.fetch(chroma);
+        l.dst[0] = dst.line(y);
+        l.dst[1] = dst.line(below);
+        convert_line(rows, l);
         y = below + 1;
     }
 }

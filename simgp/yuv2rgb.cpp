@@ -79,13 +79,6 @@ void convert_column(const planes_to_rgb &p, const column &c, ptrdiff_t first, pt
     scatter_column(at, p, c, first, count);
 }
 
-// What is left of a line, of one row at a time.
-void convert_rest(const line_rows &r, const line_to_rgb &l, int row) {
-    const column rest{r.whole(), r.width - r.whole()};
-    convert_column({r.what, {l.y[row], 0}, {l.u, 0}, {l.v, 0}, {l.dst[row], 0}, r.width, 2, 0},
-                   rest, 0, 1);
-}
-
 }  // namespace
 
 line_rows::line_rows(const rgb_from_yuv &of, ptrdiff_t line_width) : what(of), width(line_width) {
@@ -96,12 +89,12 @@ line_rows::line_rows(const rgb_from_yuv &of, ptrdiff_t line_width) : what(of), w
     least = halves ? live.vector / 2 : live.vector;
 }
 
-void convert_line(const line_rows &r, const line_to_rgb &l) {
-    const ptrdiff_t whole = r.whole();
-    if (whole > 0) r.rows({l, whole, 1, 0, 0, 0, 0, r.what.how});
-    if (whole == r.width) return;
-    convert_rest(r, l, 0);
-    if (l.y[1] != l.y[0]) convert_rest(r, l, 1);
+// A column of one line, for each row.
+void convert_rest(const line_rows &r, const line_to_rgb &l) {
+    const column rest{r.whole(), r.width - r.whole()};
+    for (int k = 0; k < (l.y[1] == l.y[0] ? 1 : 2); k++)
+        convert_column({r.what, {l.y[k], 0}, {l.u, 0}, {l.v, 0}, {l.dst[k], 0}, r.width, 2, 0},
+                       rest, 0, 1);
 }
 
 void convert_planes(const planes_to_rgb &p) {
@@ -137,7 +130,7 @@ void convert_planes(const planes_to_rgb &p) {
     const auto alone = [&](ptrdiff_t row, ptrdiff_t chroma) {
         const uint8_t *const y = p.y.line(row);
         uint8_t *const dst = p.dst.line(row);
-        convert_line(r, {{y, y}, p.u.line(chroma), p.v.line(chroma), {dst, dst}});
+        convert_line(r, r.at({{y, y}, p.u.line(chroma), p.v.line(chroma), {dst, dst}}));
     };
     if (p.lead) alone(0, 0);
     if ((p.height - p.lead) % at_once) alone(p.height - 1, p.lead + units);
