@@ -50,29 +50,31 @@ F *as(code address) {
 #define CALL(name, type, ...) \
     void name(code address, int n) { as<type>(address)(__VA_ARGS__); }
 
-constexpr yuv_to_rgb to_rgb_how{{298, 16, 409, -100, -208, 516}, false, false, true, false};
+constexpr yuv_to_rgb to_rgb_how{{298, 16, 409, 100, 208, 516}, false, false, {true, false}};
 constexpr rgb_weights to_yuv_how{{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false, false},
     to_yuv_means{{66, 129, 25}, {-38, -74, 112}, {112, -94, -18}, 16, false, true};
 constexpr repacking order{true, false, false};
 uint8_t *const channels[3] = {d, e, f};
 const uint8_t *const channels_in[3] = {a, b, c};
 
-CALL(call_row, yuv_to_rgb_row, a, b, c, d, n)
-CALL(call_pair, yuv_to_rgb_row_pair, a, a + second, b, c, d, d + second, n)
+#define LINE(second) \
+    { {{a, a + second}, b, c, {d, d + second}}, n, 1, 0, 0, 0, 0, &to_rgb_how }
+CALL(call_row, yuv_to_rgb_rows, LINE(0))
+CALL(call_pair, yuv_to_rgb_rows, LINE(second))
 CALL(call_to_yuv, rgb_to_yuv_row, a, d, e, f, n)
 CALL(call_rgb_to_rgb, rgb_to_rgb_row, a, d, n)
 CALL(call_pack, pack_rows, a, 0, b, 0, d, 0, n, 1)
 CALL(call_unpack, unpack_rows, a, 0, d, 0, e, 0, n, 1)
 CALL(call_dither, dither_row, a, b, c, d, n)
-CALL(call_any, any_to_rgb_row, to_rgb_how, a, b, c, d, n)
-CALL(call_any_pair, any_to_rgb_row_pair, to_rgb_how, a, a + second, b, c, d, d + second, n)
-CALL(call_any_to_grey, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, nullptr, nullptr, n)
-CALL(call_any_to_half, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, e, f, n)
-CALL(call_any_to_pairs, any_to_yuv_row, to_yuv_how, a, nullptr, d, nullptr, e, nullptr, n)
-CALL(call_any_to_means, any_to_yuv_row, to_yuv_means, a, a + second, d, d + second, e, nullptr, n)
+#define SAMPLES(u, v, rows) \
+    { a, second, d, second, u, 0, v, 0, n, rows, rows == 2 }
+CALL(call_any_to_grey, any_to_yuv_rows, to_yuv_how, SAMPLES(nullptr, nullptr, 1))
+CALL(call_any_to_half, any_to_yuv_rows, to_yuv_how, SAMPLES(e, f, 1))
+CALL(call_any_to_pairs, any_to_yuv_rows, to_yuv_how, SAMPLES(e, nullptr, 1))
+CALL(call_any_to_means, any_to_yuv_rows, to_yuv_means, SAMPLES(e, nullptr, 2))
 CALL(call_chroma, chroma_row, to_yuv_how, channels_in, d, e, n)
 CALL(call_split_pixels, split_pixels_row, a, channels, n)
-CALL(call_repack, repack_row, order, a, d, n)
+CALL(call_repack, repack_rows, order, {a, 0, d, 0, n, 1})
 CALL(call_join_groups, join_groups_row, a, b, c, d, n, true)
 #define SPLIT(v, shared, mean) \
     { a, second, d, second, e, second, v, second, n, 2, true, shared, mean }
@@ -169,9 +171,9 @@ void list_any(const any_rows &n, const any_rows &s) {
     for (size_t k = 0; k < size_t(pixel_kind::count); k++) {
         for (size_t l = 0; l < size_t(chroma_in::count); l++) {
             add(named("any %s to %s", chroma_ins[l], kinds[k]), n.to_rgb[l][k], s.to_rgb[l][k],
-                call_any);
+                call_row);
             add(named("any %s to %s, two", chroma_ins[l], kinds[k]), n.to_rgb_pair[l][k],
-                s.to_rgb_pair[l][k], call_any_pair, 2);
+                s.to_rgb_pair[l][k], call_pair, 2);
         }
         const auto to_yuv = [&](const char *to, auto call, int lines) {
             add(named(to, kinds[k]), n.to_yuv[k], s.to_yuv[k], call, lines);

@@ -61,6 +61,9 @@ set(SIMGP_AREAS
   simgp/yuv2rgb)
 # Areas whose rows gain nothing by -O3: their loops are written out, and it only makes copies of them.
 set(SIMGP_SMALL_AREAS simgp/any simgp/layout simgp/resize simgp/rgb2yuv simgp/yuv2rgb)
+# Areas whose rows go from line to line: GCC would keep the pointers of a line in vectors, and take them out
+# again one by one.
+set(SIMGP_AREAS_OF_LINES simgp/any simgp/yuv2rgb)
 set(area_macro "#define SIMGP_AREAS(X)")
 foreach(area IN LISTS SIMGP_AREAS)
   get_filename_component(stem ${area} NAME)
@@ -77,6 +80,9 @@ function(simgp_add_vector_unit name target area)
   target_compile_definitions(${name} PRIVATE SIMD_TARGET=${target} SIMD_LAYER="simd/${target}.h"
                                              SIMD_AREA="${family}/vector/${stem}.h")
   target_compile_options(${name} PRIVATE ${${target}_flags})
+  if(area IN_LIST SIMGP_AREAS_OF_LINES)
+    target_compile_options(${name} PRIVATE -fno-tree-slp-vectorize)
+  endif()
   if(area IN_LIST SIMGP_SMALL_AREAS)
     target_compile_options(${name} PRIVATE $<$<CONFIG:Release>:-O2>)
   endif()

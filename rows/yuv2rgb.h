@@ -6,15 +6,27 @@
 
 namespace simgp {
 
-// Converts `width` >= 1 pixels of a row. Pointers that the layout does not use may be null. The row
-// reads the samples of its pixels and writes the pixels, nothing else. dst may overlap y as far as
-// the pixels up to and including x lie on samples up to and including x only.
-using yuv_to_rgb_row = void(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
-                            ptrdiff_t width);
+// Where a row lies, or a pair of rows that share a line of chroma. The two of a pair may be one and the
+// same; a row alone is both.
+struct line_to_rgb {
+    const uint8_t *y[2], *u, *v;
+    uint8_t *dst[2];
+};
+// Rows or pairs. From each of them to the next, pointers move by their steps.
+struct yuv_to_rgb;
+struct lines_to_rgb : line_to_rgb {
+    ptrdiff_t width, count = 1;  // pixels of a row, and rows or pairs, at least one
+    ptrdiff_t y_step = 0, u_step = 0, v_step = 0, dst_step = 0;
+    const yuv_to_rgb *how = nullptr;  // what rows of rows/any.h ask for
+};
 
-// The same for two rows with the same chroma, which may be one and the same row.
-using yuv_to_rgb_row_pair = void(const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
-                                 const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width);
+// Converts them, all in one call: in small pictures, calls and the constants of a loop are seen. Scalar rows
+// take any width. Vector rows take at least a vector of pixels, or half of one (see yuv2rgb_rows), and an even
+// number where two pixels share chroma; convert_line in simgp/walk.h sees to the others. Pointers that the
+// layout does not use may be null, if their steps are 0. Reads the samples of the pixels and writes the
+// pixels, nothing else. dst[k] may overlap y[k] as far as the pixels up to and including x lie on samples up
+// to and including x only.
+using yuv_to_rgb_rows = void(const lines_to_rgb &l);
 
 // With the coefficients of 8 fractional bits, or the coarse ones of 6.
 enum class yuv_matrix : uint8_t { fine, coarse, count };
@@ -23,10 +35,12 @@ enum class yuv_matrix : uint8_t { fine, coarse, count };
 // serves two; null where no kernel needs it. SIMGP_YUV_TO_RGB_KERNELS and
 // SIMGP_PACKED_TO_RGB_KERNELS tell which are needed.
 struct yuv2rgb_rows {
-    yuv_to_rgb_row
+    yuv_to_rgb_rows
         *row[size_t(yuv_matrix::count)][size_t(yuv_layout::count)][size_t(rgb_packing::count)];
-    yuv_to_rgb_row_pair
+    yuv_to_rgb_rows
         *pair[size_t(yuv_matrix::count)][size_t(yuv_layout::count)][size_t(rgb_packing::count)];
+    // Whether pairs, here and in rows/any.h, need but half a vector of pixels where two pixels share chroma.
+    bool halves;
 };
 
 constexpr bool serves_two_rows(const format &yuv) { return yuv.y_shift[yuv.u < 0 ? 0 : yuv.u]; }

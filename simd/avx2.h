@@ -16,6 +16,7 @@ inline constexpr int blocks = 2;
 inline constexpr bool moves_pointers = false;
 inline constexpr int window_bytes = 16;
 inline constexpr int windows = bytes / window_bytes;
+inline constexpr bool pairs_in_halves = true;
 
 // One register type stands for all lanes.
 using u8v = __m256i;
@@ -38,23 +39,26 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_unpacklo_epi8(a, b)),
                                    _mm_unpackhi_epi8(a, b), 1);
 }
+inline u8v load_halves(const uint8_t *p, const uint8_t *q) {
+    const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i *>(p));
+    const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i *>(q));
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(a), b, 1);
+}
+inline u8v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
+    const __m128i a = _mm_loadl_epi64(reinterpret_cast<const __m128i *>(p));
+    const __m128i b = _mm_loadl_epi64(reinterpret_cast<const __m128i *>(q));
+    return _mm256_broadcastsi128_si256(_mm_unpacklo_epi8(a, b));
+}
 
-inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
-    const auto block = [=](int j) {
-        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + j * step));
-    };
-    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
-}
+inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) { return load_halves(p, p + step); }
 inline u8v gather_windows(const uint8_t *p, const int32_t *at) {
-    const auto block = [=](int j) {
-        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + at[j]));
-    };
-    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
+    return load_halves(p + at[0], p + at[1]);
 }
-inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
+inline void store_halves(uint8_t *p, uint8_t *q, u8v v) {
     _mm_storeu_si128(reinterpret_cast<__m128i *>(p), _mm256_castsi256_si128(v));
-    _mm_storeu_si128(reinterpret_cast<__m128i *>(p + step), _mm256_extracti128_si256(v, 1));
+    _mm_storeu_si128(reinterpret_cast<__m128i *>(q), _mm256_extracti128_si256(v, 1));
 }
+inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) { store_halves(p, p + step, v); }
 
 inline u8v set_u8(uint8_t x) { return _mm256_set1_epi8(static_cast<char>(x)); }
 inline u16v set_u16(uint16_t x) { return _mm256_set1_epi16(static_cast<int16_t>(x)); }
@@ -291,19 +295,18 @@ inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     v = _mm256_shuffle_epi8(
         v, _mm256_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15,  //
                             0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15));
-    v = _mm256_permute4x64_epi64(v, 0xD8);
-    _mm_storeu_si128(reinterpret_cast<__m128i *>(p), _mm256_castsi256_si128(v));
-    _mm_storeu_si128(reinterpret_cast<__m128i *>(q), _mm256_extracti128_si256(v, 1));
+    store_halves(p, q, _mm256_permute4x64_epi64(v, 0xD8));
 }
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm256_unpacklo_epi8(even, odd));
     store(p + bytes, _mm256_unpackhi_epi8(even, odd));
 }
-inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+inline void store_zip16(uint8_t *p, uint8_t *q, u16v even, u16v odd) {
     store(p, _mm256_unpacklo_epi16(even, odd));
-    store(p + bytes, _mm256_unpackhi_epi16(even, odd));
+    store(q, _mm256_unpackhi_epi16(even, odd));
 }
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) { store_zip16(p, p + bytes, even, odd); }
 
 // Each vector is shuffled once, so that its bytes stand where any of the three outputs wants them,
 // and each output blended from the three. A byte i of a block goes to place 3i + k of the 48 output
@@ -344,8 +347,8 @@ struct zip3_index {
 };
 inline constexpr zip3_index zip3[2] = {zip3_index(false), zip3_index(true)};
 template <int A, int B, int C>
-inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd, bool exchange = false) {
+inline void store_narrow_zip3(uint8_t *p, uint8_t *q, s16v a_even, s16v a_odd, s16v b_even,
+                              s16v b_odd, s16v c_even, s16v c_odd, bool exchange = false) {
     static_assert(limits::narrowing_shift<C>);
     const zip3_index &index = zip3[exchange];
     const __m256i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
@@ -357,17 +360,25 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
         return _mm256_or_si256(_mm256_shuffle_epi8(ab, load(index.ab[k])),
                                _mm256_shuffle_epi8(c, load(index.c[k])));
     };
-    store_blocks(p, 48, part(ab_lo, 0));
-    store_blocks(p + 16, 48, part(ab_mid, 1));
-    store_blocks(p + 32, 48, part(ab_hi, 2));
+    store_halves(p, q, part(ab_lo, 0));
+    store_halves(p + 16, q + 16, part(ab_mid, 1));
+    store_halves(p + 32, q + 32, part(ab_hi, 2));
 }
-inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    store_narrow_zip3<A, B, C>(p, p + 48, a_even, a_odd, b_even, b_odd, c_even, c_odd, exchange);
+}
+inline void store_zip4(uint8_t *p, uint8_t *q, u8v a, u8v b, u8v c, u8v d) {
     const __m256i ab_lo = _mm256_unpacklo_epi8(a, b), ab_hi = _mm256_unpackhi_epi8(a, b);
     const __m256i cd_lo = _mm256_unpacklo_epi8(c, d), cd_hi = _mm256_unpackhi_epi8(c, d);
     store(p, _mm256_unpacklo_epi16(ab_lo, cd_lo));
     store(p + bytes, _mm256_unpackhi_epi16(ab_lo, cd_lo));
-    store(p + 2 * bytes, _mm256_unpacklo_epi16(ab_hi, cd_hi));
-    store(p + 3 * bytes, _mm256_unpackhi_epi16(ab_hi, cd_hi));
+    store(q, _mm256_unpacklo_epi16(ab_hi, cd_hi));
+    store(q + bytes, _mm256_unpackhi_epi16(ab_hi, cd_hi));
+}
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    store_zip4(p, p + 2 * bytes, a, b, c, d);
 }
 
 inline u8v join_high(u16v a, u16v b) {

@@ -16,6 +16,7 @@ inline constexpr int blocks = 4;
 inline constexpr bool moves_pointers = false;
 inline constexpr int window_bytes = bytes;
 inline constexpr int windows = 1;
+inline constexpr bool pairs_in_halves = true;
 
 // One register type stands for all lanes.
 using u8v = __m512i;
@@ -37,6 +38,17 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
         return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i *>(from)));
     };
     return _mm512_or_si512(widen(p), _mm512_slli_epi16(widen(q), 8));
+}
+inline u8v load_halves(const uint8_t *p, const uint8_t *q) {
+    const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i *>(p));
+    const __m256i b = _mm256_loadu_si256(reinterpret_cast<const __m256i *>(q));
+    return _mm512_inserti64x4(_mm512_castsi256_si512(a), b, 1);
+}
+inline u8v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
+    const auto widen = [](const uint8_t *from) {
+        return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i *>(from)));
+    };
+    return _mm512_broadcast_i64x4(_mm256_or_si256(widen(p), _mm256_slli_epi16(widen(q), 8)));
 }
 
 // Inserted from memory, a block needs no permutation: hence one after the other.
@@ -61,6 +73,11 @@ inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
     put(1, _mm256_extracti128_si256(low, 1));
     put(2, _mm256_castsi256_si128(high));
     put(3, _mm256_extracti128_si256(high, 1));
+}
+
+inline void store_halves(uint8_t *p, uint8_t *q, u8v v) {
+    _mm256_storeu_si256(reinterpret_cast<__m256i *>(p), _mm512_castsi512_si256(v));
+    _mm256_storeu_si256(reinterpret_cast<__m256i *>(q), _mm512_extracti64x4_epi64(v, 1));
 }
 
 inline u8v set_u8(uint8_t x) { return _mm512_set1_epi8(static_cast<char>(x)); }
@@ -314,19 +331,18 @@ inline pair_u8 load_split_by4(const uint8_t *p) {
     return {_mm512_unpacklo_epi64(a, b), _mm512_unpackhi_epi64(a, b)};
 }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
-    v = _mm512_permutexvar_epi8(load(split_order.natural), v);
-    _mm256_storeu_si256(reinterpret_cast<__m256i *>(p), _mm512_castsi512_si256(v));
-    _mm256_storeu_si256(reinterpret_cast<__m256i *>(q), _mm512_extracti64x4_epi64(v, 1));
+    store_halves(p, q, _mm512_permutexvar_epi8(load(split_order.natural), v));
 }
 
 inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm512_unpacklo_epi8(even, odd));
     store(p + bytes, _mm512_unpackhi_epi8(even, odd));
 }
-inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+inline void store_zip16(uint8_t *p, uint8_t *q, u16v even, u16v odd) {
     store(p, _mm512_unpacklo_epi16(even, odd));
-    store(p + bytes, _mm512_unpackhi_epi16(even, odd));
+    store(q, _mm512_unpackhi_epi16(even, odd));
 }
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) { store_zip16(p, p + bytes, even, odd); }
 
 // Byte q of the 192 is byte q / 3 of a, b or c, as q modulo 3 is 0, 1 or 2: one index vector for
 // each output serves all three inputs.
@@ -342,7 +358,9 @@ struct zip3_index {
     }
 };
 inline constexpr zip3_index zip3;
-inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = zip3.natural) {
+// Stores what is given the three parts.
+template <class Put>
+inline void zip3_parts(u8v a, u8v b, u8v c, const uint8_t *places, Put put) {
     constexpr __mmask64 every_third = 0x9249249249249249;  // bits 0, 3, ... 63
     constexpr __mmask64 second[3] = {every_third << 1, every_third, every_third >> 1};
     constexpr __mmask64 third[3] = {every_third << 2, every_third << 1, every_third};
@@ -351,11 +369,14 @@ inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = 
         __m512i v = _mm512_permutexvar_epi8(index, a);
         v = _mm512_mask_permutexvar_epi8(v, second[k], index, b);
         v = _mm512_mask_permutexvar_epi8(v, third[k], index, c);
-        store(p + bytes * k, v);
+        put(k, v);
     };
     part(0);
     part(1);
     part(2);
+}
+inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c, const uint8_t *places = zip3.natural) {
+    zip3_parts(a, b, c, places, [&](int k, __m512i v) { store(p + bytes * k, v); });
 }
 
 template <int N>
@@ -369,13 +390,27 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
     const __m512i a = pack<A>(a_even, a_odd), c = pack<C>(c_even, c_odd);
     store_zip3(p, exchange ? c : a, pack<B>(b_even, b_odd), exchange ? a : c, zip3.packed);
 }
-inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, uint8_t *q, s16v a_even, s16v a_odd, s16v b_even,
+                              s16v b_odd, s16v c_even, s16v c_odd, bool exchange = false) {
+    const __m512i a = pack<A>(a_even, a_odd), c = pack<C>(c_even, c_odd);
+    zip3_parts(exchange ? c : a, pack<B>(b_even, b_odd), exchange ? a : c, zip3.packed,
+               [&](int k, __m512i v) {
+                   if (k == 0) store(p, v);
+                   if (k == 1) store_halves(p + bytes, q, v);
+                   if (k == 2) store(q + bytes / 2, v);
+               });
+}
+inline void store_zip4(uint8_t *p, uint8_t *q, u8v a, u8v b, u8v c, u8v d) {
     const __m512i ab_lo = _mm512_unpacklo_epi8(a, b), ab_hi = _mm512_unpackhi_epi8(a, b);
     const __m512i cd_lo = _mm512_unpacklo_epi8(c, d), cd_hi = _mm512_unpackhi_epi8(c, d);
     store(p, _mm512_unpacklo_epi16(ab_lo, cd_lo));
     store(p + bytes, _mm512_unpackhi_epi16(ab_lo, cd_lo));
-    store(p + 2 * bytes, _mm512_unpacklo_epi16(ab_hi, cd_hi));
-    store(p + 3 * bytes, _mm512_unpackhi_epi16(ab_hi, cd_hi));
+    store(q, _mm512_unpacklo_epi16(ab_hi, cd_hi));
+    store(q + bytes, _mm512_unpackhi_epi16(ab_hi, cd_hi));
+}
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    store_zip4(p, p + 2 * bytes, a, b, c, d);
 }
 
 inline u8v join_high(u16v a, u16v b) {

@@ -33,6 +33,7 @@ inline constexpr bool moves_pointers = true;
 // What bytes can be picked from: a block, or a vector of 64 bytes.
 inline constexpr int window_bytes = bytes == 64 ? 64 : 16;
 inline constexpr int windows = bytes / window_bytes;
+inline constexpr bool pairs_in_halves = true;
 
 template <typename T>
 struct vec {
@@ -313,6 +314,17 @@ using pairs_v = u8v;
 using pair_bytes = u16v;
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+// From bytes / 2 bytes at p, and then as many at q.
+inline pairs_v load_pair_halves(const uint8_t *p, const uint8_t *q) {
+    return make<u8v>([&](int i) { return i < bytes / 2 ? p[i] : q[i - bytes / 2]; });
+}
+// From bytes / 4 bytes at p, the even ones, and as many at q; all of them twice.
+inline pairs_v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
+    return make<u8v>([&](int i) {
+        const uint8_t *from = i & 1 ? q : p;
+        return from[i % (bytes / 2) / 2];
+    });
+}
 // The even bytes of u and v as pairs, and the odd ones.
 inline pairs_v pair_evens(pairs_v u, pairs_v v) {
     return make<u8v>([&](int i) { return (i & 1 ? v : u).lane[i / 2 * 2]; });
@@ -561,6 +573,28 @@ inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
         const int from = granule % blocks * 16 + granule / blocks * 4 + i % 4;
         for (int k = 0; k < 4; k++) p[4 * i + k] = v[k].lane[from];
     }
+}
+
+// The same, the first half of what is stored at p and the second at q.
+inline void store_zip16(uint8_t *p, uint8_t *q, u16v even, u16v odd) {
+    uint8_t all[2 * bytes];
+    store_zip16(all, even, odd);
+    memcpy(p, all, bytes);
+    memcpy(q, all + bytes, bytes);
+}
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, uint8_t *q, s16v a_even, s16v a_odd, s16v b_even,
+                              s16v b_odd, s16v c_even, s16v c_odd, bool exchange = false) {
+    uint8_t all[3 * bytes];
+    store_narrow_zip3<A, B, C>(all, a_even, a_odd, b_even, b_odd, c_even, c_odd, exchange);
+    memcpy(p, all, 3 * bytes / 2);
+    memcpy(q, all + 3 * bytes / 2, 3 * bytes / 2);
+}
+inline void store_zip4(uint8_t *p, uint8_t *q, u8v a, u8v b, u8v c, u8v d) {
+    uint8_t all[4 * bytes];
+    store_zip4(all, a, b, c, d);
+    memcpy(p, all, 2 * bytes);
+    memcpy(q, all + 2 * bytes, 2 * bytes);
 }
 
 // High bytes of 16-bit lanes: those of a and b in turn; those of a alone, bytes / 2, to memory.

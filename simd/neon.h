@@ -6,6 +6,7 @@
 #include <arm_neon.h>
 #include <stddef.h>
 #include <stdint.h>
+#include <string.h>
 
 #include "simd/limits.h"
 
@@ -16,6 +17,8 @@ inline constexpr int blocks = 1;
 inline constexpr bool moves_pointers = true;
 inline constexpr int window_bytes = 16;
 inline constexpr int windows = bytes / window_bytes;
+// On 32-bit ARM, where the library is to be smallest, narrow pictures are left to columns.
+inline constexpr bool pairs_in_halves = sizeof(void *) == 8;
 
 using u8v = uint8x16_t;
 using u16v = uint16x8_t;
@@ -177,6 +180,16 @@ inline pairs_v load_pairs(const uint8_t *p) {
     return {v.val[0], v.val[1]};
 }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return {vld1_u8(p), vld1_u8(q)}; }
+inline pairs_v load_pair_halves(const uint8_t *p, const uint8_t *q) {
+    const uint8x8x2_t v = vuzp_u8(vld1_u8(p), vld1_u8(q));
+    return {v.val[0], v.val[1]};
+}
+inline pairs_v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
+    uint32_t a, b;
+    memcpy(&a, p, sizeof a);
+    memcpy(&b, q, sizeof b);
+    return {vreinterpret_u8_u32(vdup_n_u32(a)), vreinterpret_u8_u32(vdup_n_u32(b))};
+}
 inline pairs_v pair_evens(pairs_v u, pairs_v v) { return {u.even, v.even}; }
 inline pairs_v pair_odds(pairs_v u, pairs_v v) { return {u.odd, v.odd}; }
 inline pair_bytes even(pairs_v v) { return v.even; }
@@ -351,11 +364,12 @@ inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     const uint8x16x2_t v = {{even, odd}};
     vst2q_u8(p, v);
 }
-inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+inline void store_zip16(uint8_t *p, uint8_t *q, u16v even, u16v odd) {
     const uint16x8x2_t zip = vzipq_u16(even, odd);
     vst1q_u8(p, as_u8(zip.val[0]));
-    vst1q_u8(p + bytes, as_u8(zip.val[1]));
+    vst1q_u8(q, as_u8(zip.val[1]));
 }
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) { store_zip16(p, p + bytes, even, odd); }
 inline void store_zip3(uint8_t *p, u8v a, u8v b, u8v c) {
     const uint8x16x3_t v = {{a, b, c}};
     vst3q_u8(p, v);
@@ -369,6 +383,22 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
 inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
     const uint8x16x4_t v = {{a, b, c, d}};
     vst4q_u8(p, v);
+}
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, uint8_t *q, s16v a_even, s16v a_odd, s16v b_even,
+                              s16v b_odd, s16v c_even, s16v c_odd, bool exchange = false) {
+    const u8v a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd),
+              c = narrow_join<C>(c_even, c_odd), first = exchange ? c : a, last = exchange ? a : c;
+    const uint8x8x3_t low = {{vget_low_u8(first), vget_low_u8(b), vget_low_u8(last)}};
+    const uint8x8x3_t high = {{vget_high_u8(first), vget_high_u8(b), vget_high_u8(last)}};
+    vst3_u8(p, low);
+    vst3_u8(q, high);
+}
+inline void store_zip4(uint8_t *p, uint8_t *q, u8v a, u8v b, u8v c, u8v d) {
+    const uint8x8x4_t low = {{vget_low_u8(a), vget_low_u8(b), vget_low_u8(c), vget_low_u8(d)}};
+    const uint8x8x4_t high = {{vget_high_u8(a), vget_high_u8(b), vget_high_u8(c), vget_high_u8(d)}};
+    vst4_u8(p, low);
+    vst4_u8(q, high);
 }
 
 inline u8v join_high(u16v a, u16v b) { return as_u8(vsriq_n_u16(b, a, 8)); }

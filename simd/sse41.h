@@ -6,6 +6,7 @@
 #include <smmintrin.h>
 #include <stddef.h>
 #include <stdint.h>
+#include <string.h>
 
 #include "simd/limits.h"
 
@@ -16,6 +17,7 @@ inline constexpr int blocks = 1;
 inline constexpr bool moves_pointers = false;
 inline constexpr int window_bytes = 16;
 inline constexpr int windows = bytes / window_bytes;
+inline constexpr bool pairs_in_halves = true;
 
 // One register type stands for all lanes.
 using u8v = __m128i;
@@ -33,6 +35,17 @@ inline void store(uint8_t *p, u8v v) { _mm_storeu_si128(reinterpret_cast<__m128i
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return _mm_unpacklo_epi8(_mm_loadl_epi64(reinterpret_cast<const __m128i *>(p)),
                              _mm_loadl_epi64(reinterpret_cast<const __m128i *>(q)));
+}
+inline u8v load_halves(const uint8_t *p, const uint8_t *q) {
+    return _mm_unpacklo_epi64(_mm_loadl_epi64(reinterpret_cast<const __m128i *>(p)),
+                              _mm_loadl_epi64(reinterpret_cast<const __m128i *>(q)));
+}
+inline u8v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
+    int32_t a, b;
+    memcpy(&a, p, sizeof a);
+    memcpy(&b, q, sizeof b);
+    const __m128i zip = _mm_unpacklo_epi8(_mm_cvtsi32_si128(a), _mm_cvtsi32_si128(b));
+    return _mm_unpacklo_epi64(zip, zip);
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
@@ -252,10 +265,11 @@ inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     store(p, _mm_unpacklo_epi8(even, odd));
     store(p + bytes, _mm_unpackhi_epi8(even, odd));
 }
-inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
+inline void store_zip16(uint8_t *p, uint8_t *q, u16v even, u16v odd) {
     store(p, _mm_unpacklo_epi16(even, odd));
-    store(p + bytes, _mm_unpackhi_epi16(even, odd));
+    store(q, _mm_unpackhi_epi16(even, odd));
 }
+inline void store_zip16(uint8_t *p, u16v even, u16v odd) { store_zip16(p, p + bytes, even, odd); }
 
 // Each vector is shuffled once, so that its bytes stand where any of the three outputs wants them,
 // and each output blended from the three. A byte i of a block goes to place 3i + k of the 48 output
@@ -290,9 +304,10 @@ struct zip3_index {
     }
 };
 inline constexpr zip3_index zip3[2] = {zip3_index(false), zip3_index(true)};
-template <int A, int B, int C>
-inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
-                              s16v c_even, s16v c_odd, bool exchange = false) {
+// Stores what is given the three parts.
+template <int A, int B, int C, class Put>
+inline void narrow_zip3(s16v a_even, s16v a_odd, s16v b_even, s16v b_odd, s16v c_even, s16v c_odd,
+                        bool exchange, Put put) {
     static_assert(limits::narrowing_shift<C>);
     const zip3_index &index = zip3[exchange];
     const __m128i a = narrow_join<A>(a_even, a_odd), b = narrow_join<B>(b_even, b_odd);
@@ -303,17 +318,40 @@ inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, 
         return _mm_or_si128(_mm_shuffle_epi8(ab, load(index.ab[k])),
                             _mm_shuffle_epi8(c, load(index.c[k])));
     };
-    store(p, part(ab_lo, 0));
-    store(p + 16, part(ab_mid, 1));
-    store(p + 32, part(ab_hi, 2));
+    put(part(ab_lo, 0), part(ab_mid, 1), part(ab_hi, 2));
 }
-inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, s16v a_even, s16v a_odd, s16v b_even, s16v b_odd,
+                              s16v c_even, s16v c_odd, bool exchange = false) {
+    narrow_zip3<A, B, C>(a_even, a_odd, b_even, b_odd, c_even, c_odd, exchange,
+                         [&](__m128i first, __m128i mid, __m128i last) {
+                             store(p, first);
+                             store(p + 16, mid);
+                             store(p + 32, last);
+                         });
+}
+template <int A, int B, int C>
+inline void store_narrow_zip3(uint8_t *p, uint8_t *q, s16v a_even, s16v a_odd, s16v b_even,
+                              s16v b_odd, s16v c_even, s16v c_odd, bool exchange = false) {
+    narrow_zip3<A, B, C>(a_even, a_odd, b_even, b_odd, c_even, c_odd, exchange,
+                         [&](__m128i first, __m128i mid, __m128i last) {
+                             store(p, first);
+                             _mm_storel_epi64(reinterpret_cast<__m128i *>(p + 16), mid);
+                             _mm_storel_epi64(reinterpret_cast<__m128i *>(q),
+                                              _mm_srli_si128(mid, 8));
+                             store(q + 8, last);
+                         });
+}
+inline void store_zip4(uint8_t *p, uint8_t *q, u8v a, u8v b, u8v c, u8v d) {
     const __m128i ab_lo = _mm_unpacklo_epi8(a, b), ab_hi = _mm_unpackhi_epi8(a, b);
     const __m128i cd_lo = _mm_unpacklo_epi8(c, d), cd_hi = _mm_unpackhi_epi8(c, d);
     store(p, _mm_unpacklo_epi16(ab_lo, cd_lo));
     store(p + bytes, _mm_unpackhi_epi16(ab_lo, cd_lo));
-    store(p + 2 * bytes, _mm_unpacklo_epi16(ab_hi, cd_hi));
-    store(p + 3 * bytes, _mm_unpackhi_epi16(ab_hi, cd_hi));
+    store(q, _mm_unpacklo_epi16(ab_hi, cd_hi));
+    store(q + bytes, _mm_unpackhi_epi16(ab_hi, cd_hi));
+}
+inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
+    store_zip4(p, p + 2 * bytes, a, b, c, d);
 }
 
 inline u8v join_high(u16v a, u16v b) {

@@ -2,6 +2,7 @@
 // of each.
 //
 // Besides the vocabulary, a layer gives
+//   load_halves(p, q)    bytes / 2 bytes at p, then as many at q
 //   add_pairs(a, b)      16-bit lanes: the sums of two neighbours each, of a and of b, block by block
 //   pack_bytes(a, b)     signed 16-bit lanes to bytes, block by block
 //   even_dwords(a, b)    dwords 0 and 2 of each block of a, then of b; odd_dwords 1 and 3
@@ -18,6 +19,7 @@ inline void step_pointer(T *&) {}
 // Byte pairs are best left in vectors.
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+inline pairs_v load_pair_halves(const uint8_t *p, const uint8_t *q) { return load_halves(p, q); }
 inline pairs_v pair_evens(pairs_v u, pairs_v v) { return join(even(u), even(v)); }
 inline pairs_v pair_odds(pairs_v u, pairs_v v) { return join(odd(u), odd(v)); }
 inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }

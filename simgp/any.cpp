@@ -13,8 +13,8 @@ int clamp(int v) { return v < 0 ? 0 : v > 255 ? 255 : v; }
 // The bytes of a pixel of some kind.
 constexpr int size_of(pixel_kind kind) { return int(kind) + 2; }
 
-void write_pixel(pixel_kind kind, const yuv_to_rgb &how, uint8_t *p, const rgb &c) {
-    const int first = how.blue_first ? c.b : c.r, last = how.blue_first ? c.r : c.b;
+void write_pixel(pixel_kind kind, const rgb_order &order, uint8_t *p, const rgb &c) {
+    const int first = order.blue_first ? c.b : c.r, last = order.blue_first ? c.r : c.b;
     if (kind == pixel_kind::words) {
         const int word = first >> 3 << 11 | c.g >> 2 << 5 | last >> 3;
         p[0] = uint8_t(word);
@@ -22,8 +22,8 @@ void write_pixel(pixel_kind kind, const yuv_to_rgb &how, uint8_t *p, const rgb &
         return;
     }
     if (kind == pixel_kind::four) {
-        p[how.alpha_first ? 0 : 3] = 255;
-        p += how.alpha_first;
+        p[order.alpha_first ? 0 : 3] = 255;
+        p += order.alpha_first;
     }
     p[0] = uint8_t(first);
     p[1] = uint8_t(c.g);
@@ -48,19 +48,12 @@ yuv read_any(const yuv_to_rgb &how, const yuv_samples &s, ptrdiff_t x) {
 }
 
 template <chroma_in Layout, pixel_kind Kind>
-void any_to_rgb(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
+void any_to_rgb(const yuv_to_rgb *how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
                 uint8_t *dst, ptrdiff_t width) {
     const yuv_samples s{y, u, v, width};
     for (ptrdiff_t x = 0; x < width; x++)
-        write_pixel(Kind, how, dst + size_of(Kind) * x,
-                    from_yuv(how.weights, read_any<Layout>(how, s, x)));
-}
-
-template <chroma_in Layout, pixel_kind Kind>
-void any_to_rgb_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1, const uint8_t *u,
-                     const uint8_t *v, uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
-    any_to_rgb<Layout, Kind>(how, y0, u, v, dst0, width);
-    any_to_rgb<Layout, Kind>(how, y1, u, v, dst1, width);
+        write_pixel(Kind, how->pixels, dst + size_of(Kind) * x,
+                    from_yuv(how->weights, read_any<Layout>(*how, s, x)));
 }
 
 // The channels of a pixel in the order of memory.
@@ -86,9 +79,10 @@ uint8_t chroma_of(const int16_t (&w)[3], const channels &p) {
     return uint8_t(clamp(((dot(w, p) + 128) >> 8) + 128));
 }
 
+// Of a row, and of the one that shares its chroma, if that is not null.
 template <pixel_kind Kind>
-void any_to_yuv(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+void any_to_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
+                    uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
     const auto pixel = [&w](const uint8_t *src, ptrdiff_t x) {
         return read_channels<rgb_in(Kind)>(src + w.alpha_first, x);
     };
@@ -112,6 +106,18 @@ void any_to_yuv(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, 
     }
 }
 
+template <pixel_kind Kind>
+void any_to_yuv(const rgb_weights &w, const lines_to_yuv &l) {
+    for (ptrdiff_t row = 0, at = 0; row < l.rows; row += 1 + l.shared, at++) {
+        const bool two = l.shared && row + 1 < l.rows;
+        const uint8_t *const src = l.src + row * l.src_step;
+        uint8_t *const y = l.y + row * l.y_step;
+        any_to_yuv_row<Kind>(w, src, two ? src + l.src_step : nullptr, y,
+                             two ? y + l.y_step : nullptr, l.u ? l.u + at * l.u_step : nullptr,
+                             l.v ? l.v + at * l.v_step : nullptr, l.width);
+    }
+}
+
 void chroma(const rgb_weights &w, const uint8_t *const of[3], uint8_t *u, uint8_t *v,
             ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) {
@@ -131,8 +137,7 @@ void split_pixels(const uint8_t *src, uint8_t *const of[3], ptrdiff_t count) {
 
 // Channels stand in the order of memory here: r for the first, b for the last.
 template <pixel_kind From, pixel_kind To>
-void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
-    const yuv_to_rgb how{{}, false, false, order.exchange, order.to_alpha_first};
+void repack_row(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
     for (ptrdiff_t x = 0; x < count; x++) {
         const uint8_t *const p = src + size_of(From) * x;
         const bool skip = From == pixel_kind::four && order.from_alpha_first;
@@ -140,10 +145,15 @@ void repack(const repacking &order, const uint8_t *src, uint8_t *dst, ptrdiff_t 
                                ? read_channels<rgb_in::words>(p, 0)
                                : channels{{p[skip], p[skip + 1], p[skip + 2]}};
         uint8_t *const q = dst + size_of(To) * x;
-        write_pixel(To, how, q, {c.c[0], c.c[1], c.c[2]});
+        write_pixel(To, {order.exchange, order.to_alpha_first}, q, {c.c[0], c.c[1], c.c[2]});
         if (From == pixel_kind::four && To == pixel_kind::four)
             q[order.to_alpha_first ? 0 : 3] = p[order.from_alpha_first ? 0 : 3];
     }
+}
+template <pixel_kind From, pixel_kind To>
+void repack(const repacking &order, const lines_to_repack &l) {
+    for (ptrdiff_t y = 0; y < l.count; y++)
+        repack_row<From, To>(order, l.src + y * l.src_step, l.dst + y * l.dst_step, l.width);
 }
 
 void split_groups(const groups_split &s) {
@@ -199,8 +209,12 @@ void twice(const uint8_t *a, uint8_t *dst, ptrdiff_t count) {
 template <chroma_in Layout, pixel_kind Kind>
 void fill_to_rgb(any_rows &t) {
     const size_t l = size_t(Layout), k = size_t(Kind);
-    t.to_rgb[l][k] = any_to_rgb<Layout, Kind>;
-    t.to_rgb_pair[l][k] = any_to_rgb_pair<Layout, Kind>;
+    t.to_rgb[l][k] = [](const lines_to_rgb &lines) {
+        for_each_row(lines, false, any_to_rgb<Layout, Kind>);
+    };
+    t.to_rgb_pair[l][k] = [](const lines_to_rgb &lines) {
+        for_each_row(lines, true, any_to_rgb<Layout, Kind>);
+    };
 }
 template <chroma_in Layout>
 void fill_from_yuv(any_rows &t) {
@@ -212,7 +226,7 @@ template <pixel_kind From>
 void fill_from_rgb(any_rows &t) {
     t.to_yuv[size_t(From)] = any_to_yuv<From>;
     t.split_pixels[size_t(From)] = split_pixels<rgb_in(From)>;
-    repack_row **const to = t.repack[size_t(From)];
+    repack_rows **const to = t.repack[size_t(From)];
     to[size_t(pixel_kind::words)] = repack<From, pixel_kind::words>;
     to[size_t(pixel_kind::three)] = repack<From, pixel_kind::three>;
     to[size_t(pixel_kind::four)] = repack<From, pixel_kind::four>;

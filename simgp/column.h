@@ -21,15 +21,11 @@ struct column {
 // As many pixels lie side by side at most.
 inline constexpr ptrdiff_t column_pixels = 128;
 
-// The column that a walk over a picture leaves out of its rows: the whole picture, if it has less than
-// `narrow` pixels across; or the last pixel. Steps that may begin at any pixel do one more at no cost, unless
-// nothing else is left for the last of them.
-inline column column_of(const row_table &rows, bool steps_of_pairs, ptrdiff_t narrow,
-                        ptrdiff_t width, ptrdiff_t height) {
-    if (rows.vector <= 1 || height < 4) return {};
-    if (width < narrow) return {0, width};
-    if (width < rows.vector || (width & 1) == 0 || (!steps_of_pairs && width % rows.vector != 1))
-        return {};
+// The column that a walk over a picture leaves out of its rows: the last pixel. Steps that may begin at any
+// pixel do one more at no cost, unless nothing else is left for the last of them.
+inline column column_of(ptrdiff_t vector, bool steps_of_pairs, ptrdiff_t width, ptrdiff_t height) {
+    if (vector <= 1 || height < 4 || width < vector || (width & 1) == 0) return {};
+    if (!steps_of_pairs && width % vector != 1) return {};
     return {width - 1, 1};
 }
 
@@ -44,14 +40,21 @@ void in_column_blocks(ptrdiff_t height, ptrdiff_t block, F f) {
     }
 }
 
-// YUV in planes, and pixels to be made of it: rows one by one, or in pairs that share chroma lines, of which
-// the first row is alone if `lead` is 1.
-struct planes_to_rgb {
+// Which rows make pixels of YUV: of one line each, or of two that share a line of chroma; those of
+// rows/yuv2rgb.h by matrix, or, if `how` is not null, those of rows/any.h.
+struct rgb_from_yuv {
     yuv_layout layout;
     bool two_rows;
+    rgb_packing packing;
+    yuv_matrix matrix;
+    const yuv_to_rgb *how;
+    int pixel_bytes() const { return pixels_of[size_t(packing)].size; }
+};
+// Planes of YUV, and pixels to be made of them. Of pairs of rows, the first row is alone if `lead` is 1.
+struct planes_to_rgb {
+    rgb_from_yuv what;
     const_lines y, u, v;  // those that the layout does not use may be any
     lines dst;
-    int pixel_bytes;
     ptrdiff_t width, height;
     int lead;
 };

@@ -375,54 +375,27 @@ void yuv_to_yuv(const job &j) {
 // YUV to RGB
 // ------------------------------------------------------------------------------------------------
 
-chroma_in chroma_in_of(const format &f) {
-    if (f.kind == format_kind::packed) return chroma_in::groups;
-    if (has_pairs(f) && f.kind == format_kind::planar) return chroma_in::pairs;
-    return f.layout == yuv_layout::full ? chroma_in::full : chroma_in::half;
-}
-
-// Rows with the weights that they take.
-struct rows_to_any {
-    const yuv_to_rgb &how;
-    any_to_rgb_row *row;
-    any_to_rgb_row_pair *row_pair;
-
-    void one(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *dst,
-             ptrdiff_t width) const {
-        row(how, y, u, v, dst, width);
-    }
-    void two(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
-             uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) const {
-        row_pair(how, y0, y1, u, v, dst0, dst1, width);
-    }
-};
-
 void yuv_to_rgb_pictures(const job &j) {
-    const yuv_to_rgb how{to_rgb_weights[j.colour], j.from.layout == yuv_layout::vu,
-                         j.from.layout == yuv_layout::yuyv, is_blue_first(j.to.packing),
-                         is_alpha_first(j.to.packing)};
-    const size_t in = size_t(chroma_in_of(j.from)), kind = size_t(kind_of(j.to.packing));
-    const auto rows_in = [&](const row_table &t) {
-        return rows_to_any{how, t.any.to_rgb[in][kind], t.any.to_rgb_pair[in][kind]};
-    };
+    const yuv_to_rgb how{to_rgb_weights[j.colour],
+                         j.from.layout == yuv_layout::vu,
+                         j.from.layout == yuv_layout::yuyv,
+                         {is_blue_first(j.to.packing), is_alpha_first(j.to.packing)}};
+    rgb_from_yuv what{j.from.layout, sharing_of(j.from).down, j.to.packing, yuv_matrix::fine, &how};
     const lines out = j.out(0);
-    if (j.from.kind != format_kind::tiled && j.from.u >= 0) {
-        // Rows read what lies in linear planes, whole lines of it.
-        const planes_to_rgb p{
-            j.from.layout, sharing_of(j.from).down, j.in(0), j.in(j.from.u), j.in(j.from.v),
-            out,           j.to.bytes[0],           j.width, j.height,       0};
-        // A row makes vectors of the weights first, which takes as long as half of the widest one.
-        return convert_planes(p, live_rows().vector > 32 ? 32 : 16, rows_in);
-    }
-    const rows_to_any rows = rows_in(j.live);
+    // Rows read what lies in linear planes, whole lines of it.
+    if (j.from.kind != format_kind::tiled && j.from.u >= 0)
+        return convert_planes(
+            {what, j.in(0), j.in(j.from.u), j.in(j.from.v), out, j.width, j.height, 0});
+    what.layout = yuv_layout::half;
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
         const planar_band p = read_band(j, b, strip);
         uint8_t *const dst = out.line(b.y) + b.x * j.to.bytes[0];
-        if (b.rows == 2)
-            rows.two(p.y[0], p.y[1], p.u[0], p.v[0], dst, dst + out.stride, b.width);
-        else
-            rows.one(p.y[0], p.u[0], p.v[0], dst, b.width);
+        const ptrdiff_t second = b.rows - 1;
+        const line_rows rows(what, b.width);
+        convert_line(
+            rows,
+            rows.at({{p.y[0], p.y[second]}, p.u[0], p.v[0], {dst, dst + second * out.stride}}));
     });
 }
 
@@ -467,34 +440,85 @@ void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, cons
     j.rows.chroma(w, channels, u, v, width);
 }
 
-// The last pixels of lines, or of pairs of them, each as the first of two, whose second has no meaning.
-void convert_rgb_column(const job &j, const rgb_weights &w, any_to_yuv_row *row, int chroma_bytes,
-                        ptrdiff_t at_once) {
-    const ptrdiff_t last = j.width - 1;
-    const int size = j.from.bytes[0];
-    uint8_t pixels[2][4 * column_pixels] = {}, y[2][column_pixels], u[column_pixels],
-                          v[column_pixels];
-    in_column_blocks(j.height / at_once, column_pixels / 2, [&](ptrdiff_t first, ptrdiff_t count) {
-        for (ptrdiff_t r = 0; r < at_once; r++)
-            copy_lines(j.in(0).from(size * last, at_once * first + r, at_once),
-                       {pixels[r], 2 * size}, size, count);
-        row(w, pixels[0], at_once == 2 ? pixels[1] : nullptr, y[0], y[1],
-            chroma_bytes ? u : nullptr, chroma_bytes == 1 ? v : nullptr, 2 * count);
-        for (ptrdiff_t r = 0; r < at_once; r++)
-            copy_lines(const_lines{y[r], 2}, j.out(0).from(last, at_once * first + r, at_once), 1,
-                       count);
-        if (!chroma_bytes) return;
-        const ptrdiff_t x = chroma_bytes * (last / 2);
-        copy_lines(const_lines{u, chroma_bytes}, j.out(j.to.u).from(x, first), chroma_bytes, count);
-        if (chroma_bytes == 1)
-            copy_lines(const_lines{v, 1}, j.out(j.to.v).from(x, first), 1, count);
-    });
+// Rows by which lines of pixels become samples.
+struct rgb_rows {
+    const rgb_weights &w;
+    pixel_kind kind;
+    int pixel_bytes;
+};
+// The bytes of two pixels' chroma in u, and in v; 0: there is none.
+struct chroma_sizes {
+    int u, v;
+};
+chroma_sizes chroma_sizes_of(const lines_to_yuv &l) { return {l.u ? l.v ? 1 : 2 : 0, l.v ? 1 : 0}; }
+
+// A column of lines, or of pairs of them, laid side by side. The last pixel of an odd number is there twice,
+// for means.
+void convert_rgb_column(const rgb_rows &r, const lines_to_yuv &l, const column &c) {
+    const int size = r.pixel_bytes;
+    const chroma_sizes chroma = chroma_sizes_of(l);
+    const ptrdiff_t at_once = l.shared ? 2 : 1, pitch = pitch_of(c);
+    uint8_t pixels[2][4 * column_pixels], y[2][column_pixels], u[column_pixels], v[column_pixels];
+    const auto block = [&](ptrdiff_t first, ptrdiff_t count, ptrdiff_t rows) {
+        const const_lines in{l.src + first * at_once * l.src_step, l.src_step};
+        const lines luma{l.y + first * at_once * l.y_step, l.y_step};
+        for (ptrdiff_t k = 0; k < rows; k++)
+            for (ptrdiff_t x = 0; x < pitch; x += c.width)
+                copy_lines({in.line(k) + size * (x ? c.end() - 1 : c.x), at_once * in.stride},
+                           {pixels[k] + size * x, size * pitch}, size * (x ? 1 : c.width), count);
+        const ptrdiff_t width = pitch * count;
+        const row_table &live = live_rows(width);
+        live.any.to_yuv[size_t(r.kind)](
+            r.w, {pixels[0], sizeof pixels[0], y[0], sizeof y[0], l.u ? u : nullptr, 0,
+                  l.v ? v : nullptr, 0, width < live.vector ? live.vector : width, rows, l.shared});
+        for (ptrdiff_t k = 0; k < rows; k++)
+            copy_lines(const_lines{y[k], pitch}, {luma.line(k) + c.x, at_once * luma.stride},
+                       c.width, count);
+        const auto put = [&](const uint8_t *from, int bytes, uint8_t *to, ptrdiff_t step) {
+            if (bytes)
+                copy_lines(const_lines{from, bytes * pitch / 2},
+                           {to + first * step + bytes * c.x / 2, step}, bytes * pitch / 2, count);
+        };
+        put(u, chroma.u, l.u, l.u_step);
+        put(v, chroma.v, l.v, l.v_step);
+    };
+    const ptrdiff_t units = l.rows / at_once;
+    in_column_blocks(units, column_pixels / pitch,
+                     [&](ptrdiff_t first, ptrdiff_t count) { block(first, count, at_once); });
+    if (l.rows % at_once) block(units, 1, 1);
+}
+
+// Lines of any width.
+void convert_rgb_lines(const rgb_rows &r, const lines_to_yuv &l) {
+    const chroma_sizes chroma = chroma_sizes_of(l);
+    const row_table &live = live_rows(l.width);
+    // Chroma is made in pairs of pixels. What rows leave is made of many lines at once.
+    ptrdiff_t whole = chroma.u && live.vector > 1 ? l.width & ~ptrdiff_t(1) : l.width;
+    if (whole < live.vector) whole = 0;
+    column c{whole, l.width - whole};
+    if (c.width == 0) c = column_of(live.vector, false, l.width, l.rows);
+    const ptrdiff_t pairs = (l.width + 1) / 2;
+    const bool apart = lie_apart({l.y, l.y_step}, l.width) &&
+                       lie_apart({l.u, l.u_step}, chroma.u * pairs) &&
+                       lie_apart({l.v, l.v_step}, chroma.v * pairs);
+    const ptrdiff_t unit = l.shared ? 2 : 1, at_once = apart || c.width == 0 ? l.rows : unit;
+    for (ptrdiff_t row = 0; row < l.rows; row += at_once) {
+        lines_to_yuv part = l;
+        part.src += row * l.src_step;
+        part.y += row * l.y_step;
+        if (l.u) part.u += row / unit * l.u_step;
+        if (l.v) part.v += row / unit * l.v_step;
+        part.rows = l.rows - row < at_once ? l.rows - row : at_once;
+        part.width = l.width - c.width;
+        if (part.width > 0) live.any.to_yuv[size_t(r.kind)](r.w, part);
+        if (c.width > 0) convert_rgb_column(r, part, c);
+    }
 }
 
 void rgb_to_yuv_pictures(const job &j) {
     rgb_weights w = in_memory_order(to_yuv_weights[j.colour], j.from.packing);
     w.mean = averages(j);
-    any_to_yuv_row *const row = j.rows.to_yuv[size_t(kind_of(j.from.packing))];
+    const rgb_rows rows{w, kind_of(j.from.packing), j.from.bytes[0]};
     const sharing to = sharing_of(j.to);
     // Rows give the chroma of every second pixel, or of two.
     const bool by_rows = j.to.u >= 0 && to.across;
@@ -504,26 +528,12 @@ void rgb_to_yuv_pictures(const job &j) {
         const bool pairs = by_rows && has_pairs(j.to), planes = by_rows && !pairs;
         if (pairs && j.to.layout == yuv_layout::vu)
             for (int k = 0; k < 3; k++) exchange(w.u[k], w.v[k]);
-        const int of_u = by_rows ? j.to.u : 0, of_v = by_rows ? j.to.v : 0;
         const const_lines in = j.in(0);
-        const lines luma = j.out(0), u = j.out(of_u), v = j.out(of_v);
-        const ptrdiff_t chroma_bytes = !by_rows ? 0 : pairs ? 2 : 1;
-        const ptrdiff_t chroma_line = chroma_bytes * ((j.width + 1) / 2);
-        // Means would take the second of two.
-        const bool column = !w.mean && column_of(j.live, by_rows, 0, j.width, j.height).width > 0 &&
-                            lie_apart(luma, j.width) && lie_apart(u, chroma_line) &&
-                            lie_apart(v, chroma_line);
-        for (ptrdiff_t y = 0; y < j.height; y += rows_at_once) {
-            const bool two = to.down && y + 1 < j.height;
-            const ptrdiff_t line = y >> to.down;
-            // The column has no row that is alone in its pair.
-            row(w, in.line(y), two ? in.line(y + 1) : nullptr, luma.line(y),
-                two ? luma.line(y + 1) : nullptr, by_rows ? u.line(line) : nullptr,
-                planes ? v.line(line) : nullptr,
-                column && (two || !to.down) ? j.width - 1 : j.width);
-        }
-        if (column) convert_rgb_column(j, w, row, int(chroma_bytes), rows_at_once);
-        return;
+        lines_to_yuv all{in.first, in.stride, j.out(0).first, j.out(0).stride, nullptr, 0,
+                         nullptr,  0,         j.width,        j.height,        to.down};
+        if (by_rows) all.u = j.out(j.to.u).first, all.u_step = j.out(j.to.u).stride;
+        if (planes) all.v = j.out(j.to.v).first, all.v_step = j.out(j.to.v).stride;
+        return convert_rgb_lines(rows, all);
     }
     for_each_band(j, strip_width, 2, [&](const strip_rows &b) {
         yuv_strip strip;
@@ -532,8 +542,11 @@ void rgb_to_yuv_pictures(const job &j) {
             return j.in(0).line(b.y + r) + b.x * j.from.bytes[0];
         };
         for (ptrdiff_t r = 0; r < b.rows; r += rows_at_once) {
-            const uint8_t *const below = to.down && b.rows == 2 ? line(1) : nullptr;
-            row(w, line(r), below, t.y[r], t.y[1], by_rows ? t.u[r] : nullptr, t.v[r], b.width);
+            const bool two = to.down && b.rows == 2;
+            const uint8_t *const below = two ? line(1) : nullptr;
+            convert_rgb_lines(rows, {line(r), j.in(0).stride, t.y[r], two ? t.y[1] - t.y[0] : 0,
+                                     by_rows ? t.u[r] : nullptr, 0, by_rows ? t.v[r] : nullptr, 0,
+                                     b.width, two ? 2 : 1, two});
             if (by_rows) continue;
             chroma_of_pixels(j, w, line(r), w.mean ? below : nullptr, t.u[r], t.v[r], b.width);
         }
@@ -544,11 +557,11 @@ void rgb_to_yuv_pictures(const job &j) {
 void rgb_to_rgb(const job &j) {
     const repacking order{is_blue_first(j.from.packing) != is_blue_first(j.to.packing),
                           is_alpha_first(j.from.packing), is_alpha_first(j.to.packing)};
-    repack_row *const row =
-        j.rows.repack[size_t(kind_of(j.from.packing))][size_t(kind_of(j.to.packing))];
-    walk_one_plane(
-        j.live, j.in(0), j.from.bytes[0], j.out(0), j.to.bytes[0], j.width, j.height,
-        [&](const uint8_t *src, uint8_t *dst, ptrdiff_t count) { row(order, src, dst, count); });
+    const size_t from = size_t(kind_of(j.from.packing)), to = size_t(kind_of(j.to.packing));
+    walk_one_plane(j.in(0), j.from.bytes[0], j.out(0), j.to.bytes[0], j.width, j.height,
+                   [&](const row_table &live, const lines_to_repack &l) {
+                       live.any.repack[from][to](order, l);
+                   });
 }
 
 // Equal formats.

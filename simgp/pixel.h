@@ -3,7 +3,7 @@
 #ifndef SIMGP_PIXEL_H
 #define SIMGP_PIXEL_H
 
-#include "rows/formats.h"
+#include "rows/yuv2rgb.h"
 
 namespace simgp::scalar {
 
@@ -106,12 +106,11 @@ void to_rgb_row(const uint8_t *y, const uint8_t *u, const uint8_t *v, uint8_t *d
                             Matrix::blue(p.y, p.u, p.v)});
     }
 }
-template <yuv_layout Layout, class Matrix, rgb_packing Packing>
-void to_rgb_row_pair(const uint8_t *y0, const uint8_t *y1, const uint8_t *u, const uint8_t *v,
-                     uint8_t *dst0, uint8_t *dst1, ptrdiff_t width) {
-    to_rgb_row<Layout, Matrix, Packing>(y0, u, v, dst0, width);
-    to_rgb_row<Layout, Matrix, Packing>(y1, u, v, dst1, width);
-}
+
+// Calls row for each line, or for both of each pair.
+using yuv_row_fn = void(const yuv_to_rgb *how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
+                        uint8_t *dst, ptrdiff_t width);
+void for_each_row(const lines_to_rgb &l, bool pairs, yuv_row_fn *row);
 
 }  // namespace simgp::scalar
 

@@ -282,8 +282,8 @@ class fused {
         };
         const auto walk = [&](auto &&u, auto &&v) {
             const auto how = conversion_of<like, formats::RGB565, yuv_rule::usual>();
-            walk_rows(simgp::rows_of(how, live_rows(at.columns)).two, y, u, v,
-                      dst_.from(2 * at.x, 0), at.columns, of_luma.dst_height, 0);
+            walk_rows(line_rows(simgp::rows_of(how), at.columns), y, u, v, dst_.from(2 * at.x, 0),
+                      of_luma.dst_height, 0);
         };
         if constexpr (chroma_planes == 1)
             walk(plane(From.u, 0), no_lines());

@@ -73,7 +73,7 @@ void rgb_to_yuv(const csc_args &a, const format &from, const format &to) {
     const const_lines in = whole_pixel_lines(src_lines(a, 0), size);
     const lines luma = dst_lines(a, 0), u = dst_lines(a, to.u), v = dst_lines(a, to.v);
     // The last pixel of an odd row has no chroma.
-    column c = column_of(live, true, 0, width, height);
+    column c = column_of(live.vector, true, width, height);
     if (!lie_apart(luma, width)) c = {};
     for (ptrdiff_t y = 0; y < height; y++) {
         const bool chroma = !(y & 1) && y + 1 < height;
@@ -88,10 +88,13 @@ void rgb_to_yuv(const csc_args &a, const format &from, const format &to) {
 }
 
 void rgb_to_rgb565(const csc_args &a, const format &from, const format &to) {
-    const row_table &live = live_rows(a.src_widths[0]);
-    walk_one_plane(live, whole_pixel_lines(src_lines(a, 0), from.bytes[0]), from.bytes[0],
+    walk_one_plane(whole_pixel_lines(src_lines(a, 0), from.bytes[0]), from.bytes[0],
                    whole_pixel_lines(dst_lines(a, 0), to.bytes[0]), to.bytes[0], a.src_widths[0],
-                   a.src_heights[0], live.rgb2yuv.to_rgb565[size_t(from.packing)]);
+                   a.src_heights[0], [&](const row_table &live, const lines_to_repack &l) {
+                       rgb_to_rgb_row *const row = live.rgb2yuv.to_rgb565[size_t(from.packing)];
+                       for (ptrdiff_t y = 0; y < l.count; y++)
+                           row(l.src + y * l.src_step, l.dst + y * l.dst_step, l.width);
+                   });
 }
 
 }  // namespace

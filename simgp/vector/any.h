@@ -43,36 +43,29 @@ struct any_terms {
 struct any_rgb {
     s16v r, g, b;
 };
-// The order of a pixel's channels. Whole vectors change places, as late as they can.
-struct any_order {
-    bool blue_first, alpha_first;
-};
 
 struct any_matrix {
     pair_bytes luma, green_u, green_v, blue1;
     half_factor red, blue2;
     s16v luma_c, red_c, green_c, blue1_c, blue2_c;
-    any_order order;
+    // Whole vectors change places, as late as they can.
+    rgb_order order;
 
-    static s16v constant(int c) { return as_s16(set_u16(static_cast<uint16_t>(c))); }
+    static s16v constant(int16_t c) { return as_s16(set_u16(static_cast<uint16_t>(c))); }
 
-    explicit any_matrix(const yuv_to_rgb &how) {
-        const yuv_weights &w = how.weights;
-        const int offset = w.black ? 3248 : 0, bias = offset + 64;
-        const int of_blue1 = w.blue / 4 * 2, of_blue2 = w.blue - of_blue1;
-        luma = set_pair_bytes(w.luma / 2);
-        luma_c = constant(-w.luma / 2 * w.black - offset);
-        red = set_half_factor(w.red);
-        red_c = constant(bias - 64 * w.red);
-        green_u = set_pair_bytes(w.green_u);
-        green_v = set_pair_bytes(w.green_v);
-        green_c = constant(bias + 64 * (w.green_u + w.green_v));
-        blue1 = set_pair_bytes(of_blue1 / 2);
-        blue1_c = constant(-64 * of_blue1);
-        blue2 = set_half_factor(of_blue2);
-        blue2_c = constant(bias - 64 * of_blue2);
-        order = {how.blue_first, how.alpha_first};
-    }
+    explicit any_matrix(const yuv_to_rgb &how)
+        : luma(set_pair_bytes(how.weights.parts.luma)),
+          green_u(set_pair_bytes(how.weights.parts.green_u)),
+          green_v(set_pair_bytes(how.weights.parts.green_v)),
+          blue1(set_pair_bytes(how.weights.parts.blue1)),
+          red(set_half_factor(how.weights.parts.red)),
+          blue2(set_half_factor(how.weights.parts.blue2)),
+          luma_c(constant(how.weights.parts.luma_c)),
+          red_c(constant(how.weights.parts.red_c)),
+          green_c(constant(how.weights.parts.green_c)),
+          blue1_c(constant(how.weights.parts.blue1_c)),
+          blue2_c(constant(how.weights.parts.blue2_c)),
+          order(how.pixels) {}
 
     any_terms terms(pair_bytes u, pair_bytes v) const {
         return {add(as_s16(half_product(v, red)), red_c),
@@ -96,31 +89,48 @@ struct any_packer<pixel_kind::words> {
         if (blue_first) first = p.b, last = p.r;
         return pack565(first, p.g, last);
     }
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const rgb_order &o) {
         store_zip16(dst, pack(even, o.blue_first), pack(odd, o.blue_first));
+    }
+    static void store(uint8_t *p, uint8_t *q, const any_rgb &even, const any_rgb &odd,
+                      const rgb_order &o) {
+        store_zip16(p, q, pack(even, o.blue_first), pack(odd, o.blue_first));
     }
 };
 template <>
 struct any_packer<pixel_kind::three> {
     static constexpr pixel_order order = pixel_order::natural;
     static constexpr int size = 3;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const rgb_order &o) {
         store_narrow_zip3<7, 7, 7>(dst, even.r, odd.r, even.g, odd.g, even.b, odd.b, o.blue_first);
+    }
+    static void store(uint8_t *p, uint8_t *q, const any_rgb &even, const any_rgb &odd,
+                      const rgb_order &o) {
+        store_narrow_zip3<7, 7, 7>(p, q, even.r, odd.r, even.g, odd.g, even.b, odd.b, o.blue_first);
     }
 };
 template <>
 struct any_packer<pixel_kind::four> {
     static constexpr pixel_order order = pixel_order::by4;
     static constexpr int size = 4;
-    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const any_order &o) {
+    // Calls put(bytes of the pixels ...).
+    template <class Put>
+    static void bytes_of(const any_rgb &even, const any_rgb &odd, const rgb_order &o, Put put) {
         const u8v r = narrow_join<7>(even.r, odd.r), g = narrow_join<7>(even.g, odd.g),
                   b = narrow_join<7>(even.b, odd.b), a = set_u8(255);
         u8v first = r, last = b;
         if (o.blue_first) first = b, last = r;
         if (o.alpha_first)
-            store_zip4(dst, a, first, g, last);
+            put(a, first, g, last);
         else
-            store_zip4(dst, first, g, last, a);
+            put(first, g, last, a);
+    }
+    static void store(uint8_t *dst, const any_rgb &even, const any_rgb &odd, const rgb_order &o) {
+        bytes_of(even, odd, o, [=](u8v a, u8v b, u8v c, u8v d) { store_zip4(dst, a, b, c, d); });
+    }
+    static void store(uint8_t *p, uint8_t *q, const any_rgb &even, const any_rgb &odd,
+                      const rgb_order &o) {
+        bytes_of(even, odd, o, [=](u8v a, u8v b, u8v c, u8v d) { store_zip4(p, q, a, b, c, d); });
     }
 };
 
@@ -137,11 +147,6 @@ struct any_source<chroma_in::half> : source<yuv_layout::half> {
     static any_chroma chroma(pairs_v pairs) { return {even(pairs), odd(pairs)}; }
 };
 template <>
-struct any_source<chroma_in::full> : source<yuv_layout::full> {
-    explicit any_source(const yuv_to_rgb &) {}
-    static any_chroma chroma(pairs_v pairs) { return {even(pairs), odd(pairs)}; }
-};
-template <>
 struct any_source<chroma_in::pairs> : source<yuv_layout::uv> {
     bool v_first;
     explicit any_source(const yuv_to_rgb &how) : v_first(how.v_first) {}
@@ -153,7 +158,6 @@ struct any_source<chroma_in::pairs> : source<yuv_layout::uv> {
 };
 template <>
 struct any_source<chroma_in::groups> {
-    static constexpr bool pixels_in_pairs = true;
     bool luma_first;
     explicit any_source(const yuv_to_rgb &how) : luma_first(how.luma_first) {}
     static any_chroma chroma(pairs_v pairs) { return {even(pairs), odd(pairs)}; }
@@ -164,102 +168,102 @@ struct any_source<chroma_in::groups> {
         if (!luma_first) p = exchanged(p);
         return p;
     }
-    samples stage(staged &to, const samples &s, ptrdiff_t x, int count) const {
-        return (luma_first ? source<yuv_layout::yuyv>::stage : source<yuv_layout::uyvy>::stage)(
-            to, s, x, count);
-    }
 };
 
-// Less than a vector goes through the stack, by the row for one, whose pixels have `size` bytes.
-template <chroma_in In>
-[[gnu::noinline]] static void any_part(any_to_rgb_row *row, int size, const yuv_to_rgb &how,
-                                       const samples &in, uint8_t *dst, ptrdiff_t x, int count) {
-    staged to;
-    uint8_t pixels[bytes * 4];
-    const samples s = any_source<In>(how).stage(to, in, x, count);
-    row(how, s.y, s.u, s.v, pixels, bytes);
-    copy_few(dst + x * size, pixels, ptrdiff_t(size) * count);
-}
-
 template <chroma_in In, pixel_kind Kind>
-static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
-                    uint8_t *dst, ptrdiff_t width) {
+static void any_rows_alone(const lines_to_rgb &lines) {
     using to = any_packer<Kind>;
-    const any_matrix m(how);
-    const any_source<In> from(how);
-    const samples in{y, u, v};
-    const auto write_half = [&](ptrdiff_t x, const yuv_half &p) {
-        const any_chroma c = from.chroma(p.pairs);
-        const any_terms t = m.terms(c.u, c.v);
-        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.order);
-    };
-    const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
-        const auto half = [&](pair_bytes luma, pairs_v pairs) {
-            return m.apply(luma, m.terms(even(pairs), odd(pairs)));
-        };
-        to::store(dst + x * to::size, half(even(p.y), p.pairs_even), half(odd(p.y), p.pairs_odd),
-                  m.order);
-    };
-    const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
-    const auto part = [&](ptrdiff_t x, int count) {
-        any_part<In>(any_row<In, Kind>, to::size, how, in, dst, x, count);
-    };
-    if constexpr (In == chroma_in::full)
-        row_of_steps<false>(width, load, write_full, part);
-    else
-        row_of_steps<true>(width, load, write_half, part);
+    const any_matrix m(*lines.how);
+    const any_source<In> from(*lines.how);
+    const ptrdiff_t width = lines.width;
+    for_each_line(lines, [&](const line_to_rgb &l) {
+        whole_steps_ahead(
+            width,
+            [&](ptrdiff_t x) {
+                return from.template load<to::order>(samples{l.y[0], l.u, l.v}, x);
+            },
+            [&](ptrdiff_t x, const yuv_half &p) {
+                const any_chroma c = from.chroma(p.pairs);
+                const any_terms t = m.terms(c.u, c.v);
+                to::store(l.dst[0] + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t),
+                          m.order);
+            });
+    });
 }
 
+// Pairs of rows that are shorter than a vector, each in a half of it.
 template <chroma_in In, pixel_kind Kind>
-static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
-                         const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
-                         ptrdiff_t width);
-// One row by the row for two.
-template <chroma_in In, pixel_kind Kind>
-static void any_row_of_pair(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u,
-                            const uint8_t *v, uint8_t *dst, ptrdiff_t width) {
-    any_row_pair<In, Kind>(how, y, y, u, v, dst, dst, width);
+static void any_row_halves(const lines_to_rgb &lines) {
+    using to = any_packer<Kind>;
+    const any_matrix m(*lines.how);
+    const any_source<In> from(*lines.how);
+    const ptrdiff_t width = lines.width;
+    for_each_line(lines, [&](const line_to_rgb &l) {
+        whole_steps_ahead<bytes / 2>(
+            width, [&](ptrdiff_t x) { return from.template load_halves<to::order>(l, x); },
+            [&](ptrdiff_t x, const yuv_half &p) {
+                const any_chroma c = from.chroma(p.pairs);
+                const any_terms t = m.terms(c.u, c.v);
+                to::store(l.dst[0] + x * to::size, l.dst[1] + x * to::size, m.apply(even(p.y), t),
+                          m.apply(odd(p.y), t), m.order);
+            });
+    });
 }
-
 template <chroma_in In, pixel_kind Kind>
-static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
-                         const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
-                         ptrdiff_t width) {
+static void any_row_pairs(const lines_to_rgb &lines) {
+    if constexpr (pairs_in_halves)
+        if (lines.width < bytes) return any_row_halves<In, Kind>(lines);
     using to = any_packer<Kind>;
     struct pixels_pair {
         yuv_half first;
         pairs_v second_y;
     };
-    const any_matrix m(how);
-    const any_source<In> from(how);
-    const samples in{y0, u, v};
-    row_of_steps<true>(
-        width,
-        [&](ptrdiff_t x) {
-            return pixels_pair{from.template load<to::order>(in, x), load_luma<to::order>(y1, x)};
-        },
-        [&](ptrdiff_t x, const pixels_pair &p) {
-            const any_chroma c = from.chroma(p.first.pairs);
-            const any_terms t = m.terms(c.u, c.v);
-            to::store(dst0 + x * to::size, m.apply(even(p.first.y), t), m.apply(odd(p.first.y), t),
-                      m.order);
-            to::store(dst1 + x * to::size, m.apply(even(p.second_y), t),
-                      m.apply(odd(p.second_y), t), m.order);
-        },
-        [&](ptrdiff_t x, int count) {
-            constexpr any_to_rgb_row *row = any_row_of_pair<In, Kind>;
-            any_part<In>(row, to::size, how, in, dst0, x, count);
-            any_part<In>(row, to::size, how, {y1, u, v}, dst1, x, count);
-        });
+    const any_matrix m(*lines.how);
+    const any_source<In> from(*lines.how);
+    const ptrdiff_t width = lines.width;
+    for_each_line(lines, [&](const line_to_rgb &l) {
+        whole_steps_ahead(
+            width,
+            [&](ptrdiff_t x) {
+                return pixels_pair{from.template load<to::order>(samples{l.y[0], l.u, l.v}, x),
+                                   load_luma<to::order>(l.y[1], x)};
+            },
+            [&](ptrdiff_t x, const pixels_pair &p) {
+                const any_chroma c = from.chroma(p.first.pairs);
+                const any_terms t = m.terms(c.u, c.v);
+                to::store(l.dst[0] + x * to::size, m.apply(even(p.first.y), t),
+                          m.apply(odd(p.first.y), t), m.order);
+                to::store(l.dst[1] + x * to::size, m.apply(even(p.second_y), t),
+                          m.apply(odd(p.second_y), t), m.order);
+            });
+    });
 }
 
-// Two rows by the row for one.
-template <chroma_in In, pixel_kind Kind>
-static void any_pair_of_rows(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t *y1,
-                             const uint8_t *u, const uint8_t *v, uint8_t *dst0, uint8_t *dst1,
-                             ptrdiff_t width) {
-    any_row<In, Kind>(how, y0, u, v, dst0, width);
-    any_row<In, Kind>(how, y1, u, v, dst1, width);
+// Rows with chroma for each pixel, alone or in pairs: chroma that two rows share is computed for each.
+template <pixel_kind Kind>
+static void any_rows_full(const lines_to_rgb &lines) {
+    using to = any_packer<Kind>;
+    const any_matrix m(*lines.how);
+    const ptrdiff_t width = lines.width;
+    const auto half = [&](pair_bytes luma, pairs_v pairs) {
+        return m.apply(luma, m.terms(even(pairs), odd(pairs)));
+    };
+    for_each_line(lines, [&](const line_to_rgb &l) {
+        const uint8_t *y = l.y[0];
+        for (uint8_t *dst = l.dst[0];; y = l.y[1], dst = l.dst[1]) {
+            whole_steps_ahead(
+                width,
+                [&](ptrdiff_t x) {
+                    return source<yuv_layout::full>::template load<to::order>(samples{y, l.u, l.v},
+                                                                              x);
+                },
+                [&](ptrdiff_t x, const yuv_full &p) {
+                    to::store(dst + x * to::size, half(even(p.y), p.pairs_even),
+                              half(odd(p.y), p.pairs_odd), m.order);
+                });
+            if (y == l.y[1]) break;
+        }
+    });
 }
 
 // RGB to YUV
@@ -318,68 +322,24 @@ template <pixel_kind Kind, class F>
         f([](const uint8_t *p) { return load_pixels<rgb_in(Kind)>(p); });
 }
 
-// Less than a vector goes through the stack, by the row itself. Of a last pixel alone, the mean is that of
-// it and itself.
-[[gnu::noinline]] static void any_yuv_part(any_to_yuv_row *row, int size, const rgb_weights &w,
-                                           const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                                           uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t x,
-                                           int count) {
-    uint8_t pixels[2][bytes * 4], to_y[2][bytes], to_u[bytes], to_v[bytes];
-    const auto stage = [&](uint8_t *to, const uint8_t *src) {
-        stage_few(to, size, src + size * x, count, size);
-        // One pixel of four bytes is staged over and over.
-        if (w.mean && (count & 1) && (count > 1 || size < 4))
-            copy_few(to + size * count, src + size * (x + count - 1), size);
-    };
-    stage(pixels[0], src0);
-    if (src1) stage(pixels[1], src1);
-    row(w, pixels[0], src1 ? pixels[1] : nullptr, to_y[0], to_y[1], u ? to_u : nullptr,
-        v ? to_v : nullptr, bytes);
-    copy_few(y0 + x, to_y[0], count);
-    if (src1) copy_few(y1 + x, to_y[1], count);
-    if (!u) return;
-    const int samples = (count + 1) / 2;
-    copy_few(v ? u + x / 2 : u + x, to_u, v ? samples : 2 * samples);
-    if (v) copy_few(v + x / 2, to_v, samples);
-}
-
-template <pixel_kind Kind>
-static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width);
-
-// A line of luma alone.
-template <pixel_kind Kind>
-[[gnu::noinline, maybe_unused]] static void any_luma_line(const rgb_weights &w, const uint8_t *src,
-                                                          uint8_t *y, ptrdiff_t width) {
-    constexpr int size = int(Kind) + 2;
-    if (width < bytes) {
-        any_yuv_part(any_yuv_row<Kind>, size, w, src, nullptr, y, nullptr, nullptr, nullptr, 0,
-                     int(width));
-        return;
-    }
-    const any_yuv_matrix<Kind> m(w);
-    with_load<Kind>(w, [&](const auto &load) {
-        move_steps<2>(
-            width, lines_in<size>{{src}}, lines_out<1>{{y}},
-            [&](const uint8_t *const *p) { return load(p[0]); },
-            [&](uint8_t *const *q, const auto &p) { store(q[0], m.luma(p)); });
-    });
-}
-
 // Whether a second line has a loop of its own: it has where loops move their pointers. Elsewhere two lines at
 // once spare small pictures the way there.
 constexpr bool lines_apart = moves_pointers;
 
-// Luma and chroma of a line, or of two; without means only where they are not apart.
+// Without means only where lines are not apart, or of lines with chroma.
 template <pixel_kind Kind, bool Mean>
-static void any_yuv_lines(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1,
-                          uint8_t *y0, uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
+static void any_yuv_lines(const rgb_weights &w, const lines_to_yuv &l) {
     constexpr int size = int(Kind) + 2;
     const any_yuv_matrix<Kind> m(w);
     with_load<Kind>(w, [&](const auto &load) {
-        row_of_steps<true>(
-            width, [](ptrdiff_t x) { return x; },
-            [&](ptrdiff_t x, ptrdiff_t) {
+        const ptrdiff_t width = l.width;
+        uint8_t *u = l.u, *v = l.v;
+        for (ptrdiff_t row = 0; row < l.rows; row += 1 + l.shared) {
+            const bool two = l.shared && row + 1 < l.rows;
+            const uint8_t *const src0 = l.src + row * l.src_step;
+            const uint8_t *const src1 = two ? src0 + l.src_step : nullptr;
+            uint8_t *const y0 = l.y + row * l.y_step, *const y1 = two ? y0 + l.y_step : nullptr;
+            whole_steps(width, [&](ptrdiff_t x) {
                 const auto p = load(src0 + size * x);
                 store(y0 + x, m.luma(p));
                 const auto put_chroma = [&](const auto &pixels) {
@@ -397,23 +357,37 @@ static void any_yuv_lines(const rgb_weights &w, const uint8_t *src0, const uint8
                     store(y1 + x, m.luma(below));
                 }
                 if (Mean) put_chroma(block_means(p, below));
-            },
-            [&](ptrdiff_t x, int count) {
-                any_yuv_part(any_yuv_row<Kind>, size, w, src0, src1, y0, y1, u, v, x, count);
             });
+            if constexpr (!Mean && lines_apart)
+                if (src1)
+                    move_steps<2>(
+                        width, lines_in<size>{{src1}}, lines_out<1>{{y1}},
+                        [&](const uint8_t *const *p) { return load(p[0]); },
+                        [&](uint8_t *const *q, const auto &p) { store(q[0], m.luma(p)); });
+            if (u) u += l.u_step;
+            if (v) v += l.v_step;
+        }
+    });
+}
+// Lines of luma alone.
+template <pixel_kind Kind>
+static void any_luma_lines(const rgb_weights &w, const lines_to_yuv &l) {
+    constexpr int size = int(Kind) + 2;
+    const any_yuv_matrix<Kind> m(w);
+    with_load<Kind>(w, [&](const auto &load) {
+        for (ptrdiff_t row = 0; row < l.rows; row++)
+            move_steps<2>(
+                l.width, lines_in<size>{{l.src + row * l.src_step}},
+                lines_out<1>{{l.y + row * l.y_step}},
+                [&](const uint8_t *const *p) { return load(p[0]); },
+                [&](uint8_t *const *q, const auto &p) { store(q[0], m.luma(p)); });
     });
 }
 template <pixel_kind Kind>
-static void any_yuv_row(const rgb_weights &w, const uint8_t *src0, const uint8_t *src1, uint8_t *y0,
-                        uint8_t *y1, uint8_t *u, uint8_t *v, ptrdiff_t width) {
-    if (u && w.mean) return any_yuv_lines<Kind, true>(w, src0, src1, y0, y1, u, v, width);
-    if constexpr (!lines_apart)
-        return any_yuv_lines<Kind, false>(w, src0, src1, y0, y1, u, v, width);
-    if (u)
-        any_yuv_lines<Kind, false>(w, src0, nullptr, y0, nullptr, u, v, width);
-    else
-        any_luma_line<Kind>(w, src0, y0, width);
-    if (src1) any_luma_line<Kind>(w, src1, y1, width);
+static void any_yuv_rows(const rgb_weights &w, const lines_to_yuv &l) {
+    if (l.u && w.mean) return any_yuv_lines<Kind, true>(w, l);
+    if (lines_apart && !l.u) return any_luma_lines<Kind>(w, l);
+    any_yuv_lines<Kind, false>(w, l);
 }
 
 [[gnu::noinline]] static void chroma_plane(const int16_t *of, const uint8_t *const channels[3],
@@ -450,21 +424,18 @@ static void any_chroma_row(const rgb_weights &w, const uint8_t *const channels[3
 
 template <pixel_kind Kind>
 static void fill_any_kind(any_rows &t) {
-    const size_t k = size_t(Kind);
-    const auto in = [&](chroma_in layout, any_to_rgb_row *row, any_to_rgb_row_pair *pair) {
-        t.to_rgb[size_t(layout)][k] = row;
-        t.to_rgb_pair[size_t(layout)][k] = pair;
-    };
-    in(chroma_in::half, any_row<chroma_in::half, Kind>, any_row_pair<chroma_in::half, Kind>);
-    in(chroma_in::full, any_row<chroma_in::full, Kind>, any_pair_of_rows<chroma_in::full, Kind>);
-    in(chroma_in::pairs, any_row_of_pair<chroma_in::pairs, Kind>,
-       any_row_pair<chroma_in::pairs, Kind>);
-    in(chroma_in::groups, any_row<chroma_in::groups, Kind>,
-       any_pair_of_rows<chroma_in::groups, Kind>);
+    constexpr size_t k = size_t(Kind), half = size_t(chroma_in::half),
+                     full = size_t(chroma_in::full), pairs = size_t(chroma_in::pairs),
+                     groups = size_t(chroma_in::groups);
+    t.to_rgb[half][k] = any_rows_alone<chroma_in::half, Kind>;
+    t.to_rgb[groups][k] = any_rows_alone<chroma_in::groups, Kind>;
+    t.to_rgb_pair[half][k] = any_row_pairs<chroma_in::half, Kind>;
+    t.to_rgb_pair[pairs][k] = any_row_pairs<chroma_in::pairs, Kind>;
+    t.to_rgb[full][k] = t.to_rgb_pair[full][k] = any_rows_full<Kind>;
 }
 template <pixel_kind Kind>
 static void fill_any_rgb(any_rows &t) {
-    t.to_yuv[size_t(Kind)] = any_yuv_row<Kind>;
+    t.to_yuv[size_t(Kind)] = any_yuv_rows<Kind>;
     t.split_pixels[size_t(Kind)] = split_pixels_vectors<rgb_in(Kind)>;
 }
 

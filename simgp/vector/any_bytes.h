@@ -63,66 +63,51 @@ inline void store_channels(uint8_t *dst, u8v first, u8v g, u8v last, bool alpha_
     }
 }
 
-// Less than a vector goes through the stack, by the row itself.
-struct repack_sizes {
-    int from, to;
-};
-[[gnu::noinline]] static void repack_part(repack_row *row, repack_sizes size,
-                                          const repacking &order, const uint8_t *src, uint8_t *dst,
-                                          ptrdiff_t x, int count) {
-    uint8_t pixels[bytes * 4], to[bytes * 4];
-    stage_few(pixels, size.from, src + size.from * x, count, size.from);
-    row(order, pixels, to, bytes);
-    copy_few(dst + size.to * x, to, ptrdiff_t(size.to) * count);
-}
-
 // Calls convert(p, q) for every `bytes` pixels of Size bytes at q that become pixels of ToSize bytes
-// at p. What is left is done by `row`, which is the caller.
+// at p.
 template <int Size, int ToSize, class Convert>
-[[gnu::always_inline]] inline void repack_in_steps(repack_row *row, const repacking &order,
-                                                   const uint8_t *src, uint8_t *dst,
-                                                   ptrdiff_t count, Convert convert) {
-    if (count < bytes) return repack_part(row, {Size, ToSize}, order, src, dst, 0, int(count));
-    move_steps(
-        count, lines_in<Size>{{src}}, lines_out<ToSize>{{dst}},
-        [](const uint8_t *const *p) { return p[0]; },
-        [&](uint8_t *const *q, const uint8_t *from) { convert(q[0], from); });
+[[gnu::always_inline]] inline void repack_in_steps(const lines_to_repack &l, Convert convert) {
+    const ptrdiff_t width = l.width;
+    const uint8_t *src = l.src;
+    uint8_t *dst = l.dst;
+    for (ptrdiff_t left = l.count;;) {
+        move_steps(
+            width, lines_in<Size>{{src}}, lines_out<ToSize>{{dst}},
+            [](const uint8_t *const *p) { return p[0]; },
+            [&](uint8_t *const *q, const uint8_t *from) { convert(q[0], from); });
+        if (--left == 0) return;
+        src += l.src_step;
+        dst += l.dst_step;
+    }
 }
 
 template <rgb_in In, pixel_kind To>
-static void repack_pixels(const repacking &order, const uint8_t *src, uint8_t *dst,
-                          ptrdiff_t count) {
+static void repack_pixels(const repacking &order, const lines_to_repack &l) {
+    const bool alpha_first = order.to_alpha_first;
     with_flag(order.exchange, [&](auto swaps) {
-        repack_in_steps<size_in<In>, int(To) + 2>(
-            repack_pixels<In, To>, order, src, dst, count, [&](uint8_t *p, const uint8_t *q) {
-                channels_v c = channels_of(load_pixels<In>(q));
-                if (swaps) c = {{c.c[2], c.c[1], c.c[0]}};
-                store_channels<To>(p, c.c[0], c.c[1], c.c[2], order.to_alpha_first);
-            });
+        repack_in_steps<size_in<In>, int(To) + 2>(l, [&](uint8_t *p, const uint8_t *q) {
+            channels_v c = channels_of(load_pixels<In>(q));
+            if (swaps) c = {{c.c[2], c.c[1], c.c[0]}};
+            store_channels<To>(p, c.c[0], c.c[1], c.c[2], alpha_first);
+        });
     });
 }
-static void four_to_words(const repacking &order, const uint8_t *src, uint8_t *dst,
-                          ptrdiff_t count) {
-    (order.from_alpha_first
-         ? repack_pixels<rgb_in::four_alpha_first, pixel_kind::words>
-         : repack_pixels<rgb_in::four, pixel_kind::words>)(order, src, dst, count);
+static void four_to_words(const repacking &order, const lines_to_repack &l) {
+    (order.from_alpha_first ? repack_pixels<rgb_in::four_alpha_first, pixel_kind::words>
+                            : repack_pixels<rgb_in::four, pixel_kind::words>)(order, l);
 }
-static void exchange_three(const repacking &order, const uint8_t *src, uint8_t *dst,
-                           ptrdiff_t count) {
-    repack_in_steps<3, 3>(exchange_three, order, src, dst, count,
-                          [](uint8_t *p, const uint8_t *q) { exchange_888(p, q); });
+static void exchange_three(const repacking &, const lines_to_repack &l) {
+    repack_in_steps<3, 3>(l, [](uint8_t *p, const uint8_t *q) { exchange_888(p, q); });
 }
-static void three_to_four(const repacking &order, const uint8_t *src, uint8_t *dst,
-                          ptrdiff_t count) {
+static void three_to_four(const repacking &order, const lines_to_repack &l) {
     with_widen_moves(order.exchange, order.to_alpha_first, [&](const auto &m) {
-        repack_in_steps<3, 4>(three_to_four, order, src, dst, count,
+        repack_in_steps<3, 4>(l,
                               [&](uint8_t *p, const uint8_t *q) { repack_888_to_8888(p, q, m); });
     });
 }
-static void four_to_three(const repacking &order, const uint8_t *src, uint8_t *dst,
-                          ptrdiff_t count) {
+static void four_to_three(const repacking &order, const lines_to_repack &l) {
     with_narrow_moves(order.exchange, order.from_alpha_first, [&](const auto &m) {
-        repack_in_steps<4, 3>(four_to_three, order, src, dst, count,
+        repack_in_steps<4, 3>(l,
                               [&](uint8_t *p, const uint8_t *q) { repack_8888_to_888(p, q, m); });
     });
 }
@@ -137,8 +122,7 @@ struct first_byte {
 static constexpr first_byte first_byte_of_pixel;
 
 // Four bytes to four: each stays in its pixel.
-static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *dst,
-                         ptrdiff_t count) {
+static void reorder_four(const repacking &order, const lines_to_repack &l) {
     // Where the bytes of a pixel come from.
     const int skip = order.from_alpha_first, at = order.to_alpha_first;
     uint8_t from[4];
@@ -148,18 +132,17 @@ static void reorder_four(const repacking &order, const uint8_t *src, uint8_t *ds
     const u8v index = add_u8(set_u32(uint32_t(from[0]) | uint32_t(from[1]) << 8 |
                                      uint32_t(from[2]) << 16 | uint32_t(from[3]) << 24),
                              load(first_byte_of_pixel.lane));
-    if (count < bytes / 4) {
-        for (ptrdiff_t x = 0; x < count; x++)
-            for (int k = 0; k < 4; k++) dst[4 * x + k] = src[4 * x + from[k]];
-        return;
+    const ptrdiff_t size = 4 * l.width;
+    for (ptrdiff_t y = 0; y < l.count; y++) {
+        const uint8_t *const src = l.src + y * l.src_step;
+        uint8_t *const dst = l.dst + y * l.dst_step;
+        const auto vector = [=](ptrdiff_t i) { store(dst + i, shuffle(load(src + i), index)); };
+        ptrdiff_t i = 0;
+        for (; i + 4 * bytes <= size; i += 4 * bytes)
+            for (int k = 0; k < 4; k++) vector(i + k * bytes);
+        for (; i + bytes < size; i += bytes) vector(i);
+        vector(size - bytes);
     }
-    const auto vector = [&](ptrdiff_t i) { store(dst + i, shuffle(load(src + i), index)); };
-    const ptrdiff_t size = 4 * count;
-    ptrdiff_t i = 0;
-    for (; i + 4 * bytes <= size; i += 4 * bytes)
-        for (int k = 0; k < 4; k++) vector(i + k * bytes);
-    for (; i + bytes < size; i += bytes) vector(i);
-    vector(size - bytes);
 }
 
 // YUV to YUV

@@ -1,7 +1,7 @@
 // Packers: how pixels of three channels are stored.
 //
 // A packer names the order of pixels that its stores want (see simd/lanes.h) and stores `bytes`
-// pixels, the even and the odd ones apart.
+// pixels, the even and the odd ones apart: all at dst, or half of them each at `first` and `second`.
 #ifndef SIMGP_VECTOR_PACKER_H
 #define SIMGP_VECTOR_PACKER_H
 
@@ -36,6 +36,9 @@ struct packer_of_size<2, At> {
     static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
         store_zip16(dst, pack(even), pack(odd));
     }
+    static void store(uint8_t *first, uint8_t *second, const rgb_s16 &even, const rgb_s16 &odd) {
+        store_zip16(first, second, pack(even), pack(odd));
+    }
 };
 
 template <pixel_bytes At>
@@ -49,17 +52,34 @@ struct packer_of_size<3, At> {
         else
             store_narrow_zip3<7, 7, 6>(dst, even.r, odd.r, even.g, odd.g, even.b6, odd.b6);
     }
+    static void store(uint8_t *first, uint8_t *second, const rgb_s16 &even, const rgb_s16 &odd) {
+        if constexpr (At.b == 0)
+            store_narrow_zip3<6, 7, 7>(first, second, even.b6, odd.b6, even.g, odd.g, even.r,
+                                       odd.r);
+        else
+            store_narrow_zip3<7, 7, 6>(first, second, even.r, odd.r, even.g, odd.g, even.b6,
+                                       odd.b6);
+    }
 };
 
 template <pixel_bytes At>
 struct packer_of_size<4, At> {
     static constexpr pixel_order order = pixel_order::by4;
     static constexpr int size = 4;
-    static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
+    // Calls put(bytes of the pixels ...).
+    template <class Put>
+    static void bytes_of(const rgb_s16 &even, const rgb_s16 &odd, Put put) {
         const u8v r = narrow_join<7>(even.r, odd.r), g = narrow_join<7>(even.g, odd.g),
                   b = narrow_join<6>(even.b6, odd.b6), a = set_u8(255);
         const auto byte = [&](int k) { return k == At.r ? r : k == At.g ? g : k == At.b ? b : a; };
-        store_zip4(dst, byte(0), byte(1), byte(2), byte(3));
+        put(byte(0), byte(1), byte(2), byte(3));
+    }
+    static void store(uint8_t *dst, const rgb_s16 &even, const rgb_s16 &odd) {
+        bytes_of(even, odd, [=](u8v a, u8v b, u8v c, u8v d) { store_zip4(dst, a, b, c, d); });
+    }
+    static void store(uint8_t *first, uint8_t *second, const rgb_s16 &even, const rgb_s16 &odd) {
+        bytes_of(even, odd,
+                 [=](u8v a, u8v b, u8v c, u8v d) { store_zip4(first, second, a, b, c, d); });
     }
 };
 

@@ -2,12 +2,14 @@
 //
 // A source loads the samples of `bytes` pixels, in the order of pixels that the packer wants: luma
 // as byte pairs, chroma as byte pairs, one pair for two pixels or, with full chroma, a vector of
-// pairs for the even pixels and one for the odd.
+// pairs for the even pixels and one for the odd. Where two pixels share chroma, load_halves does so
+// for half a vector of pixels of each of two rows.
 #ifndef SIMGP_VECTOR_SOURCE_H
 #define SIMGP_VECTOR_SOURCE_H
 
 #include <string.h>
 
+#include "rows/yuv2rgb.h"
 #include "simgp/vector/packer.h"
 #include "simgp/vector/steps.h"
 
@@ -17,15 +19,14 @@ struct samples {
     const uint8_t *y, *u, *v;
 };
 
-// Room on the stack for the samples of less than a vector of pixels, read by the loads of a whole
-// one. stage(to, s, x, count) fills it, and gives the planes that are then to be read.
-struct staged {
-    uint8_t y[2 * bytes], u[bytes], v[bytes];
-};
-
 template <pixel_order Order>
 inline pairs_v load_luma(const uint8_t *y, ptrdiff_t x) {
     return arrange<Order>(load_pairs(y + x));
+}
+
+template <pixel_order Order>
+inline pairs_v load_halves_of(const uint8_t *p, const uint8_t *q, ptrdiff_t x) {
+    return arrange<Order>(load_pair_halves(p + x, q + x));
 }
 
 using yuv_half = luma_chroma;
@@ -39,52 +40,41 @@ struct source;
 template <>
 struct source<yuv_layout::half> {
     static constexpr pair_order pairs = pair_order::uv;
-    static constexpr bool pixels_in_pairs = true;
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
         return {load_luma<Order>(s.y, x),
                 arrange<Order>(load_pairs(s.u + (x >> 1), s.v + (x >> 1)))};
     }
-    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        stage_few(to.y, 1, s.y + x, count, 1);
-        stage_few(to.u, 1, s.u + x / 2, (count + 1) / 2, 1);
-        stage_few(to.v, 1, s.v + x / 2, (count + 1) / 2, 1);
-        return {to.y, to.u, to.v};
+    template <pixel_order Order>
+    static yuv_half load_halves(const line_to_rgb &l, ptrdiff_t x) {
+        return {load_halves_of<Order>(l.y[0], l.y[1], x),
+                arrange<Order>(load_pairs_twice(l.u + (x >> 1), l.v + (x >> 1)))};
     }
 };
 
 template <>
 struct source<yuv_layout::full> {
     static constexpr pair_order pairs = pair_order::uv;
-    static constexpr bool pixels_in_pairs = false;
 
     template <pixel_order Order>
     static yuv_full load(const samples &s, ptrdiff_t x) {
         const pairs_v u = load_luma<Order>(s.u, x), v = load_luma<Order>(s.v, x);
         return {load_luma<Order>(s.y, x), pair_evens(u, v), pair_odds(u, v)};
     }
-    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        stage_few(to.y, 1, s.y + x, count, 1);
-        stage_few(to.u, 1, s.u + x, count, 1);
-        stage_few(to.v, 1, s.v + x, count, 1);
-        return {to.y, to.u, to.v};
-    }
 };
 
 template <pair_order Pairs>
 struct source_pairs {
     static constexpr pair_order pairs = Pairs;
-    static constexpr bool pixels_in_pairs = true;
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
         return {load_luma<Order>(s.y, x), load_luma<Order>(s.u, x)};
     }
-    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        stage_few(to.y, 1, s.y + x, count, 1);
-        stage_few(to.u, 1, s.u + x, (count + 1) / 2, 2);
-        return {to.y, to.u, to.u};
+    template <pixel_order Order>
+    static yuv_half load_halves(const line_to_rgb &l, ptrdiff_t x) {
+        return {load_halves_of<Order>(l.y[0], l.y[1], x), load_halves_of<Order>(l.u, l.u, x)};
     }
 };
 
@@ -101,7 +91,6 @@ inline luma_chroma load_groups_for(const uint8_t *p) {
 template <bool LUMA_FIRST>
 struct source_packed {
     static constexpr pair_order pairs = pair_order::uv;
-    static constexpr bool pixels_in_pairs = true;
 
     template <pixel_order Order>
     static yuv_half load(const samples &s, ptrdiff_t x) {
@@ -110,22 +99,6 @@ struct source_packed {
             return p;
         else
             return exchanged(p);
-    }
-    // A last group of one pixel gets the V of the group before.
-    static samples stage(staged &to, const samples &s, ptrdiff_t x, int count) {
-        constexpr int v = LUMA_FIRST ? 3 : 2;
-        const ptrdiff_t single = x + count - 1;
-        const uint8_t v_before = count & 1 && single ? s.y[2 * single + v - 4] : 128;
-        if (count == 1) {
-            const uint8_t *const at = s.y + 2 * x;
-            const u8v group = set_u32(at[0] | uint32_t(at[1]) << 8 | uint32_t(v_before) << 8 * v);
-            store(to.y, group);
-            store(to.y + bytes, group);
-            return {to.y, to.y, to.y};
-        }
-        stage_few(to.y, 2, s.y + 2 * x, count, 2);
-        if (count & 1) to.y[2 * (count - 1) + v] = v_before;
-        return {to.y, to.y, to.y};
     }
 };
 template <>
@@ -137,6 +110,22 @@ template <>
 struct source<yuv_layout::uv> : source_pairs<pair_order::uv> {};
 template <>
 struct source<yuv_layout::vu> : source_pairs<pair_order::vu> {};
+
+// Calls f(line) for each of the rows, or of the pairs of rows.
+template <class F>
+[[gnu::always_inline]] inline void for_each_line(const lines_to_rgb &l, F f) {
+    line_to_rgb at = l;
+    for (ptrdiff_t left = l.count;;) {
+        f(at);
+        if (--left == 0) return;
+        for (int k = 0; k < 2; k++) {
+            at.y[k] += l.y_step;
+            at.dst[k] += l.dst_step;
+        }
+        at.u += l.u_step;
+        at.v += l.v_step;
+    }
+}
 
 }  // namespace simgp::SIMD_TARGET
 

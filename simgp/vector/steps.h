@@ -65,21 +65,21 @@ inline void whole_steps(ptrdiff_t count, F step) {
 }
 
 // The same with step(x, pixels), for which load(x) is called one step ahead.
-template <class Load, class F>
+template <int Step = bytes, class Load, class F>
 inline void whole_steps_ahead(ptrdiff_t count, Load load, F step) {
-    const ptrdiff_t last = count - bytes;
+    const ptrdiff_t last = count - Step;
     ptrdiff_t x = 0;
     auto pixels = load(0);
     if constexpr (moves_pointers) {
-        ptrdiff_t next = last < bytes ? last : bytes;
+        ptrdiff_t next = last < Step ? last : Step;
         for (;;) {
             // Nothing in here depends on where the row ends.
             do {
                 const auto ahead = load(next);
                 step(x, pixels);
                 pixels = ahead;
-                x += bytes;
-                next += bytes;
+                x += Step;
+                next += Step;
             } while (next <= last);
             // The last pixels have been loaded and stored, or loaded, or neither.
             if (x == count) return;
@@ -88,7 +88,7 @@ inline void whole_steps_ahead(ptrdiff_t count, Load load, F step) {
         }
     }
     for (;;) {
-        const ptrdiff_t next = x + bytes <= last ? x + bytes : last;
+        const ptrdiff_t next = x + Step <= last ? x + Step : last;
         const auto ahead = load(next);
         step(x, pixels);
         if (next == x) return;
@@ -97,35 +97,26 @@ inline void whole_steps_ahead(ptrdiff_t count, Load load, F step) {
     }
 }
 
-// The same as row_of_steps below, by functions.
-template <bool PixelsInPairs, class Load, class Write, class Part>
-inline void row_of_steps(ptrdiff_t width, Load load, Write write, Part part) {
-    const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
-    if (whole < bytes) return part(0, int(width));
-    whole_steps_ahead(whole, load, write);
-    if (whole < width) part(whole, 1);
-}
-
-// A Step converts `bytes` pixels at a time:
-//   pixels_in_pairs         whether a step must begin at an even pixel
-//   load(in, x)             the samples of pixels x ... x + bytes - 1
-//   write(out, x, those)    computes the pixels and stores them at their places
-//   part(in, out, x, n)     converts n <= bytes pixels from x on and touches nothing else
-// In and Out are whatever the Step reads and writes: a few pointers.
-//
-// Converts `width` >= 1 pixels. Reads their samples and writes the pixels, nothing else.
+// Converts `width` >= 1 pixels, `bytes` at a time:
+//   load(x)         the samples of pixels x ... x + bytes - 1
+//   write(x, those) computes the pixels and stores them at their places
+//   part(x, n)      converts n <= bytes pixels from x on and touches nothing else
+// Reads the samples of the pixels and writes the pixels, nothing else.
 //
 // A row of at least a vector takes whole steps. The last one ends at the last pixel and may do some
 // pixels again. Samples are loaded one step ahead of the stores, which hides the loads' latency and
 // keeps the row right where output lies over samples: whatever was stored by then lies before the
 // pixels that a load is for. Where steps begin at even pixels, the last pixel of an odd row stands
 // alone.
-template <class Step, class In, class Out>
-inline void row_of_steps(const In &in, const Out &out, ptrdiff_t width) {
-    row_of_steps<Step::pixels_in_pairs>(
-        width, [&](ptrdiff_t x) { return Step::load(in, x); },
-        [&](ptrdiff_t x, const auto &pixels) { Step::write(out, x, pixels); },
-        [&](ptrdiff_t x, int count) { Step::part(in, out, x, count); });
+template <bool PixelsInPairs, class Load, class Write, class Part>
+inline void row_of_steps(ptrdiff_t width, Load load, Write write, Part part) {
+    const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
+    ptrdiff_t done = 0;
+    if (whole >= bytes) {
+        whole_steps_ahead(whole, load, write);
+        done = whole;
+    }
+    if (done < width) part(done, int(width - done));
 }
 
 // Samples in steps of `Step`: vector(x) does so many of them from x on, one(x) one. The last step
