@@ -188,19 +188,29 @@ def assembly(loop):
     return "\n".join(lines) + "\n"
 
 
-def cycles(mca, family, processor, texts):
+def difference(figures):
+    """Those of a loop, or what the second of two calls has more."""
+    if len(figures) == 1:
+        return figures[0]
+    return {kind: figures[1][kind] - figures[0][kind] for kind in figures[1]}
+
+
+def cycles(mca, family, processor, texts, rounds):
     """Of one more round of each loop. Instructions that have no model, such as returns, are left out."""
     regions = "".join(f"# LLVM-MCA-BEGIN\n{text}# LLVM-MCA-END\n" for text in texts)
     totals = []
-    for rounds in (100, 200):
+    for iterations in rounds:
+        if iterations == 0:
+            totals.append([0] * len(texts))
+            continue
         out = subprocess.run([mca, f"-mtriple={family['triple']}", f"-mattr={family['attributes']}",
-                              f"-mcpu={processor}", f"-iterations={rounds}", "-all-views=false", "-summary-view",
+                              f"-mcpu={processor}", f"-iterations={iterations}", "-all-views=false", "-summary-view",
                               "-skip-unsupported-instructions=lack-sched"],
                              input=regions, capture_output=True, text=True)
         totals.append([int(total) for total in re.findall(r"Total Cycles: +(\d+)", out.stdout)])
         if len(totals[-1]) != len(texts):
             sys.exit(f"llvm-mca, {processor}: {out.stderr}")
-    return [(more - less) / 100 for less, more in zip(*totals)]
+    return [(more - less) / (rounds[1] - rounds[0]) for less, more in zip(*totals)]
 
 
 def disassemble(objdump, program, attributes):
@@ -251,34 +261,40 @@ class Probe:
         return addresses[addresses.index(address):]
 
     def loop(self, name):
-        """A round of its inner loop, how many pixels it does, and what there is to count."""
+        """What to measure of a row: pixels, and the instructions that they take.
+
+        Instructions are those of a round of the inner loop, or else two calls, of which the longer one does so many
+        pixels more.
+        """
         number, address, pixels, sizes = self.rows[name]
         short, long = (self.executed(number, address, size) for size in sizes)
-        addresses, rounds = inner_loop(short, long)
+        more = pixels * (sizes[1] - sizes[0])
+        try:
+            addresses, rounds = inner_loop(short, long)
+        except ValueError:
+            return more, [([self.code[at] for at in call if at in self.code], Stack()) for call in (short, long)]
         stack = Stack()
         for at in long[:long.index(addresses[0])]:
             stack.follow(*self.code[at])
-        loop = [self.code[at] for at in addresses]
-        return assembly(loop), pixels * (sizes[1] - sizes[0]) / rounds, counts(loop, stack)
+        return more / rounds, [([self.code[at] for at in addresses], stack)]
 
     def measure(self, names):
-        """({row: (figures per pixel, text of the loop)}, {row: why there are none})"""
-        def loop_or_reason(name):
-            try:
-                return self.loop(name)
-            except ValueError as reason:
-                return reason
-
+        """{row: (figures per pixel, text of the loop or None)}"""
         with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
-            found = dict(zip(names, pool.map(loop_or_reason, names)))
-        loops = {name: loop for name, loop in found.items() if not isinstance(loop, ValueError)}
-        texts = [text for text, _, _ in loops.values()]
-        for processor in self.family["processors"] if texts else []:
-            for (_, _, figures), figure in zip(loops.values(), cycles(self.mca, self.family, processor, texts)):
-                figures[processor] = figure
-        return ({name: ({kind: figure / pixels for kind, figure in figures.items()}, text)
-                 for name, (text, pixels, figures) in loops.items()},
-                {name: loop for name, loop in found.items() if isinstance(loop, ValueError)})
+            found = dict(zip(names, pool.map(self.loop, names)))
+        measured = {}
+        for whole_calls in (False, True):
+            rows = {name: row for name, row in found.items() if (len(row[1]) == 2) == whole_calls}
+            figures = {name: difference([counts(*code) for code in codes]) for name, (_, codes) in rows.items()}
+            texts = [assembly(code) for _, codes in rows.values() for code, _ in codes]
+            for processor in self.family["processors"] if texts else []:
+                taken = iter(cycles(self.mca, self.family, processor, texts, (0, 1) if whole_calls else (100, 200)))
+                for name, (_, codes) in rows.items():
+                    figures[name].update(difference([{processor: next(taken)} for _ in codes]))
+            for name, (pixels, codes) in rows.items():
+                measured[name] = ({kind: figure / pixels for kind, figure in figures[name].items()},
+                                  None if whole_calls else assembly(codes[0][0]))
+        return measured
 
 
 def weighted(measured, terms):
@@ -365,7 +381,6 @@ def main():
     for probe in args.probes:
         family, compiler, program = probe.split(":", 2)
         families[family][compiler] = program
-    failed = []
     for name, programs in families.items():
         results = {}
         for compiler, program in programs.items():
@@ -373,17 +388,13 @@ def main():
             # libyuv's rows are the same in each program.
             rows = [row for row in probe.rows if wanted(row) and not (results and row.startswith("libyuv "))]
 
-            measured, reasons = probe.measure(rows)
-            failed += [f"{name}, {compiler}, {row}: {reason}" for row, reason in reasons.items()]
+            measured = probe.measure(rows)
             results[compiler] = {row: figures for row, (figures, _) in measured.items()}
             if args.show:
                 for row, (_, text) in measured.items():
-                    print(f"### {name}, {compiler}, {row}\n\n```\n{text}```\n")
+                    if text:
+                        print(f"### {name}, {compiler}, {row}\n\n```\n{text}```\n")
         report(FAMILIES[name], results, chosen)
-    if failed:
-        print("## Without figures\n")
-        print("Rows whose rounds differ, or that spend their time in several loops.\n")
-        print("\n".join(f"- {line}" for line in sorted(failed)))
 
 
 if __name__ == "__main__":

@@ -61,6 +61,7 @@ set(SIMGP_AREAS
   simgp/yuv2rgb)
 # Areas whose rows gain nothing by -O3: their loops are written out, and it only makes copies of them.
 set(SIMGP_SMALL_AREAS simgp/any simgp/layout simgp/resize simgp/rgb2yuv simgp/yuv2rgb)
+set(SIMGP_SMALL_AREAS_neon scmn/keyframe scmn/mem simgp/dither)
 set(area_macro "#define SIMGP_AREAS(X)")
 foreach(area IN LISTS SIMGP_AREAS)
   get_filename_component(stem ${area} NAME)
@@ -77,7 +78,7 @@ function(simgp_add_vector_unit name target area)
   target_compile_definitions(${name} PRIVATE SIMD_TARGET=${target} SIMD_LAYER="simd/${target}.h"
                                              SIMD_AREA="${family}/vector/${stem}.h")
   target_compile_options(${name} PRIVATE ${${target}_flags})
-  if(area IN_LIST SIMGP_SMALL_AREAS)
+  if(area IN_LIST SIMGP_SMALL_AREAS OR area IN_LIST SIMGP_SMALL_AREAS_${target})
     target_compile_options(${name} PRIVATE $<$<CONFIG:Release>:-O2>)
   endif()
   set_target_properties(${name} PROPERTIES POSITION_INDEPENDENT_CODE ON CXX_VISIBILITY_PRESET hidden

@@ -211,9 +211,19 @@ inline s16v mul_round(s16v a, s16v b) {
     return make<s16v>([&](int i) { return (a.lane[i] * b.lane[i] + (1 << 14)) >> 15; });
 }
 
-// The mean of unsigned lanes, rounded up.
+// The mean of unsigned lanes, rounded up, and rounded down; half their difference, rounded down.
 inline u16v avg_u16(u16v a, u16v b) {
     return make<u16v>([&](int i) { return (a.lane[i] + b.lane[i] + 1) >> 1; });
+}
+inline u16v mean_down_u16(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return (a.lane[i] + b.lane[i]) >> 1; });
+}
+inline s16v half_difference(u16v a, u16v b) {
+    return make<s16v>([&](int i) { return (a.lane[i] - b.lane[i]) >> 1; });
+}
+// Differences of unsigned lanes, saturating.
+inline u16v sub_sat_u16(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return clamp_to(0, 65535, a.lane[i] - b.lane[i]); });
 }
 
 // Sums and differences of bytes, saturating.
@@ -310,6 +320,10 @@ using pairs_v = u8v;
 using pair_bytes = u16v;
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+// Within blocks: the lower 8 bytes as the even ones, the upper 8 as the odd ones.
+inline pairs_v load_halves(const uint8_t *p) {
+    return make<u8v>([&](int i) { return p[i / 16 * 16 + i % 2 * 8 + i % 16 / 2]; });
+}
 // The even bytes of u and v as pairs, and the odd ones.
 inline pairs_v pair_evens(pairs_v u, pairs_v v) {
     return make<u8v>([&](int i) { return (i & 1 ? v : u).lane[i / 2 * 2]; });
@@ -319,6 +333,10 @@ inline pairs_v pair_odds(pairs_v u, pairs_v v) {
 }
 // Factors of 0 ... 255 that are known at run time, and products; their low 16 bits, unsigned.
 inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+// Such a product and a sum, which wraps.
+inline u16v mul_add(u16v sum, pair_bytes a, pair_bytes b) {
+    return make<u16v>([&](int i) { return uint16_t(sum.lane[i] + a.lane[i] * b.lane[i]); });
+}
 // floor(k v / 2), with a factor that is known at run time; k is 0 ... 511.
 struct half_factor {
     int k;
@@ -381,6 +399,17 @@ inline u8v narrow(s16v low, s16v high) {
         const int block = i / 16, byte = i % 16;
         return clamp_to(0, 255, (byte < 8 ? low : high).lane[block * 8 + byte % 8]);
     });
+}
+// The same of lanes shifted right by N, unsigned ones and signed ones.
+template <int N>
+inline u8v narrow_shr(u16v low, u16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(as_s16(shr<N>(low)), as_s16(shr<N>(high)));
+}
+template <int N>
+inline u8v narrow_sar(s16v low, s16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(sar<N>(low), sar<N>(high));
 }
 
 // Within blocks: the means of two neighbouring bytes of a and the two of b at the same place, with
@@ -479,6 +508,10 @@ inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
 inline pair_u8 load_split_by4(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by4(v.even), natural_to_by4(v.odd)};
+}
+// Byte pairs, or the same with even and odd exchanged.
+inline pairs_v exchange_pairs(pairs_v v, split_moves exchange) {
+    return exchange ? make<u8v>([&](int i) { return v.lane[i ^ 1]; }) : v;
 }
 // The rounded means of blocks of four in two lines of twice `bytes` bytes, (sum + 2) >> 2.
 inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {

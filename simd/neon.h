@@ -104,6 +104,9 @@ inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
 inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 inline u16v avg_u16(u16v a, u16v b) { return vrhaddq_u16(a, b); }
+inline u16v mean_down_u16(u16v a, u16v b) { return vhaddq_u16(a, b); }
+inline s16v half_difference(u16v a, u16v b) { return as_s16(vhsubq_u16(a, b)); }
+inline u16v sub_sat_u16(u16v a, u16v b) { return vqsubq_u16(a, b); }
 inline s16v mul_round(s16v a, s16v b) { return vqrdmulhq_s16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
@@ -175,12 +178,21 @@ inline pairs_v load_pairs(const uint8_t *p) {
     return {v.val[0], v.val[1]};
 }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return {vld1_u8(p), vld1_u8(q)}; }
+inline pairs_v load_halves(const uint8_t *p) {
+#ifdef __aarch64__
+    return load_pairs(p, p + 8);
+#else
+    const u8v v = load(p);
+    return {vget_low_u8(v), vget_high_u8(v)};
+#endif
+}
 inline pairs_v pair_evens(pairs_v u, pairs_v v) { return {u.even, v.even}; }
 inline pairs_v pair_odds(pairs_v u, pairs_v v) { return {u.odd, v.odd}; }
 inline pair_bytes even(pairs_v v) { return v.even; }
 inline pair_bytes odd(pairs_v v) { return v.odd; }
 inline pair_bytes set_pair_bytes(int k) { return vdup_n_u8(static_cast<uint8_t>(k)); }
 inline u16v mul(pair_bytes a, pair_bytes b) { return vmull_u8(a, b); }
+inline u16v mul_add(u16v sum, pair_bytes a, pair_bytes b) { return vmlal_u8(sum, a, b); }
 // floor(k v / 2) = (k >> 1) v + (k & 1) (v >> 1)
 struct half_factor {
     uint8x8_t half, odd;
@@ -235,6 +247,16 @@ inline u8v narrow_join(s16v even, s16v odd) {
 inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
 inline u16v widen_high(u8v v) { return vmovl_u8(vget_high_u8(v)); }
 inline u8v narrow(s16v low, s16v high) { return vcombine_u8(vqmovun_s16(low), vqmovun_s16(high)); }
+template <int N>
+inline u8v narrow_shr(u16v low, u16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return vcombine_u8(vqshrn_n_u16(low, N), vqshrn_n_u16(high, N));
+}
+template <int N>
+inline u8v narrow_sar(s16v low, s16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return vcombine_u8(vqshrun_n_s16(low, N), vqshrun_n_s16(high, N));
+}
 
 inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
     return vcombine_u8(vrshrn_n_u16(vpadalq_u8(vpaddlq_u8(a0), b0), 2),
@@ -315,6 +337,10 @@ inline split_moves set_split_moves(bool exchange) { return set_u8(exchange ? 255
 inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
     const pair_u8 v = load_split(p);
     return {vbslq_u8(exchange, v.odd, v.even), vbslq_u8(exchange, v.even, v.odd)};
+}
+inline pairs_v exchange_pairs(pairs_v v, split_moves exchange) {
+    const uint8x8_t m = vget_low_u8(exchange);
+    return {vbsl_u8(m, v.odd, v.even), vbsl_u8(m, v.even, v.odd)};
 }
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     vst1_u8(p, vmovn_u16(as_u16(v)));

@@ -18,9 +18,35 @@ inline void step_pointer(T *&) {}
 // Byte pairs are best left in vectors.
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
+inline u8v zip_halves(u8v v) { return zip_low<1>(v, zip_high<8>(v, v)); }
+inline pairs_v load_halves(const uint8_t *p) { return zip_halves(load(p)); }
+// What takes pairs apart has the even bytes' places first.
+inline pairs_v exchange_pairs(pairs_v v, split_moves moves) {
+    return shuffle(v, zip_halves(moves));
+}
 inline pairs_v pair_evens(pairs_v u, pairs_v v) { return join(even(u), even(v)); }
 inline pairs_v pair_odds(pairs_v u, pairs_v v) { return join(odd(u), odd(v)); }
 inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+inline u16v mul_add(u16v sum, pair_bytes a, pair_bytes b) { return add(sum, mul(a, b)); }
+
+// The mean that is rounded up, less one where the sum is odd; and (a - b + 2^16) / 2.
+inline u16v mean_down_u16(u16v a, u16v b) {
+    return sub(avg_u16(a, b), bit_and(bit_xor(a, b), set_u16(1)));
+}
+inline s16v half_difference(u16v a, u16v b) {
+    return bit_xor(avg_u16(a, bit_not(b)), set_u16(0x8000));
+}
+
+template <int N>
+inline u8v narrow_shr(u16v low, u16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(shr<N>(low), shr<N>(high));
+}
+template <int N>
+inline u8v narrow_sar(s16v low, s16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(sar<N>(low), sar<N>(high));
+}
 struct luma_chroma {
     pairs_v y, pairs;
 };

@@ -1,7 +1,8 @@
 // Rows between any two formats, with weights that are known at run time. Those that need none are in
 // any_bytes.h.
 //
-// YUV to RGB is computed at half scale, 7 fractional bits, as in matrix.h. With L, KR, KGU, KGV and
+// Where products of bytes widen, YUV to RGB is what any_channels.h does. Elsewhere it is computed at half
+// scale, 7 fractional bits, as in matrix.h. With L, KR, KGU, KGV and
 // KB the weights, `offset` 3248 in the limited ranges (L = 298) and 0 in the full ones (L = 256),
 // and the rounding constant 64:
 //
@@ -28,6 +29,7 @@
 
 #include "rows/any.h"
 #include "simgp/vector/any_bytes.h"
+#include "simgp/vector/any_channels.h"
 #include "simgp/vector/packer.h"
 #include "simgp/vector/source.h"
 #include "simgp/vector/steps.h"
@@ -185,29 +187,36 @@ template <chroma_in In, pixel_kind Kind>
 static void any_row(const yuv_to_rgb &how, const uint8_t *y, const uint8_t *u, const uint8_t *v,
                     uint8_t *dst, ptrdiff_t width) {
     using to = any_packer<Kind>;
-    const any_matrix m(how);
-    const any_source<In> from(how);
     const samples in{y, u, v};
-    const auto write_half = [&](ptrdiff_t x, const yuv_half &p) {
-        const any_chroma c = from.chroma(p.pairs);
-        const any_terms t = m.terms(c.u, c.v);
-        to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.order);
-    };
-    const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
-        const auto half = [&](pair_bytes luma, pairs_v pairs) {
-            return m.apply(luma, m.terms(even(pairs), odd(pairs)));
-        };
-        to::store(dst + x * to::size, half(even(p.y), p.pairs_even), half(odd(p.y), p.pairs_odd),
-                  m.order);
-    };
-    const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
     const auto part = [&](ptrdiff_t x, int count) {
         any_part<In>(any_row<In, Kind>, to::size, how, in, dst, x, count);
     };
-    if constexpr (In == chroma_in::full)
-        row_of_steps<false>(width, load, write_full, part);
-    else
-        row_of_steps<true>(width, load, write_half, part);
+    if constexpr (products_widen) {
+        const ptrdiff_t whole = In == chroma_in::full ? width : width & ~ptrdiff_t(1);
+        if (whole < bytes) return part(0, int(width));
+        channels_row<In, Kind>(how, y, u, v, dst, whole);
+        if (whole < width) part(whole, 1);
+    } else {
+        const any_matrix m(how);
+        const any_source<In> from(how);
+        const auto write_half = [&](ptrdiff_t x, const yuv_half &p) {
+            const any_chroma c = from.chroma(p.pairs);
+            const any_terms t = m.terms(c.u, c.v);
+            to::store(dst + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t), m.order);
+        };
+        const auto write_full = [&](ptrdiff_t x, const yuv_full &p) {
+            const auto half = [&](pair_bytes luma, pairs_v pairs) {
+                return m.apply(luma, m.terms(even(pairs), odd(pairs)));
+            };
+            to::store(dst + x * to::size, half(even(p.y), p.pairs_even),
+                      half(odd(p.y), p.pairs_odd), m.order);
+        };
+        const auto load = [&](ptrdiff_t x) { return from.template load<to::order>(in, x); };
+        if constexpr (In == chroma_in::full)
+            row_of_steps<false>(width, load, write_full, part);
+        else
+            row_of_steps<true>(width, load, write_half, part);
+    }
 }
 
 template <chroma_in In, pixel_kind Kind>
@@ -230,27 +239,36 @@ static void any_row_pair(const yuv_to_rgb &how, const uint8_t *y0, const uint8_t
         yuv_half first;
         pairs_v second_y;
     };
-    const any_matrix m(how);
-    const any_source<In> from(how);
     const samples in{y0, u, v};
-    row_of_steps<true>(
-        width,
-        [&](ptrdiff_t x) {
-            return pixels_pair{from.template load<to::order>(in, x), load_luma<to::order>(y1, x)};
-        },
-        [&](ptrdiff_t x, const pixels_pair &p) {
-            const any_chroma c = from.chroma(p.first.pairs);
-            const any_terms t = m.terms(c.u, c.v);
-            to::store(dst0 + x * to::size, m.apply(even(p.first.y), t), m.apply(odd(p.first.y), t),
-                      m.order);
-            to::store(dst1 + x * to::size, m.apply(even(p.second_y), t),
-                      m.apply(odd(p.second_y), t), m.order);
-        },
-        [&](ptrdiff_t x, int count) {
-            constexpr any_to_rgb_row *row = any_row_of_pair<In, Kind>;
-            any_part<In>(row, to::size, how, in, dst0, x, count);
-            any_part<In>(row, to::size, how, {y1, u, v}, dst1, x, count);
-        });
+    const auto part = [&](ptrdiff_t x, int count) {
+        constexpr any_to_rgb_row *row = any_row_of_pair<In, Kind>;
+        any_part<In>(row, to::size, how, in, dst0, x, count);
+        any_part<In>(row, to::size, how, {y1, u, v}, dst1, x, count);
+    };
+    if constexpr (products_widen) {
+        const ptrdiff_t whole = width & ~ptrdiff_t(1);
+        if (whole < bytes) return part(0, int(width));
+        channels_row_pair<In, Kind>(how, y0, y1, u, v, dst0, dst1, whole);
+        if (whole < width) part(whole, 1);
+    } else {
+        const any_matrix m(how);
+        const any_source<In> from(how);
+        row_of_steps<true>(
+            width,
+            [&](ptrdiff_t x) {
+                return pixels_pair{from.template load<to::order>(in, x),
+                                   load_luma<to::order>(y1, x)};
+            },
+            [&](ptrdiff_t x, const pixels_pair &p) {
+                const any_chroma c = from.chroma(p.first.pairs);
+                const any_terms t = m.terms(c.u, c.v);
+                to::store(dst0 + x * to::size, m.apply(even(p.first.y), t),
+                          m.apply(odd(p.first.y), t), m.order);
+                to::store(dst1 + x * to::size, m.apply(even(p.second_y), t),
+                          m.apply(odd(p.second_y), t), m.order);
+            },
+            part);
+    }
 }
 
 // Two rows by the row for one.
