@@ -347,7 +347,8 @@ int run(int argc, char **argv) {
                                {"Resize and turn", resize_rot_comparisons},
                                {"Resize and convert", resize_csc_comparisons},
                                {"Line resizer", irsz_comparisons},
-                               {"Common", scmn_comparisons}};
+                               {"Common", scmn_comparisons},
+                               {"Stores", stores_comparisons}};
     std::vector<std::pair<std::string, comparison>> all;
     for (const family &f : families)
         for (comparison &c : f.comparisons()) all.emplace_back(f.name, std::move(c));

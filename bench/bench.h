@@ -112,6 +112,7 @@ std::vector<comparison> resize_rot_comparisons();
 std::vector<comparison> resize_csc_comparisons();
 std::vector<comparison> irsz_comparisons();
 std::vector<comparison> scmn_comparisons();
+std::vector<comparison> stores_comparisons();
 
 }  // namespace bench
 

@@ -44,7 +44,7 @@ struct resize_strip {
 
     // The rows' own, by `measure` and `plan`.
     int32_t windows;
-    bool shared;
+    bool shared, small;
     int32_t lanes, steps, last;
     int32_t direct_from, direct_to;
 };

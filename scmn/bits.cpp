@@ -1,3 +1,5 @@
+// The functions themselves are defined here.
+#define SCMN_BITS_CALLED
 #include "scmn/bits.h"
 
 #include <string.h>

@@ -168,6 +168,64 @@ SIMGP_API int32_t scmn_bsw_write1(scmn_bsw_ctx *ctx, uint32_t bit);
  * n of 0 or less stores nothing and returns 0, or -1 if the buffer is full. */
 SIMGP_API int32_t scmn_bsw_write(scmn_bsw_ctx *ctx, uint32_t value, int32_t n);
 
+/* Without calls -----------------------------------------------------------------------------------
+ *
+ * What these functions do nearly every time, a shift of the cache or a bit pushed into a byte,
+ * takes less time than a call. So programs get it in place, from the functions below, and call the
+ * library for the rest: the ends of the cache, of a byte and of the data. Results and records are
+ * the same.
+ *
+ * The library's own function is meant by its address and by its name in parentheses,
+ * (scmn_bsr_peek)(ctx, n), and everywhere in a source that defines SCMN_BITS_CALLED before it
+ * includes this header. */
+#ifndef SCMN_BITS_CALLED
+
+static inline uint32_t scmn_bsr_read_inline(scmn_bsr_ctx *ctx, int32_t n) {
+    if (n < 1 || n > 31 || n > ctx->bits) return (scmn_bsr_read)(ctx, n);
+    const uint32_t result = ctx->cache >> (32 - n);
+    ctx->cache <<= n;
+    ctx->bits -= n;
+    return result;
+}
+
+static inline uint32_t scmn_bsr_read1_inline(scmn_bsr_ctx *ctx) {
+    if (ctx->bits < 1) return (scmn_bsr_read1)(ctx);
+    const uint32_t result = ctx->cache >> 31;
+    ctx->cache <<= 1;
+    ctx->bits--;
+    return result;
+}
+
+static inline void scmn_bsr_skip_inline(scmn_bsr_ctx *ctx, int32_t n) {
+    if (n < 1 || n > 31 || n > ctx->bits) {
+        (scmn_bsr_skip)(ctx, n);
+    } else {
+        ctx->cache <<= n;
+        ctx->bits -= n;
+    }
+}
+
+static inline uint32_t scmn_bsr_peek_inline(scmn_bsr_ctx *ctx, int32_t n) {
+    if (n < 1 || n > 32 || n > ctx->bits) return (scmn_bsr_peek)(ctx, n);
+    return ctx->cache >> (32 - n);
+}
+
+static inline int32_t scmn_bsw_write1_inline(scmn_bsw_ctx *ctx, uint32_t bit) {
+    /* A byte's first bit has to ask whether there is room, and its last one ends it. */
+    if (ctx->free_bits < 2 || ctx->free_bits > 7) return (scmn_bsw_write1)(ctx, bit);
+    *ctx->cur = (*ctx->cur * 2u + (bit & 1u)) & 0xFFu;
+    ctx->free_bits--;
+    return 0;
+}
+
+#define scmn_bsr_read(ctx, n) scmn_bsr_read_inline(ctx, n)
+#define scmn_bsr_read1(ctx) scmn_bsr_read1_inline(ctx)
+#define scmn_bsr_skip(ctx, n) scmn_bsr_skip_inline(ctx, n)
+#define scmn_bsr_peek(ctx, n) scmn_bsr_peek_inline(ctx, n)
+#define scmn_bsw_write1(ctx, bit) scmn_bsw_write1_inline(ctx, bit)
+
+#endif
+
 SIMGP_END_DECLS
 
 #endif

@@ -14,6 +14,8 @@ namespace simgp::avx2 {
 inline constexpr int bytes = 32;
 inline constexpr int blocks = 2;
 inline constexpr bool moves_pointers = false;
+inline constexpr int window_bytes = 16;
+inline constexpr int windows = bytes / window_bytes;
 
 // One register type stands for all lanes.
 using u8v = __m256i;
@@ -43,7 +45,7 @@ inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
     };
     return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
 }
-inline u8v gather_blocks(const uint8_t *p, const int32_t *at) {
+inline u8v gather_windows(const uint8_t *p, const int32_t *at) {
     const auto block = [=](int j) {
         return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + at[j]));
     };
@@ -231,6 +233,8 @@ inline u8v zip_high(u8v a, u8v b) {
 }
 inline u8v blend_u32(u8v a, u8v b) { return _mm256_blend_epi32(a, b, 0xAA); }
 inline u8v shuffle(u8v v, u8v index) { return _mm256_shuffle_epi8(v, index); }
+inline u8v pick(u8v v, u8v index) { return shuffle(v, index); }
+inline u8v pick_or_zero(u8v v, u8v index) { return shuffle(v, index); }
 // Each block reversed, then the blocks exchanged.
 inline u8v reverse_blocks(u8v v, __m128i order) {
     return _mm256_permute4x64_epi64(shuffle(v, _mm256_broadcastsi128_si256(order)), 0x4E);

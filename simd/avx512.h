@@ -14,6 +14,8 @@ namespace simgp::avx512 {
 inline constexpr int bytes = 64;
 inline constexpr int blocks = 4;
 inline constexpr bool moves_pointers = false;
+inline constexpr int window_bytes = bytes;
+inline constexpr int windows = 1;
 
 // One register type stands for all lanes.
 using u8v = __m512i;
@@ -47,15 +49,9 @@ inline u8v load_blocks(const uint8_t *p, ptrdiff_t step) {
     v = _mm512_inserti32x4(v, block(2), 2);
     return _mm512_inserti32x4(v, block(3), 3);
 }
+// A byte permutation knows no blocks: the window is the vector.
+inline u8v gather_windows(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
 // Extracted to memory from the lower or the upper half, a block needs no permutation either.
-inline u8v gather_blocks(const uint8_t *p, const int32_t *at) {
-    const auto block = [=](int j) {
-        return _mm_loadu_si128(reinterpret_cast<const __m128i *>(p + at[j]));
-    };
-    const __m256i low = _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
-    const __m256i high = _mm256_inserti128_si256(_mm256_castsi128_si256(block(2)), block(3), 1);
-    return _mm512_inserti64x4(_mm512_castsi256_si512(low), high, 1);
-}
 inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
     const auto put = [=](int j, __m128i block) {
         _mm_storeu_si128(reinterpret_cast<__m128i *>(p + j * step), block);
@@ -235,6 +231,10 @@ inline u8v zip_high(u8v a, u8v b) {
 }
 inline u8v blend_u32(u8v a, u8v b) { return _mm512_mask_blend_epi32(0xAAAA, a, b); }
 inline u8v shuffle(u8v v, u8v index) { return _mm512_shuffle_epi8(v, index); }
+inline u8v pick(u8v v, u8v index) { return _mm512_permutexvar_epi8(index, v); }
+inline u8v pick_or_zero(u8v v, u8v index) {
+    return _mm512_maskz_permutexvar_epi8(_mm512_testn_epi8_mask(index, set_u8(0x80)), index, v);
+}
 struct reverse_index {
     alignas(64) uint8_t u8[64], u16[64];
     constexpr reverse_index() : u8(), u16() {

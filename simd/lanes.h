@@ -30,6 +30,9 @@ namespace simgp::SIMD_LANES_NAMESPACE {
 inline constexpr int bytes = SIMD_LANES_BYTES;
 inline constexpr int blocks = bytes / 16;
 inline constexpr bool moves_pointers = true;
+// What bytes can be picked from: a block, or a vector of 64 bytes.
+inline constexpr int window_bytes = bytes == 64 ? 64 : 16;
+inline constexpr int windows = bytes / window_bytes;
 
 template <typename T>
 struct vec {
@@ -107,9 +110,9 @@ inline void store_blocks(uint8_t *p, ptrdiff_t step, u8v v) {
     for (int i = 0; i < bytes; i++) p[i / 16 * step + i % 16] = v.lane[i];
 }
 
-// Block j from the 16 bytes at p + at[j].
-inline u8v gather_blocks(const uint8_t *p, const int32_t *at) {
-    return make<u8v>([&](int i) { return p[at[i / 16] + i % 16]; });
+// Window j from the bytes at p + at[j].
+inline u8v gather_windows(const uint8_t *p, const int32_t *at) {
+    return make<u8v>([&](int i) { return p[at[i / window_bytes] + i % window_bytes]; });
 }
 
 // A store to an address that is a multiple of `bytes`, past the caches where the machine can do
@@ -449,6 +452,16 @@ inline u8v blend_u32(u8v a, u8v b) {
 inline u8v shuffle(u8v v, u8v index) {
     return make<u8v>(
         [&](int i) { return index.lane[i] < 128 ? v.lane[i / 16 * 16 + index.lane[i] % 16] : 0; });
+}
+// The same within windows, of indexes below window_bytes; and with any index from 128 on for a 0.
+inline u8v pick(u8v v, u8v index) {
+    return make<u8v>([&](int i) {
+        return v.lane[i / window_bytes * window_bytes + index.lane[i] % window_bytes];
+    });
+}
+inline u8v pick_or_zero(u8v v, u8v index) {
+    const u8v picked = pick(v, index);
+    return make<u8v>([&](int i) { return index.lane[i] < 128 ? picked.lane[i] : 0; });
 }
 // Across the whole vector: its bytes, or its byte pairs, last to first.
 inline u8v reverse_u8(u8v v) {

@@ -14,6 +14,8 @@ namespace simgp::neon {
 inline constexpr int bytes = 16;
 inline constexpr int blocks = 1;
 inline constexpr bool moves_pointers = true;
+inline constexpr int window_bytes = 16;
+inline constexpr int windows = bytes / window_bytes;
 
 using u8v = uint8x16_t;
 using u16v = uint16x8_t;
@@ -47,7 +49,7 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
-inline u8v gather_blocks(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
+inline u8v gather_windows(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
 inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
 
 inline u8v set_u8(uint8_t x) { return vdupq_n_u8(x); }
@@ -302,6 +304,8 @@ inline u8v shuffle(u8v v, u8v index) {
     return vcombine_u8(vtbl2_u8(table, vget_low_u8(index)), vtbl2_u8(table, vget_high_u8(index)));
 #endif
 }
+inline u8v pick(u8v v, u8v index) { return shuffle(v, index); }
+inline u8v pick_or_zero(u8v v, u8v index) { return shuffle(v, index); }
 // Each half reversed, then the halves exchanged.
 inline u8v reverse_u8(u8v v) {
     const u8v halves = vrev64q_u8(v);

@@ -14,6 +14,8 @@ namespace simgp::sse41 {
 inline constexpr int bytes = 16;
 inline constexpr int blocks = 1;
 inline constexpr bool moves_pointers = false;
+inline constexpr int window_bytes = 16;
+inline constexpr int windows = bytes / window_bytes;
 
 // One register type stands for all lanes.
 using u8v = __m128i;
@@ -34,7 +36,7 @@ inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
 }
 
 inline u8v load_blocks(const uint8_t *p, ptrdiff_t) { return load(p); }
-inline u8v gather_blocks(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
+inline u8v gather_windows(const uint8_t *p, const int32_t *at) { return load(p + at[0]); }
 inline void store_blocks(uint8_t *p, ptrdiff_t, u8v v) { store(p, v); }
 
 inline u8v set_u8(uint8_t x) { return _mm_set1_epi8(static_cast<char>(x)); }
@@ -203,6 +205,8 @@ inline u8v zip_high(u8v a, u8v b) {
 }
 inline u8v blend_u32(u8v a, u8v b) { return _mm_blend_epi16(a, b, 0xCC); }
 inline u8v shuffle(u8v v, u8v index) { return _mm_shuffle_epi8(v, index); }
+inline u8v pick(u8v v, u8v index) { return shuffle(v, index); }
+inline u8v pick_or_zero(u8v v, u8v index) { return shuffle(v, index); }
 inline u8v reverse_u8(u8v v) {
     return shuffle(v, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
 }

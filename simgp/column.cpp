@@ -9,8 +9,8 @@ void gather_column(const planes_to_rgb &p, const column &c, ptrdiff_t first, ptr
     const bool packed = is_packed(p.layout);
     const ptrdiff_t size = packed ? 2 : 1;
     for (int r = 0; r < rows; r++)
-        copy_lines({p.y.line(p.lead + rows * first + r) + size * c.x, rows * p.y.stride},
-                   {to.y[r], size * pitch}, size * c.width, count);
+        copy_lines(p.y.from(size * c.x, p.lead + rows * first + r, rows), {to.y[r], size * pitch},
+                   size * c.width, count);
     const auto chroma = [&](const const_lines &from, uint8_t *at, ptrdiff_t x, ptrdiff_t step,
                             ptrdiff_t bytes) {
         copy_lines(from.from(x, p.lead + first), {at, step}, bytes, count);
@@ -37,10 +37,9 @@ void scatter_column(const pixel_column &from, const planes_to_rgb &p, const colu
                     ptrdiff_t first, ptrdiff_t count) {
     const int rows = p.two_rows ? 2 : 1;
     for (int r = 0; r < rows; r++)
-        copy_lines(
-            const_lines{from.rgb[r], p.pixel_bytes * pitch_of(c)},
-            {p.dst.line(p.lead + rows * first + r) + p.pixel_bytes * c.x, rows * p.dst.stride},
-            p.pixel_bytes * c.width, count);
+        copy_lines(const_lines{from.rgb[r], p.pixel_bytes * pitch_of(c)},
+                   p.dst.from(p.pixel_bytes * c.x, p.lead + rows * first + r, rows),
+                   p.pixel_bytes * c.width, count);
 }
 
 }  // namespace simgp

@@ -469,31 +469,25 @@ void chroma_of_pixels(const job &j, const rgb_weights &w, const uint8_t *a, cons
 
 // The last pixels of lines, or of pairs of them, each as the first of two, whose second has no meaning.
 void convert_rgb_column(const job &j, const rgb_weights &w, any_to_yuv_row *row, int chroma_bytes,
-                        ptrdiff_t rows_at_once) {
-    const ptrdiff_t last = j.width - 1, at_once = rows_at_once;
+                        ptrdiff_t at_once) {
+    const ptrdiff_t last = j.width - 1;
     const int size = j.from.bytes[0];
     uint8_t pixels[2][4 * column_pixels] = {}, y[2][column_pixels], u[column_pixels],
                           v[column_pixels];
-    const auto lines_of_plane = [&](int plane, ptrdiff_t x, ptrdiff_t row_at, ptrdiff_t apart) {
-        const lines of = j.out(plane);
-        return lines{of.line(row_at) + x, apart * of.stride};
-    };
     in_column_blocks(j.height / at_once, column_pixels / 2, [&](ptrdiff_t first, ptrdiff_t count) {
-        const const_lines in = j.in(0);
         for (ptrdiff_t r = 0; r < at_once; r++)
-            copy_lines({in.line(at_once * first + r) + size * last, at_once * in.stride},
+            copy_lines(j.in(0).from(size * last, at_once * first + r, at_once),
                        {pixels[r], 2 * size}, size, count);
         row(w, pixels[0], at_once == 2 ? pixels[1] : nullptr, y[0], y[1],
             chroma_bytes ? u : nullptr, chroma_bytes == 1 ? v : nullptr, 2 * count);
         for (ptrdiff_t r = 0; r < at_once; r++)
-            copy_lines(const_lines{y[r], 2}, lines_of_plane(0, last, at_once * first + r, at_once),
-                       1, count);
+            copy_lines(const_lines{y[r], 2}, j.out(0).from(last, at_once * first + r, at_once), 1,
+                       count);
         if (!chroma_bytes) return;
         const ptrdiff_t x = chroma_bytes * (last / 2);
-        copy_lines(const_lines{u, chroma_bytes}, lines_of_plane(j.to.u, x, first, 1), chroma_bytes,
-                   count);
+        copy_lines(const_lines{u, chroma_bytes}, j.out(j.to.u).from(x, first), chroma_bytes, count);
         if (chroma_bytes == 1)
-            copy_lines(const_lines{v, 1}, lines_of_plane(j.to.v, x, first, 1), 1, count);
+            copy_lines(const_lines{v, 1}, j.out(j.to.v).from(x, first), 1, count);
     });
 }
 

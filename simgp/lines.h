@@ -15,8 +15,10 @@ struct plane_lines {
 
     Byte *line(ptrdiff_t y) const { return first + y * stride; }
     Byte *fetch(ptrdiff_t y) const { return line(y); }  // as a source of lines, see walk.h
-    // The lines from byte x of line y on.
-    plane_lines from(ptrdiff_t x, ptrdiff_t y) const { return {line(y) + x, stride}; }
+    // The lines from byte x of line y on, or every so many of them.
+    plane_lines from(ptrdiff_t x, ptrdiff_t y, ptrdiff_t apart = 1) const {
+        return {line(y) + x, apart * stride};
+    }
     // `height` lines from the last to the first.
     plane_lines upside_down(ptrdiff_t height) const {
         return {height > 0 ? line(height - 1) : first, -stride};

@@ -24,11 +24,16 @@ struct resize_axis {
 
     // Positions are 32-bit numbers.
     uint32_t at(ptrdiff_t i) const { return uint32_t(i) * step; }
-    ptrdiff_t cell(ptrdiff_t i) const { return ptrdiff_t(int32_t(at(i)) >> 18) * (1 << shift); }
-    int32_t phase(ptrdiff_t i) const { return int32_t(at(i) >> 15 & 7); }
     ptrdiff_t tap() const { return ptrdiff_t(1) << shift; }
-    // The second neighbour; the first again where it has no weight.
-    ptrdiff_t next(ptrdiff_t i) const { return cell(i) + (phase(i) ? tap() : 0); }
+    // Of a position: the neighbour before it, the phase, and the second neighbour, which is the first
+    // again where it has no weight.
+    ptrdiff_t cell_at(uint32_t at) const { return ptrdiff_t(int32_t(at) >> 18) * tap(); }
+    static int32_t phase_at(uint32_t at) { return int32_t(at >> 15 & 7); }
+    ptrdiff_t next_at(uint32_t at) const { return cell_at(at) + (phase_at(at) ? tap() : 0); }
+    // The same of a sample.
+    ptrdiff_t cell(ptrdiff_t i) const { return cell_at(at(i)); }
+    int32_t phase(ptrdiff_t i) const { return phase_at(at(i)); }
+    ptrdiff_t next(ptrdiff_t i) const { return next_at(at(i)); }
     // How far n samples reach, to the nearest sample that may be a neighbour.
     ptrdiff_t reach(ptrdiff_t n) const { return ptrdiff_t((at(n) + (1 << 17)) >> 18) * tap(); }
     // How much of the source the first n >= 1 samples need.
@@ -157,6 +162,7 @@ class resampled_lines {
         : r_(r),
           strip_(strip),
           source_(source),
+          ahead_(ahead()),
           ring_{ring, ring ? ring + r.ring_bytes(strip.columns) / 2 : nullptr} {}
 
     // Makes lines first ... first + count - 1 of the destination, the first at dst. Calls come in
@@ -180,12 +186,13 @@ class resampled_lines {
     // A next line of the same two rows comes along.
     int make_from_kept(ptrdiff_t line, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
         const resize_axis &y = r_.y;
-        const ptrdiff_t row = y.cell(line);
-        const bool pair = line + 1 < end && y.cell(line + 1) == row && y.phase(line + 1);
-        const ptrdiff_t below = pair ? y.next(line + 1) : y.next(line);
+        const uint32_t at = y.at(line), then = at + y.step;
+        const ptrdiff_t row = y.cell_at(at);
+        const bool pair = line + 1 < end && y.cell_at(then) == row && y.phase_at(then);
+        const ptrdiff_t below = y.next_at(pair ? then : at);
         const int count = pair ? 2 : 1, a = keep(row), c = below == row ? a : 1 - a;
-        const resize_line two[2] = {{ring_[a], ring_[c], y.phase(line)},
-                                    {ring_[a], ring_[c], y.phase(line + 1)}};
+        const resize_line two[2] = {{ring_[a], ring_[c], y.phase_at(at)},
+                                    {ring_[a], ring_[c], y.phase_at(then)}};
         if (held_[c] == below)
             r_.loops.down(strip_, two, count, dst, stride);
         else
@@ -204,46 +211,49 @@ class resampled_lines {
     // Keeps a row, and makes the lines above it.
     void blend(ptrdiff_t row, int at, const resize_line *above, int count, uint8_t *dst,
                ptrdiff_t stride) {
-        const ptrdiff_t reach = r_.y.reach(2);
-        r_.loops.across(strip_, source_.fetch(row), ring_[at],
-                        ahead(reach > rows_ahead ? reach : rows_ahead), above, count, dst, stride);
+        r_.loops.across(strip_, source_.fetch(row), ring_[at], ahead_, above, count, dst, stride);
         held_[at] = row;
     }
 
     // Of two lines that have a row in common the last of the one is the first of the other. A line of
     // phase 0 takes any row as its second, and so the next line's first.
-    bool shares_row(ptrdiff_t line) const {
-        return r_.y.phase(line) == 0 || r_.y.next(line) == r_.y.cell(line + 1);
+    bool shares_row(uint32_t at) const {
+        const resize_axis &y = r_.y;
+        return y.phase_at(at) == 0 || y.next_at(at) == y.cell_at(at + y.step);
     }
     // A line is made alone if the next one shares its row with the one after it, not with this one.
     int make_from_rows(ptrdiff_t line, ptrdiff_t end, uint8_t *dst, ptrdiff_t stride) {
         const resize_axis &y = r_.y;
-        const bool shares = shares_row(line);
-        const bool pair = line + 1 < end && (shares || line + 2 >= end || !shares_row(line + 1));
-        const uint8_t *const above = source_.fetch(y.cell(line));
+        const uint32_t at = y.at(line), then = at + y.step;
+        const bool shares = shares_row(at);
+        const bool pair = line + 1 < end && (shares || line + 2 >= end || !shares_row(then));
+        const uint8_t *const above = source_.fetch(y.cell_at(at));
         const uint8_t *const below =
-            source_.fetch(pair && shares ? y.cell(line + 1) : y.next(line));
-        resize_line two[2] = {{above, below, y.phase(line)}, {}};
+            source_.fetch(pair && shares ? y.cell_at(then) : y.next_at(at));
+        resize_line two[2] = {{above, below, y.phase_at(at)}, {}};
         if (pair)
-            two[1] = {shares ? below : source_.fetch(y.cell(line + 1)),
-                      source_.fetch(y.next(line + 1)), y.phase(line + 1)};
+            two[1] = {shares ? below : source_.fetch(y.cell_at(then)),
+                      source_.fetch(y.next_at(then)), y.phase_at(then)};
         const int count = pair ? 2 : 1;
-        r_.loops.both(strip_, two, count, dst, stride, ahead(y.reach(2)));
+        r_.loops.both(strip_, two, count, dst, stride, ahead_);
         return count;
     }
 
-    // Rows of a plane lie where they can be asked for before they are needed.
-    static constexpr ptrdiff_t rows_ahead = 3;
-    ptrdiff_t ahead(ptrdiff_t rows) const {
-        if constexpr (requires { source_.stride; })
-            return ptrdiff_t(size_t(rows) * size_t(source_.stride));
-        else
+    // Rows of a plane lie where they can be asked for before they are needed: by the next two lines,
+    // or, where rows are kept, some more.
+    ptrdiff_t ahead() const {
+        if constexpr (requires { source_.stride; }) {
+            const ptrdiff_t reach = r_.y.reach(2), least = r_.keeps() ? 3 : 0;
+            return ptrdiff_t(size_t(reach > least ? reach : least) * size_t(source_.stride));
+        } else {
             return 0;
+        }
     }
 
     const resampling &r_;
     const resize_strip &strip_;
     Source source_;
+    const ptrdiff_t ahead_;
     uint8_t *ring_[2];
     ptrdiff_t held_[2] = {-1, -1};
 };

@@ -70,7 +70,7 @@ void quarter_turn(const turned_samples &of, bool right, const resize_args &args)
     if (width < 1 || height < 1) return;
     const resize_args a = whole_samples(args, int(size));
     const lines dst = right ? a.dst : a.dst.upside_down(width);
-    transpose_block *const transpose = live_rows().rotate.transpose[size_t(of.kind)];
+    transpose_block *const transpose = live_rows(band).rotate.transpose[size_t(of.kind)];
     const resampling r(of.resized_as, a.step_x, a.step_y);
     const bool fetch = int64_t(width) * height * size >= fetch_from;
     for_each_block_of_lines(

@@ -135,7 +135,8 @@ template <class Rows>
     if ((p.height - p.lead) % 2) alone(p.height - 1, p.lead + units);
 }
 
-// Converts a picture of planes. rows_of(table) gives rows.one(y, u, v, dst, width) for one row and
+// Converts a column of a picture of planes, but for rows that have a chroma line to themselves.
+// rows_of(table) gives rows.one(y, u, v, dst, width) for one row and
 // rows.two(y0, y1, u, v, dst0, dst1, width) for two.
 template <class RowsOf>
 void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_of) {
@@ -152,7 +153,7 @@ void convert_column(const planes_to_rgb &p, const column &c, const RowsOf &rows_
         scatter_column(at, p, c, first, count);
     });
 }
-// Pictures narrower than `narrow` are a column.
+// Converts a picture of planes. One that is narrower than `narrow` is a column.
 template <class RowsOf>
 void convert_planes(const planes_to_rgb &p, ptrdiff_t narrow, const RowsOf &rows_of) {
     if (p.width < 1) return;

@@ -129,6 +129,40 @@ inline const conversion &conversion_named(const char *name) {
     abort();
 }
 
+// Converts pictures whose lines each cover the end of the one above, by a sample: they are to be written from
+// top to bottom. `shapes` are the planes as far as they are written.
+inline void check_overlapping_lines(const conversion &k, int32_t width, int32_t height,
+                                    const std::vector<plane_shape> &shapes) {
+    rng random(seed());
+    picture src(shapes_of(k.from, width, height));
+    src.fill(content::random, random);
+    for_each_target([&](const target_rows &) {
+        using planes = std::vector<std::vector<uint8_t>>;
+        const auto run = [&](int samples_apart) {
+            planes out;
+            uint8_t *dst[3] = {};
+            int32_t strides[3] = {};
+            for (size_t p = 0; p < shapes.size(); p++) {
+                out.emplace_back(size_t(shapes[p].row_bytes * shapes[p].rows));
+                dst[p] = out[p].data();
+                strides[p] = int32_t(shapes[p].row_bytes) + samples_apart * shapes[p].sample_bytes;
+            }
+            k.run(src.planes, src.widths, src.heights, src.strides, strides, dst);
+            return out;
+        };
+        const planes apart = run(0);
+        planes expected;
+        for (size_t p = 0; p < shapes.size(); p++) {
+            const ptrdiff_t line = shapes[p].row_bytes;
+            expected.emplace_back(apart[p].size());
+            for (ptrdiff_t y = 0; y < shapes[p].rows; y++)
+                memcpy(expected[p].data() + y * (line - shapes[p].sample_bytes),
+                       apart[p].data() + y * line, size_t(line));
+        }
+        EXPECT_EQ(run(-1), expected) << k.name;
+    });
+}
+
 }  // namespace rig
 
 #endif

@@ -457,6 +457,10 @@ TEST_F(play_test, ends_by_itself_after_its_frames) {
     press("period period period");
     EXPECT_EQ(finish(false), 0);
     expect_same(png("shot.png"), converted("clip.y4m", "--resize 80x60", 3), "the last frame");
+
+    // Nobody asked for a screenshot.
+    shell("SDL_VIDEODRIVER=dummy timeout 20 " SIMGP_PLAY
+          " -n 1 testcard:64x48; test ! -e simgp-play.png");
 }
 
 TEST_F(play_test, what_cannot_be_shown_ends_in_one_line) {

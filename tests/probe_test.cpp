@@ -60,13 +60,14 @@ std::string nal(uint8_t header, std::vector<bit_field> fields, bool long_code = 
     return unit;
 }
 
-// Pictures counted modulo 16, in frames or fields; with a count of 8 bits for their order, or none.
-std::string sequence_set(bool frames_only, bool ordered = false) {
+bit_field se(int value) { return ue(value > 0 ? 2 * uint32_t(value) - 1 : 2 * uint32_t(-value)); }
+
+// Pictures counted modulo 16, in frames or fields; and how their order is told, by a count of 8 bits or not
+// at all.
+const std::vector<bit_field> by_8_bits = {ue(0), ue(4)}, as_they_come = {ue(2)};
+std::string sequence_set(bool frames_only, const std::vector<bit_field> &order = as_they_come) {
     std::vector<bit_field> fields = {{77, 8}, {0, 8}, {30, 8}, ue(0), ue(0)};
-    if (ordered)
-        fields.insert(fields.end(), {ue(0), ue(4)});
-    else
-        fields.push_back(ue(2));
+    fields.insert(fields.end(), order.begin(), order.end());
     const std::vector<bit_field> rest = {ue(1),  {0, 1}, ue(10), ue(8), {frames_only, 1},
                                          {1, 1}, {0, 1}, {0, 1}};
     fields.insert(fields.end(), rest.begin(), rest.end());
@@ -152,8 +153,8 @@ TEST_F(probe_test, h264_slices_of_different_pictures) {
     const auto ordered = [](uint32_t block, uint32_t order) {
         return slice(false, block, 1, {}, 0, {{order, 8}});
     };
-    orders.add(sequence_set(true, true) + picture_set + slice(true, 0, 0, {}, 0, {{0, 8}}), true,
-               0);
+    orders.add(sequence_set(true, by_8_bits) + picture_set + slice(true, 0, 0, {}, 0, {{0, 8}}),
+               true, 0);
     orders.add(ordered(0, 2) + ordered(0, 2) + ordered(0x7FFF, 2), false, 0);
     orders.add(ordered(0, 3) + ordered(0, 3), false, 0);
     orders.add(ordered(0, 0x83), false, 0);
@@ -187,6 +188,35 @@ TEST_F(probe_test, h264_slices_of_different_pictures) {
               true, 0);
     for (uint32_t order : {0, 1, 2, 4, 7, 5}) zeros.add(wide(order) + wide(order), false, 0);
     expect_pictures(zeros, "H.264");
+}
+
+// Differences to the order that is expected, and to that of the second field, where the sets announce them.
+TEST_F(probe_test, h264_slices_of_pictures_out_of_order) {
+    const std::string set_of_differences = nal(0x68, {ue(0), ue(0), {0, 1}, {1, 1}, ue(0)}, true);
+    const std::vector<bit_field> in_cycles = {ue(1), {0, 1}, se(-3), se(5), ue(2), se(1), se(-1)};
+    struct {
+        std::vector<bit_field> order;
+        std::string picture_set;
+        std::vector<std::vector<bit_field>> slices;  // no two alike
+    } const kinds[] = {
+        {by_8_bits,
+         set_of_differences,
+         {{{0, 8}, se(0)}, {{0, 8}, se(1)}, {{0, 8}, se(-1)}, {{1, 8}, se(-1)}}},
+        {in_cycles,
+         set_of_differences,
+         {{se(0), se(0)}, {se(0), se(1)}, {se(-2), se(1)}, {se(-2), se(-1)}}},
+        {in_cycles, picture_set, {{se(0)}, {se(2)}, {se(-2)}}},
+    };
+    for (const auto &kind : kinds) {
+        stream s;
+        std::string sets = sequence_set(true, kind.order) + kind.picture_set;
+        for (const auto &order : kind.slices) {
+            const std::string one = slice(false, 0, 1, {}, 0, order);
+            s.add(sets + one + one, false, 0);
+            sets.clear();
+        }
+        expect_pictures(s, "H.264");
+    }
 }
 
 // What profiles with a format of chroma say before the count of pictures: scaling lists that end early

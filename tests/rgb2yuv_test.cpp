@@ -165,43 +165,9 @@ TEST(rgb2yuv, strides_are_rounded_down_to_whole_pixels) {
     }
 }
 
-// Each line covers the end of the one above, if its stride is shorter than a line.
 TEST(rgb2yuv, lines_that_overlap_are_written_from_top_to_bottom) {
-    const int32_t width = 65, height = 12;
-    rig::rng random(rig::seed());
-    std::vector<uint8_t> in(4 * width * height);
-    rig::fill_bytes(in.data(), in.size(), rig::content::random, random);
-    for (const conversion &k : kernels) {
-        const auto shapes = exact_shapes(k.to, width, height);
-        const int size = rig::shapes_of(k.from, 1, 1)[0].sample_bytes;
-        rig::for_each_target([&](const rig::target_rows &) {
-            const auto run = [&](int gap) {
-                std::vector<std::vector<uint8_t>> out;
-                uint8_t *dst[3] = {};
-                int32_t strides[3] = {};
-                for (size_t p = 0; p < shapes.size(); p++) {
-                    const int line = shapes[p].width * shapes[p].sample_bytes;
-                    strides[p] = line + gap * shapes[p].sample_bytes;
-                    out.emplace_back(size_t((line + 4) * height));
-                }
-                for (size_t p = 0; p < shapes.size(); p++) dst[p] = out[p].data();
-                uint8_t *const src[] = {in.data()};
-                const int32_t src_stride = size * width;
-                k.run(src, &width, &height, &src_stride, strides, dst);
-                return out;
-            };
-            const auto apart = run(0);
-            auto expected = apart;
-            for (size_t p = 0; p < shapes.size(); p++) {
-                std::fill(expected[p].begin(), expected[p].end(), uint8_t(0));
-                const int line = shapes[p].width * shapes[p].sample_bytes;
-                for (int y = 0; y < shapes[p].height; y++)
-                    memcpy(expected[p].data() + y * (line - shapes[p].sample_bytes),
-                           apart[p].data() + y * line, size_t(line));
-            }
-            EXPECT_EQ(run(-1), expected) << k.name;
-        });
-    }
+    for (const conversion &k : kernels)
+        rig::check_overlapping_lines(k, 65, 12, exact_shapes(k.to, 65, 12));
 }
 
 }  // namespace

@@ -239,6 +239,17 @@ TEST(yuv2rgb, empty_pictures_write_nothing) {
         }
 }
 
+// Where no two rows share their chroma, of pictures with columns and of such that are one as a whole.
+TEST(yuv2rgb, lines_that_overlap_are_written_from_top_to_bottom) {
+    for (const rig::family f : {rig::family::yuv_to_rgb, rig::family::packed_to_rgb})
+        for (const conversion &k : rig::conversions_of(f)) {
+            const rig::format &from = rig::format_of(k.from);
+            if (from.has_chroma() && from.at(channel::u).down > 1) continue;
+            for (const int width : {9, 65})
+                rig::check_overlapping_lines(k, width, 12, rig::shapes_of(k.to, width, 12));
+        }
+}
+
 // The luma of a line may lie in the same line of the output, W bytes from its start or more.
 TEST(yuv2rgb, grey_works_over_its_own_luma) {
     const rig::format &to = rig::format_of(SIMGP_FMT_RGB565);

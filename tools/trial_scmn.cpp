@@ -1,4 +1,5 @@
-// Trials of the functions scmn_*.
+// Trials of the functions scmn_*, the library's own of those that programs may have in place.
+#define SCMN_BITS_CALLED
 #include <string.h>
 
 #include "scmn/scmn.h"

@@ -31,16 +31,18 @@ struct two_vectors {
 
 template <int W>
 struct from_windows {
-    static constexpr bool natural = false;
+    static constexpr bool natural = !in_order_when_narrow;
     const step_plan<W> *plan;
 
     explicit from_windows(const resize_strip &s)
         : plan(reinterpret_cast<const step_plan<W> *>(s.plan)) {}
     SIMD_INLINE u8v vector(const uint8_t *row, int32_t t, int v) const {
         const step_plan<W> &p = plan[t];
-        u8v pairs = shuffle(gather_blocks(row, p.at[v][0]), load(p.index[v][0]));
-        for (int w = 1; w < W; w++)
-            pairs = bit_or(pairs, shuffle(gather_blocks(row, p.at[v][w]), load(p.index[v][w])));
+        if constexpr (W == 1) return pick(gather_windows(row, p.at[v][0]), load(p.index[v][0]));
+        u8v pairs = set_u8(0);
+        for (int w = 0; w < W; w++)
+            pairs =
+                bit_or(pairs, pick_or_zero(gather_windows(row, p.at[v][w]), load(p.index[v][w])));
         return pairs;
     }
     SIMD_INLINE two_vectors pairs(const uint8_t *row, int32_t t) const {
@@ -49,41 +51,49 @@ struct from_windows {
     SIMD_INLINE two_vectors weights(int32_t t) const {
         return {load(plan[t].weight[0]), load(plan[t].weight[1])};
     }
-    // A step with many windows reaches over several lines of the cache.
+    // A step reaches over several lines of the cache where there are many windows, or large ones.
     SIMD_INLINE void fetch_ahead(const uint8_t *row, ptrdiff_t ahead, int32_t t) const {
         const step_plan<W> &p = plan[t];
-        fetch(row, ahead + p.at[0][0][0]);
-        if constexpr (W > 1) fetch(row, ahead + p.at[1][0][0]);
-        if constexpr (W > 2) {
-            fetch(row, ahead + p.at[0][0][blocks - 1]);
-            fetch(row, ahead + p.at[1][0][blocks - 1]);
+        if constexpr (window_bytes > 16) {
+            for (int v = 0; v < 2; v++)
+                for (int w = 0; w < W; w++) fetch(row, ahead + p.at[v][w][0]);
+        } else {
+            fetch(row, ahead + p.at[0][0][0]);
+            if constexpr (W > 1) fetch(row, ahead + p.at[1][0][0]);
+            if constexpr (W > 2) {
+                fetch(row, ahead + p.at[0][0][windows - 1]);
+                fetch(row, ahead + p.at[1][0][windows - 1]);
+            }
         }
     }
 };
 
-// One window holds the pairs of 16 lanes.
+// One window holds the pairs of two groups.
 struct from_shared_windows : from_windows<1> {
     using from_windows<1>::from_windows;
     SIMD_INLINE two_vectors pairs(const uint8_t *row, int32_t t) const {
-        const u8v v = gather_blocks(row, plan[t].at[0][0]);
-        return {shuffle(v, load(plan[t].index[0][0])), shuffle(v, load(plan[t].index[1][0]))};
+        const u8v v = gather_windows(row, plan[t].at[0][0]);
+        return {pick(v, load(plan[t].index[0][0])), pick(v, load(plan[t].index[1][0]))};
+    }
+    SIMD_INLINE void fetch_ahead(const uint8_t *row, ptrdiff_t ahead, int32_t t) const {
+        fetch(row, ahead + plan[t].at[0][0][0]);
     }
 };
 
-// Pairs that lie in the row as they are: in the order of the windows, or in their own.
+// Pairs that lie in the row as they are: in the order of the groups, or in their own.
 template <bool Natural>
 struct from_row : from_windows<1> {
-    static constexpr bool natural = Natural;
+    static constexpr bool natural = Natural || !in_order_when_narrow;
     using from_windows<1>::from_windows;
     SIMD_INLINE two_vectors pairs(const uint8_t *row, int32_t t) const {
         const uint8_t *const p = row + plan[t].at[0][0][0];
-        if constexpr (Natural) return {load(p), load(p + bytes)};
+        if constexpr (natural) return {load(p), load(p + bytes)};
         return {load_blocks(p, 32), load_blocks(p + 16, 32)};
     }
 };
 
 struct from_afar {
-    static constexpr bool natural = false;
+    static constexpr bool natural = !in_order_when_narrow;
     const far_plan *plan;
 
     explicit from_afar(const resize_strip &s) : plan(reinterpret_cast<const far_plan *>(s.plan)) {}
@@ -112,11 +122,11 @@ SIMD_INLINE void for_each_step(const resize_strip &s, F f) {
     if (Use != use::made && s.windows == 1 && s.shared) {
         run(from_shared_windows(s), 0, steps);
     } else if (s.windows == 1) {
-        const from_windows<1> windows(s);
+        const from_windows<1> any(s);
         const from_row<Use == use::made> row(s);
         int32_t t = 0;
         for (int32_t end = s.direct_from;; end = steps) {
-            run(windows, t, end);
+            run(any, t, end);
             if (end == steps) break;
             run(row, end, s.direct_to);
             t = s.direct_to;
@@ -222,40 +232,64 @@ struct word_lanes {
 // The loops
 // --------------------------------------------------------------------------------------------------
 
-// A row that is shorter than a window is read from a copy.
-[[gnu::noinline]] static void copy_short_row(uint8_t (&copy)[16], const uint8_t *row,
-                                             int32_t count) {
-    memset(copy, 0, sizeof copy);
-    memcpy(copy, row, size_t(count));
+// What a strip needs whose rows are shorter than a window, or whose lines are shorter than a step: rows
+// are read from copies, and lines are written to the stack first. The loops know nothing of it.
+struct small_strip {
+    resize_strip strip;
+    uint8_t rows[4][window_bytes] = {}, lines[2][bytes];
+
+    explicit small_strip(const resize_strip &s) : strip(s) { strip.small = false; }
+
+    const uint8_t *row(int k, const uint8_t *p) {
+        if (strip.row_bytes >= window_bytes || strip.windows == 0) return p;
+        memcpy(rows[k], p, size_t(strip.row_bytes));
+        return rows[k];
+    }
+    void write(int32_t count, uint8_t *dst, ptrdiff_t stride) const {
+        const size_t size = size_t(strip.lanes < bytes ? strip.lanes : bytes);
+        for (int32_t k = 0; k < count; k++) memcpy(dst + k * stride, lines[k], size);
+    }
+    // Calls make(dst, stride) for the lines, wherever they go.
+    template <class Make>
+    void make_lines(int32_t count, uint8_t *dst, ptrdiff_t stride, Make make) {
+        if (strip.lanes >= bytes) return make(dst, stride);
+        make(lines[0], ptrdiff_t(bytes));
+        write(count, dst, stride);
+    }
+};
+[[gnu::noinline]] static void small_across(const resize_strip &s, const uint8_t *row, uint8_t *kept,
+                                           ptrdiff_t ahead, const resize_line *lines, int32_t count,
+                                           uint8_t *dst, ptrdiff_t stride,
+                                           resize_across_row *across) {
+    small_strip small(s);
+    const uint8_t *const from = small.row(0, row);
+    small.make_lines(count, dst, stride, [&](uint8_t *to, ptrdiff_t step) {
+        across(small.strip, from, kept, ahead, lines, count, to, step);
+    });
 }
-struct readable_row {
-    uint8_t copy[16];
-    const uint8_t *row;
+[[gnu::noinline]] static void small_down(const resize_strip &s, const resize_line *lines,
+                                         int32_t count, uint8_t *dst, ptrdiff_t stride,
+                                         resize_down_row *down) {
+    small_strip small(s);
+    small.make_lines(count, dst, stride, [&](uint8_t *to, ptrdiff_t step) {
+        down(small.strip, lines, count, to, step);
+    });
+}
+[[gnu::noinline]] static void small_both(const resize_strip &s, const resize_line *lines,
+                                         int32_t count, uint8_t *dst, ptrdiff_t stride,
+                                         ptrdiff_t ahead, resize_both_row *both) {
+    small_strip small(s);
+    resize_line copies[2] = {};
+    for (int32_t k = 0; k < count; k++)
+        copies[k] = {small.row(2 * k, lines[k].above), small.row(2 * k + 1, lines[k].below),
+                     lines[k].phase};
+    small.make_lines(count, dst, stride, [&](uint8_t *to, ptrdiff_t step) {
+        both(small.strip, copies, count, to, step, ahead);
+    });
+}
 
-    SIMD_INLINE readable_row(const resize_strip &s, const uint8_t *p) : row(p) {
-        if (s.row_bytes >= 16 || s.windows == 0) return;
-        copy_short_row(copy, p, s.row_bytes);
-        row = copy;
-    }
-};
-
-// Where a line is stored: a strip of less than a step goes through the stack.
-class written_line {
-  public:
-    SIMD_INLINE written_line(const resize_strip &s, uint8_t *dst)
-        : dst_(dst), part_(s.lanes < bytes ? s.lanes : 0), to(part_ ? copy_ : dst) {}
-    SIMD_INLINE ~written_line() {
-        if (part_) memcpy(dst_, copy_, size_t(part_));
-    }
-
-  private:
-    uint8_t copy_[bytes];
-    uint8_t *const dst_;
-    const int32_t part_;
-
-  public:
-    uint8_t *const to;
-};
+// What was made narrow: from two halves of a step, or else from groups in turn.
+SIMD_INLINE u8v in_order_of_lanes(bool halves, u8v v) { return halves ? by8_to_natural(v) : v; }
 
 // Writes N lines between two rows.
 template <class Pixel, int N>
@@ -265,21 +299,20 @@ struct lines_between {
     uint8_t *const to0, *const to1;
     const ptrdiff_t ahead;
 
-    lines_between(const resize_line *lines, const written_line &line0, const written_line &line1,
-                  ptrdiff_t stride)
+    lines_between(const resize_line *lines, uint8_t *dst, ptrdiff_t stride)
         : first(lines[0].phase),
           second(lines[N - 1].phase),
-          to0(line0.to),
-          to1(line1.to),
+          to0(dst),
+          to1(dst + (N - 1) * stride),
           ahead(N * stride) {}
 
     template <class Blend>
     SIMD_INLINE void write(const Blend &a, const Blend &b, int32_t lane) const {
         fetch_for_write(to0 + lane, ahead);
-        store(to0 + lane, Pixel::down(a, b, first));
+        store(to0 + lane, in_order_of_lanes(!in_order_when_narrow, Pixel::down(a, b, first)));
         if constexpr (N > 1) {
             fetch_for_write(to1 + lane, ahead);
-            store(to1 + lane, Pixel::down(a, b, second));
+            store(to1 + lane, in_order_of_lanes(!in_order_when_narrow, Pixel::down(a, b, second)));
         }
     }
 };
@@ -288,8 +321,7 @@ template <class Pixel, int N>
 static void lines_down(const resize_strip &s, const resize_line *lines, uint8_t *dst,
                        ptrdiff_t stride) {
     const uint8_t *const above = lines[0].above, *const below = lines[0].below;
-    const written_line line0(s, dst), line1(s, dst + (N - 1) * stride);
-    const lines_between<Pixel, N> made(lines, line0, line1, stride);
+    const lines_between<Pixel, N> made(lines, dst, stride);
     const auto step = [=](int32_t t, int32_t lane) SIMD_INLINED {
         const ptrdiff_t at = ptrdiff_t(t) * Pixel::kept_vectors * bytes;
         made.write(Pixel::kept(above + at), Pixel::kept(below + at), lane);
@@ -301,33 +333,30 @@ static void lines_down(const resize_strip &s, const resize_line *lines, uint8_t 
 template <class Pixel>
 static void down(const resize_strip &s, const resize_line *lines, int32_t count, uint8_t *dst,
                  ptrdiff_t stride) {
+    if (s.small) return small_down(s, lines, count, dst, stride, down<Pixel>);
     if (count == 1) return lines_down<Pixel, 1>(s, lines, dst, stride);
     lines_down<Pixel, 2>(s, lines, dst, stride);
 }
 
 template <class Pixel>
 static void row_across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t ahead) {
-    const readable_row from(s, row);
-    const uint8_t *const p = from.row;
     for_each_step<use::kept>(s, [=](const auto &source, int32_t t, int32_t) SIMD_INLINED {
         source.fetch_ahead(row, ahead, t);
         Pixel::keep(kept + t * Pixel::kept_vectors * bytes,
-                    Pixel::across(source.pairs(p, t), source.weights(t)));
+                    Pixel::across(source.pairs(row, t), source.weights(t)));
     });
 }
 template <class Pixel, int N>
 static void across_and_down(const resize_strip &s, const uint8_t *row, uint8_t *kept,
                             ptrdiff_t ahead, const resize_line *lines, uint8_t *dst,
                             ptrdiff_t stride) {
-    const readable_row from(s, row);
-    const uint8_t *const p = from.row, *const above = lines[0].above;
-    const written_line line0(s, dst), line1(s, dst + (N - 1) * stride);
-    const lines_between<Pixel, N> made(lines, line0, line1, stride);
+    const uint8_t *const above = lines[0].above;
+    const lines_between<Pixel, N> made(lines, dst, stride);
     for_each_step<use::kept_and_made>(
         s, [=](const auto &source, int32_t t, int32_t lane) SIMD_INLINED {
             const ptrdiff_t at = ptrdiff_t(t) * Pixel::kept_vectors * bytes;
             source.fetch_ahead(row, ahead, t);
-            const auto b = Pixel::across(source.pairs(p, t), source.weights(t));
+            const auto b = Pixel::across(source.pairs(row, t), source.weights(t));
             const auto a = Pixel::kept(above + at);
             Pixel::keep(kept + at, b);
             made.write(a, b, lane);
@@ -336,6 +365,7 @@ static void across_and_down(const resize_strip &s, const uint8_t *row, uint8_t *
 template <class Pixel>
 static void across(const resize_strip &s, const uint8_t *row, uint8_t *kept, ptrdiff_t ahead,
                    const resize_line *lines, int32_t count, uint8_t *dst, ptrdiff_t stride) {
+    if (s.small) return small_across(s, row, kept, ahead, lines, count, dst, stride, across<Pixel>);
     const bool rare = s.windows == 0 || s.windows == 4;
     if (count == 0 || rare) {
         row_across<Pixel>(s, row, kept, ahead);
@@ -354,15 +384,13 @@ static void lines_at_once(const resize_strip &s, const resize_line *lines, uint8
                           ptrdiff_t stride, ptrdiff_t ahead) {
     using phase = typename Pixel::phase;
     const resize_line &l0 = lines[0], &l1 = lines[N - 1];
-    const readable_row r0(s, l0.above), r1(s, l0.below), r2(s, l1.above), r3(s, l1.below);
-    const uint8_t *const above0 = r0.row, *const below0 = r1.row;
-    const uint8_t *const above1 = r2.row, *const below1 = r3.row;
+    const uint8_t *const above0 = l0.above, *const below0 = l0.below;
+    const uint8_t *const above1 = l1.above, *const below1 = l1.below;
     const phase first(l0.phase), second(l1.phase);
-    const written_line line0(s, dst), line1(s, dst + (N - 1) * stride);
-    uint8_t *const to0 = line0.to, *const to1 = line1.to;
+    uint8_t *const to0 = dst, *const to1 = dst + (N - 1) * stride;
     for_each_step<use::made>(s, [=](const auto &source, int32_t t, int32_t lane) SIMD_INLINED {
         const auto ordered = [&](u8v v)
-                                 SIMD_INLINED { return source.natural ? by8_to_natural(v) : v; };
+                                 SIMD_INLINED { return in_order_of_lanes(source.natural, v); };
         const two_vectors weights = source.weights(t);
         const auto blend = [&](const uint8_t *row) SIMD_INLINED {
             source.fetch_ahead(row, ahead, t);
@@ -388,6 +416,7 @@ static void lines_at_once(const resize_strip &s, const resize_line *lines, uint8
 template <class Pixel>
 static void both(const resize_strip &s, const resize_line *lines, int32_t count, uint8_t *dst,
                  ptrdiff_t stride, ptrdiff_t ahead) {
+    if (s.small) return small_both(s, lines, count, dst, stride, ahead, both<Pixel>);
     if (count == 1) return lines_at_once<Pixel, 1, false>(s, lines, dst, stride, ahead);
     if (lines[0].below == lines[1].above)
         return lines_at_once<Pixel, 2, true>(s, lines, dst, stride, ahead);

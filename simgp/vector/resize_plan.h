@@ -1,10 +1,11 @@
 // The plan of a strip: where the samples that a step blends across lie in a row of the source.
 //
 // A lane is a byte of the destination's line; a step makes `bytes` of them from two vectors of byte
-// pairs, P and Q of each lane. The first vector holds the pairs of lanes 0 ... 7 of each block of 16,
-// the second those of lanes 8 ... 15, so that narrow() puts the lanes in order. The pairs of 8 lanes
-// come from windows, 16 bytes of the row each, through a shuffle. Windows that would end behind the
-// row begin earlier.
+// pairs, P and Q of each lane. They are picked from windows of the row, each of which holds the pairs
+// of a group of lanes, window_bytes / 2. The vectors take the groups in turn: of blocks, the first one
+// holds the pairs of lanes 0 ... 7 of each 16, the second those of lanes 8 ... 15, and narrow() puts
+// the lanes in order; of windows that are vectors, each holds half of the step. Windows that would
+// end behind the row begin earlier.
 #ifndef SIMGP_VECTOR_RESIZE_PLAN_H
 #define SIMGP_VECTOR_RESIZE_PLAN_H
 
@@ -14,12 +15,26 @@
 
 namespace simgp::SIMD_TARGET {
 
-// A step whose groups of 8 lanes take W windows each.
+inline constexpr int group_lanes = window_bytes / 2;
+// Narrowed, the lanes of a step are in order.
+inline constexpr bool in_order_when_narrow = windows == blocks;
+
+// Of a step, the lanes that are planned at once: eight, from lane 8 k on. Their pairs lie in vector v,
+// from byte `at` on, which is in window j.
+struct pairs_place {
+    int v, j, at;
+    explicit pairs_place(int k)
+        : v(8 * k / group_lanes % 2),
+          j(8 * k / group_lanes / 2),
+          at(j * window_bytes + 16 * k % window_bytes) {}
+};
+
+// A step whose groups of lanes take W windows each.
 template <int W>
 struct step_plan {
     alignas(bytes) uint8_t weight[2][bytes];  // of the first and of the second vector
     uint8_t index[2][W][bytes];
-    int32_t at[2][W][blocks];  // where the windows begin
+    int32_t at[2][W][windows];  // where the windows begin
 };
 // Where windows do not help, pairs are taken byte by byte.
 struct far_plan {
@@ -32,33 +47,38 @@ static_assert(alignof(far_plan) <= resize_alignment);
 inline int64_t cells_apart(const resize_strip &s, int steps) {
     return ((int64_t(s.step) * steps + (1 << 18) - 1) >> 18) << s.shift;
 }
-// Bytes from the first to the last that 8 lanes need. Of pixels of 3 bytes they touch 3, or 4; then
-// they begin with the last byte of the first one, or end with the first byte of the last one.
+// Bytes from the first to the last that a group needs. Of pixels of 3 bytes 8 lanes touch 3, or 4;
+// then they begin with the last byte of the first one, or end with the first byte of the last one. Of
+// 32 lanes it is the same, as there are two more than whole pixels again.
 template <int C>
-int64_t window_bytes(const resize_strip &s) {
+int64_t group_bytes(const resize_strip &s) {
     const int64_t tap = int64_t(1) << s.shift;
     if constexpr (C == 3) {
-        const int64_t three = 3 * (cells_apart(s, 2) + tap) + 2;
-        const int64_t four = 3 * (cells_apart(s, 3) + tap) - 1;
-        return four > three ? four : three;
+        static_assert(group_lanes % 3 == 2);
+        const int64_t fewer = 3 * (cells_apart(s, group_lanes / 3) + tap) + 2;
+        const int64_t more = 3 * (cells_apart(s, group_lanes / 3 + 1) + tap) - 1;
+        return more > fewer ? more : fewer;
     } else {
-        return C * (cells_apart(s, 8 / C - 1) + tap) + C;
+        return C * (cells_apart(s, group_lanes / C - 1) + tap) + C;
     }
 }
-// The same of 16 lanes, in whole pixels.
+// The same of two groups, in whole pixels.
 template <int C>
-int64_t shared_window_bytes(const resize_strip &s) {
+int64_t two_groups_bytes(const resize_strip &s) {
+    constexpr int lanes = 2 * group_lanes;
     const int64_t tap = int64_t(1) << s.shift;
-    return C * (cells_apart(s, C == 3 ? 5 : 16 / C - 1) + tap) + C;
+    return C * (cells_apart(s, C == 3 ? lanes / 3 : lanes / C - 1) + tap) + C;
 }
 
 template <int C>
 static void measure(resize_strip &s, int32_t kept_vectors) {
-    const int64_t need = window_bytes<C>(s);
-    s.windows = need <= 16 ? 1 : need <= 32 ? 2 : need <= 64 ? 4 : 0;
+    const int64_t need = group_bytes<C>(s);
+    s.windows = 0;
+    for (int n = 4; n > 0; n /= 2)
+        if (need <= n * window_bytes) s.windows = n;
     // Many windows are more work than what is gained by not keeping rows.
     if (s.windows == 0 || s.windows == 4) s.keeps = true;
-    s.shared = s.windows == 1 && shared_window_bytes<C>(s) <= 16;
+    s.shared = s.windows == 1 && two_groups_bytes<C>(s) <= window_bytes;
     const size_t plan = s.windows == 1   ? sizeof(step_plan<1>)
                         : s.windows == 2 ? sizeof(step_plan<2>)
                         : s.windows == 4 ? sizeof(step_plan<4>)
@@ -179,30 +199,39 @@ class lanes_in_turn {
     int32_t column_ = 0, k_ = 0;
 };
 
-inline constexpr uint8_t in_order[16] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
+struct bytes_in_order {
+    uint8_t at[window_bytes];
+    constexpr bytes_in_order() : at() {
+        for (int i = 0; i < window_bytes; i++) at[i] = uint8_t(i);
+    }
+};
+static constexpr bytes_in_order in_order{};
 
-// The part of a step in block j of vector v. Returns whether its pairs lie in the row as they are.
+// Eight lanes of a group whose first byte is `first`. Returns whether their pairs lie in the row as
+// they are.
 template <int W>
-[[gnu::always_inline]] inline bool plan_block(const eight_lanes &l, int32_t limit, bool shared,
-                                              step_plan<W> &p, int v, int j) {
+[[gnu::always_inline]] inline bool plan_eight(const eight_lanes &l, int32_t first, int32_t limit,
+                                              bool shared, step_plan<W> &p, const pairs_place &to) {
     plan_pairs moved = {};
     for (int w = 0; w < W; w++) {
-        const int32_t from = l.first + 16 * w;
-        const int32_t base = shared && v ? p.at[0][0][j] : from < limit ? from : limit;
-        p.at[v][w][j] = base;
+        const int32_t from = first + window_bytes * w;
+        const int32_t base = shared && to.v ? p.at[0][0][to.j] : from < limit ? from : limit;
+        p.at[to.v][w][to.j] = base;
         for (int h = 0; h < plan_parts; h++) {
             plan_vector low = l.p[h] - base, high = low + l.apart[h];
             if constexpr (W > 1) {
-                const plan_vector in_low = ((l.p[h] - from) & ~15) == 0;
-                const plan_vector in_high = ((l.p[h] + l.apart[h] - from) & ~15) == 0;
+                constexpr int32_t beyond = -window_bytes;
+                const plan_vector in_low = ((l.p[h] - from) & beyond) == 0;
+                const plan_vector in_high = ((l.p[h] + l.apart[h] - from) & beyond) == 0;
                 low = (low & in_low) | (0x80 & ~in_low);
                 high = (high & in_high) | (0x80 & ~in_high);
             }
             const plan_pairs index = pairs_of(low, high);
-            put_pairs(p.index[v][w] + 16 * j, h, index);
+            put_pairs(p.index[to.v][w] + to.at, h, index);
             if constexpr (W == 1) {
                 plan_pairs as_they_are;
-                memcpy(&as_they_are, in_order + 16 / plan_parts * h, sizeof as_they_are);
+                memcpy(&as_they_are, in_order.at + to.at % window_bytes + 16 / plan_parts * h,
+                       sizeof as_they_are);
                 moved |= index ^ as_they_are;
             }
         }
@@ -218,7 +247,7 @@ template <int W>
 template <int W>
 static void plan_windows(resize_strip &s, plan_kind kind) {
     step_plan<W> *const plan = reinterpret_cast<step_plan<W> *>(s.plan);
-    const int32_t limit = s.row_bytes > 16 ? s.row_bytes - 16 : 0;
+    const int32_t limit = s.row_bytes > window_bytes ? s.row_bytes - window_bytes : 0;
     const bool shared = s.shared;
     lanes_in_turn lanes(s, kind.size);
     s.direct_from = s.direct_to = 0;
@@ -226,19 +255,24 @@ static void plan_windows(resize_strip &s, plan_kind kind) {
         step_plan<W> &p = plan[t];
         bool direct = W == 1;
         lanes.begin(begin_of_step(s, t));
+        int32_t first = 0;
 #pragma GCC unroll 1
         for (int k = 0; k < 2 * blocks; k++) {
             const eight_lanes l = lanes.next();
-            l.put_weights(p.weight[k & 1] + 8 * (k & ~1), kind.scale);
-            direct &= plan_block(l, limit, shared, p, k & 1, k / 2);
+            const pairs_place to(k);
+            if (8 * k % group_lanes == 0) first = l.first;
+            l.put_weights(p.weight[to.v] + to.at, kind.scale);
+            direct &= plan_eight(l, first, limit, shared, p, to);
         }
-        for (int j = 0; direct && j < blocks; j++)
-            for (int v = 0; v < 2; v++) direct = p.at[v][0][j] == p.at[0][0][0] + 32 * j + 16 * v;
+        for (int j = 0; direct && j < windows; j++)
+            for (int v = 0; v < 2; v++)
+                direct = p.at[v][0][j] == p.at[0][0][0] + window_bytes * (2 * j + v);
         if (!direct) continue;
         if (s.direct_to == s.direct_from) s.direct_from = s.direct_to = t;
         if (s.direct_to == t) s.direct_to = t + 1;
     }
-    for (int32_t t = s.direct_from; t < s.direct_to && !s.keeps; t++) {
+    if (!in_order_when_narrow || s.keeps) return;
+    for (int32_t t = s.direct_from; t < s.direct_to; t++) {
         uint8_t natural[2 * bytes];
         for (int k = 0; k < 2 * blocks; k++)
             memcpy(natural + 16 * k, plan[t].weight[k & 1] + 16 * (k / 2), 16);
@@ -254,10 +288,10 @@ static void plan_far(resize_strip &s, plan_kind kind) {
         lanes.begin(begin_of_step(s, t));
 #pragma GCC unroll 1
         for (int k = 0; k < 2 * blocks; k++) {
-            const int v = k & 1, j = k / 2;
+            const pairs_place to(k);
             const eight_lanes l = lanes.next();
-            l.put_weights(plan[t].weight[v] + 16 * j, kind.scale);
-            int32_t *const at = plan[t].at + v * bytes + 16 * j;
+            l.put_weights(plan[t].weight[to.v] + to.at, kind.scale);
+            int32_t *const at = plan[t].at + to.v * bytes + to.at;
             int32_t p[8], apart[8];
             memcpy(p, l.p, sizeof p);
             memcpy(apart, l.apart, sizeof apart);
@@ -273,6 +307,7 @@ static void plan_far(resize_strip &s, plan_kind kind) {
     s.lanes = s.columns * kind.size;
     s.steps = (s.lanes + bytes - 1) / bytes;
     s.last = s.lanes < bytes ? 0 : s.lanes - bytes;
+    s.small = s.lanes < bytes || (s.windows > 0 && s.row_bytes < window_bytes);
     switch (s.windows) {
         case 1:
             return plan_windows<1>(s, kind);

@@ -48,9 +48,9 @@ static const operation operations[] = {
     MEMORY("load_block_means", bytes, put(out, load_block_means(in - 2 * bytes, in - 5 * bytes))),
     MEMORY("load_blocks", bytes, put(out, load_blocks(in - 16 - (blocks - 1) * 23, 23))),
     MEMORY("load_blocks, upwards", bytes, put(out, load_blocks(in - 16, -bytes - 1))),
-    MEMORY("gather_blocks", bytes, int32_t at[blocks];
-           for (int j = 0; j < blocks; j++) at[j] = -17 - in[-j - 1] % (7 * 16);
-           put(out, gather_blocks(in, at))),
+    MEMORY("gather_windows", bytes, int32_t at[windows];
+           for (int j = 0; j < windows; j++) at[j] = -window_bytes - 1 - in[-j - 1] % (7 * 16);
+           put(out, gather_windows(in, at))),
     MEMORY("store_blocks", 24 * blocks - 8,
            for (int i = 0; i < 24 * blocks - 8; i++) out[i] = 0;
            store_blocks(out, 24, u8(in, 0))),
@@ -165,6 +165,9 @@ static const operation operations[] = {
     VECTOR("zip_low 8", u8, zip_low<8>(a, b)),
     VECTOR("zip_high 8", u8, zip_high<8>(a, b)),
     VECTOR("blend_u32", u8, blend_u32(a, b)),
+    VECTOR("pick", u8, pick(a, bit_and(b, set_u8(window_bytes - 1)))),
+    VECTOR("pick_or_zero", u8, pick_or_zero(a, bit_and(b, set_u8(0x80 | (window_bytes - 1))))),
+    VECTOR("pick_or_zero, zeros of any index", u8, pick_or_zero(a, bit_or(b, set_u8(0x80)))),
     VECTOR("shuffle", u8, shuffle(a, bit_and(b, set_u8(15)))),
     VECTOR("shuffle, zeros", u8, shuffle(a, bit_and(b, set_u8(0x8F)))),
     VECTOR("shuffle, zeros of any index", u8, shuffle(a, bit_or(b, set_u8(0x80)))),
