@@ -61,7 +61,7 @@ set(SIMGP_AREAS
   simgp/yuv2rgb)
 # Areas whose rows gain nothing by -O3: their loops are written out, and it only makes copies of them.
 set(SIMGP_SMALL_AREAS simgp/any simgp/layout simgp/resize simgp/rgb2yuv simgp/yuv2rgb)
-set(SIMGP_SMALL_AREAS_neon scmn/keyframe scmn/mem simgp/dither)
+set(SIMGP_SMALL_AREAS_neon scmn/mem simgp/dither)
 set(area_macro "#define SIMGP_AREAS(X)")
 foreach(area IN LISTS SIMGP_AREAS)
   get_filename_component(stem ${area} NAME)

@@ -522,6 +522,11 @@ inline pair_u8 load_split_by4(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by4(v.even), natural_to_by4(v.odd)};
 }
+// Calls f(moves) with those moves, or what means the same.
+template <class F>
+inline void with_split_moves(bool exchange, F f) {
+    f(set_split_moves(exchange));
+}
 // Byte pairs, or the same with even and odd exchanged.
 inline pairs_v exchange_pairs(pairs_v v, split_moves exchange) {
     return exchange ? make<u8v>([&](int i) { return v.lane[i ^ 1]; }) : v;
@@ -594,6 +599,20 @@ inline void store_zip4(uint8_t *p, u8v a, u8v b, u8v c, u8v d) {
         const int from = granule % blocks * 16 + granule / blocks * 4 + i % 4;
         for (int k = 0; k < 4; k++) p[4 * i + k] = v[k].lane[from];
     }
+}
+
+// Groups of four bytes, luma first or chroma first: from `bytes` bytes of luma at y and half as many at
+// u and at v, to twice `bytes` bytes.
+struct joined_groups {
+    u8v even, odd;
+};
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const u8v luma = load(y), chroma = load_zip(u, v);
+    return LumaFirst ? joined_groups{luma, chroma} : joined_groups{chroma, luma};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) {
+    store_zip8(p, natural_to_by8(g.even), natural_to_by8(g.odd));
 }
 
 // High bytes of 16-bit lanes: those of a and b in turn; those of a alone, bytes / 2, to memory.

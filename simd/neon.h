@@ -306,10 +306,15 @@ inline u8v shuffle(u8v v, u8v index) {
 }
 inline u8v pick(u8v v, u8v index) { return shuffle(v, index); }
 inline u8v pick_or_zero(u8v v, u8v index) { return shuffle(v, index); }
-// Each half reversed, then the halves exchanged.
+// Each half reversed, and the halves exchanged. On 32-bit ARM a half can be reversed into the other's place,
+// but GCC would move it there.
 inline u8v reverse_u8(u8v v) {
+#if defined __aarch64__ || !defined __clang__
     const u8v halves = vrev64q_u8(v);
     return vextq_u8(halves, halves, 8);
+#else
+    return vcombine_u8(vrev64_u8(vget_high_u8(v)), vrev64_u8(vget_low_u8(v)));
+#endif
 }
 inline u8v reverse_u16(u8v v) {
     const u8v halves = as_u8(vrev64q_u16(as_u16(v)));
@@ -341,6 +346,21 @@ inline split_moves set_split_moves(bool exchange) { return set_u8(exchange ? 255
 inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
     const pair_u8 v = load_split(p);
     return {vbslq_u8(exchange, v.odd, v.even), vbslq_u8(exchange, v.even, v.odd)};
+}
+// A loop for each order.
+template <bool Exchange>
+struct known_split_moves {};
+template <class F>
+[[gnu::always_inline]] inline void with_split_moves(bool exchange, F f) {
+    if (exchange)
+        f(known_split_moves<true>{});
+    else
+        f(known_split_moves<false>{});
+}
+template <bool Exchange>
+inline pair_u8 load_split(const uint8_t *p, known_split_moves<Exchange>) {
+    const pair_u8 v = load_split(p);
+    return Exchange ? pair_u8{v.odd, v.even} : v;
 }
 inline pairs_v exchange_pairs(pairs_v v, split_moves exchange) {
     const uint8x8_t m = vget_low_u8(exchange);
@@ -377,6 +397,25 @@ inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     const uint8x16x2_t v = {{even, odd}};
     vst2q_u8(p, v);
 }
+#ifdef __aarch64__
+using joined_groups = pair_u8;
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const u8v luma = load(y), chroma = load_zip(u, v);
+    return LumaFirst ? joined_groups{luma, chroma} : joined_groups{chroma, luma};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) { store_zip8(p, g.even, g.odd); }
+#else
+using joined_groups = uint8x8x4_t;
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const uint8x8x2_t luma = vld2_u8(y);
+    const uint8x8_t first = vld1_u8(u), second = vld1_u8(v);
+    if constexpr (LumaFirst) return {{luma.val[0], first, luma.val[1], second}};
+    return {{first, luma.val[0], second, luma.val[1]}};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) { vst4_u8(p, g); }
+#endif
 inline void store_zip16(uint8_t *p, u16v even, u16v odd) {
     const uint16x8x2_t zip = vzipq_u16(even, odd);
     vst1q_u8(p, as_u8(zip.val[0]));

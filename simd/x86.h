@@ -58,6 +58,14 @@ inline luma_chroma load_groups_natural(const uint8_t *p) {
 inline luma_chroma load_groups_by4(const uint8_t *p) { return groups_of(load_split_by4(p)); }
 inline luma_chroma exchanged(const luma_chroma &v) { return {v.pairs, v.y}; }
 
+using joined_groups = pair_u8;
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const u8v luma = natural_to_by8(load(y)), chroma = natural_to_by8(load_zip(u, v));
+    return LumaFirst ? joined_groups{luma, chroma} : joined_groups{chroma, luma};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) { store_zip8(p, g.even, g.odd); }
+
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
 inline u16v dot(u8v ac, u16v b) {
@@ -141,6 +149,10 @@ inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
 }
 
 // A shuffle is the same code for all orders.
+template <class F>
+[[gnu::always_inline]] inline void with_split_moves(bool swap, F f) {
+    f(set_split_moves(swap));
+}
 template <class F>
 [[gnu::always_inline]] inline void with_widen_moves(bool swap, bool to_alpha_first, F f) {
     f(set_widen_moves(swap, to_alpha_first));
