@@ -78,6 +78,8 @@ inline void store(uint8_t *p, u8v v) { memcpy(p, &v, bytes); }
 // Says that p has been moved by a constant to where the next load or store is.
 template <class T>
 inline void step_pointer(T *&) {}
+// Says that n is needed from here on, and not in the loop before.
+inline void keep_behind(ptrdiff_t &) {}
 // bytes / 2 bytes from p and as many from q, in turn.
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return make<u8v>([&](int i) {
@@ -670,26 +672,31 @@ inline u16v even_dot(rgb_v v) {
         return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
     });
 }
-// Factors that are known at run time, in the limits of the other two, of which these are the same
-// without D: (a c0 + b c1 + c c2) >> 8 of each pixel, for factors of 0 or more, and the sum of the
-// even pixels, for factors in -128 ... 127.
+// The same with factors that are known at run time, in the limits of the other two: weights of 0 or more
+// and an offset, and factors in -128 ... 127.
 struct channel_factors {
     int a, b, c;
 };
 inline channel_factors set_channel_factors(int a, int b, int c) { return {a, b, c}; }
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
+struct channel_weights {
+    int a, b, c, d;
+};
+inline channel_weights set_channel_weights(int a, int b, int c, int d) { return {a, b, c, d}; }
+inline u8v dot_high(rgb_v v, const channel_weights &w) {
     return make<u8v>([&](int i) {
-        return (f.a * v.c[0].lane[i] + f.b * v.c[1].lane[i] + f.c * v.c[2].lane[i]) >> 8;
+        return ((w.a * v.c[0].lane[i] + w.b * v.c[1].lane[i] + w.c * v.c[2].lane[i]) >> 8) + w.d;
     });
 }
-inline s16v even_dot(rgb_v v, const channel_factors &f) {
+// Half as many pixels: the even ones, or means of blocks.
+using half_rgb_v = rgb_v;
+inline half_rgb_v even_pixels(rgb_v v) { return v; }
+inline s16v even_dot(half_rgb_v v, const channel_factors &f) {
     return make<s16v>([&](int i) {
         return f.a * v.c[0].lane[2 * i] + f.b * v.c[1].lane[2 * i] + f.c * v.c[2].lane[2 * i];
     });
 }
-// The even pixels become the rounded means of blocks of four: of pixels 2i and 2i + 1 of a and of b. The
-// odd ones have no meaning.
-inline rgb_v block_means(rgb_v a, rgb_v b) {
+// The rounded means of blocks of four: of pixels 2i and 2i + 1 of a and of b.
+inline half_rgb_v block_means(rgb_v a, rgb_v b) {
     const auto means = [&](int k) {
         return make<u8v>([&](int i) {
             const uint8_t *const p = &a.c[k].lane[i & ~1], *const q = &b.c[k].lane[i & ~1];
@@ -697,6 +704,11 @@ inline rgb_v block_means(rgb_v a, rgb_v b) {
         });
     };
     return {means(0), means(1), means(2)};
+}
+// The high bytes of c - (f0 c0 + f1 c1 + f2 c2), saturated to 16 bits, signed, with two sets of factors
+// in turn.
+inline u8v dots_high(half_rgb_v v, const channel_factors &f, const channel_factors &g, s16v c) {
+    return join_high(as_u16(sub_sat(c, even_dot(v, f))), as_u16(sub_sat(c, even_dot(v, g))));
 }
 // Words of 5, 6 and 5 bits from three channels in by8 order, the first in the highest bits; the low
 // bits of each are dropped.

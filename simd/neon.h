@@ -36,6 +36,13 @@ template <class T>
 #endif
 }
 
+// What is computed from n alone GCC would put into the loop before, where it finds room for it.
+inline void keep_behind([[maybe_unused]] ptrdiff_t &n) {
+#if !defined __aarch64__ && !defined __clang__
+    asm volatile("" : "+r"(n));
+#endif
+}
+
 inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
 inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
@@ -487,33 +494,57 @@ inline u16v even_dot(rgb_v v) {
     sum = add_product<B>(sum, evens(v.val[1]));
     return add_product<C>(sum, evens(v.val[2]));
 }
-// The same with factors that are known at run time, each in all bytes. Those of the sum are signed;
-// of samples less 128 the products are signed as well, and the offset makes up for these.
-struct channel_factors {
+// The same with factors that are known at run time, each in all bytes, and an offset of high bytes.
+struct channel_weights {
     u8v a, b, c;
+    u16v d;
+};
+inline u8v set_factor(int k) { return vdupq_n_u8(static_cast<uint8_t>(k)); }
+inline channel_weights set_channel_weights(int a, int b, int c, int d) {
+    return {set_factor(a), set_factor(b), set_factor(c),
+            vdupq_n_u16(static_cast<uint16_t>(d << 8))};
+}
+inline u8v dot_high(rgb_v v, const channel_weights &w) {
+    return vcombine_u8(vaddhn_u16(dot_low(v, w.a, w.b, w.c), w.d),
+                       vaddhn_u16(dot_upper(v, w.a, w.b, w.c), w.d));
+}
+
+// Half as many pixels. Factors of their sum are signed; of samples less 128 the products are signed as
+// well, and the offset makes up for these.
+struct half_rgb_v {
+    uint8x8_t c[3];
+};
+inline half_rgb_v even_pixels(const rgb_v &v) {
+    const auto evens = [](u8v c) { return vmovn_u16(as_u16(c)); };
+    return {{evens(v.val[0]), evens(v.val[1]), evens(v.val[2])}};
+}
+inline half_rgb_v block_means(const rgb_v &a, const rgb_v &b) {
+    const auto means = [&](int k) { return vrshrn_n_u16(sums_of_four(a.val[k], b.val[k]), 2); };
+    return {{means(0), means(1), means(2)}};
+}
+struct channel_factors {
+    int8x8_t a, b, c;
     s16v offset;
 };
 inline channel_factors set_channel_factors(int a, int b, int c) {
-    const auto all = [](int k) { return vdupq_n_u8(static_cast<uint8_t>(k)); };
+    const auto all = [](int k) { return vdup_n_s8(static_cast<int8_t>(k)); };
     return {all(a), all(b), all(c), vdupq_n_s16(static_cast<int16_t>(128 * (a + b + c)))};
 }
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    return vcombine_u8(vshrn_n_u16(dot_low(v, f.a, f.b, f.c), 8),
-                       vshrn_n_u16(dot_upper(v, f.a, f.b, f.c), 8));
+// The sum without the offset: at most 32640 in size, as that of bytes is that fits 16 bits.
+inline s16v centred_dot(const half_rgb_v &v, const channel_factors &f) {
+    const auto centred = [](uint8x8_t c) { return vreinterpret_s8_u8(veor_u8(c, vdup_n_u8(128))); };
+    const s16v first = vmull_s8(centred(v.c[0]), f.a);
+    return vmlal_s8(vmlal_s8(first, centred(v.c[1]), f.b), centred(v.c[2]), f.c);
 }
-inline s16v even_dot(rgb_v v, const channel_factors &f) {
-    const auto low = [](u8v k) { return vreinterpret_s8_u8(vget_low_u8(k)); };
-    const auto evens = [&](u8v c) {
-        return vreinterpret_s8_u8(vmovn_u16(as_u16(veorq_u8(c, vdupq_n_u8(128)))));
+inline s16v even_dot(const half_rgb_v &v, const channel_factors &f) {
+    return vaddq_s16(centred_dot(v, f), f.offset);
+}
+inline u8v dots_high(const half_rgb_v &v, const channel_factors &f, const channel_factors &g,
+                     s16v c) {
+    const auto rest = [&](const channel_factors &k) {
+        return as_u16(sub_sat(vsubq_s16(c, k.offset), centred_dot(v, k)));
     };
-    const s16v sum = vmlal_s8(f.offset, evens(v.val[0]), low(f.a));
-    return vmlal_s8(vmlal_s8(sum, evens(v.val[1]), low(f.b)), evens(v.val[2]), low(f.c));
-}
-
-inline u8v block_means(u8v a, u8v b) { return as_u8(vrshrq_n_u16(sums_of_four(a, b), 2)); }
-inline rgb_v block_means(const rgb_v &a, const rgb_v &b) {
-    return {{block_means(a.val[0], b.val[0]), block_means(a.val[1], b.val[1]),
-             block_means(a.val[2], b.val[2])}};
+    return join_high(rest(f), rest(g));
 }
 
 struct channels_v {
@@ -593,27 +624,16 @@ template <class F>
     else
         f([](const uint8_t *p) { return load_8888<0>(p); });
 }
-struct quad_weights {
-    channel_factors factors;
-    u8v d;
-};
+using quad_weights = channel_weights;
 inline quad_weights set_quad_weights(bool, int a, int b, int c, int d) {
-    return {set_channel_factors(a, b, c), set_u8(static_cast<uint8_t>(d))};
-}
-inline u8v dot_high(const quads_v &v, const quad_weights &w) {
-    return vaddq_u8(dot_high(v, w.factors), w.d);
+    return set_channel_weights(a, b, c, d);
 }
 using quad_factors = channel_factors;
 inline quad_factors set_quad_factors(bool, int a, int b, int c) {
     return set_channel_factors(a, b, c);
 }
-// Still all of them: the even ones count.
-using half_quads_v = quads_v;
-inline half_quads_v even_quads(const quads_v &v) { return v; }
-inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const auto dot = [&](const quad_factors &k) { return as_u16(sub_sat(c, even_dot(v, k))); };
-    return join_high(dot(f), dot(g));
-}
+using half_quads_v = half_rgb_v;
+inline half_quads_v even_quads(const quads_v &v) { return even_pixels(v); }
 
 }  // namespace simgp::neon
 

@@ -14,6 +14,7 @@ namespace simgp::SIMD_TARGET {
 
 template <class T>
 inline void step_pointer(T *&) {}
+inline void keep_behind(ptrdiff_t &) {}
 
 // Byte pairs are best left in vectors.
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
@@ -104,9 +105,19 @@ inline channel_factors set_channel_factors(int a, int b, int c) {
 inline u16v dot(u8v ac, u16v b, const channel_factors &f) {
     return add(dot_pairs(ac, f.ac), mul(b, f.b));
 }
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
+struct channel_weights {
+    channel_factors factors;
+    u8v d;
+};
+inline channel_weights set_channel_weights(int a, int b, int c, int d) {
+    return {set_channel_factors(a, b, c), set_u8(static_cast<uint8_t>(d))};
 }
+inline u8v dot_high(rgb_v v, const channel_weights &w) {
+    const auto high = [&](u8v ac, u16v b) { return dot(ac, b, w.factors); };
+    return add_u8(join_high(high(v.ac_even, v.b_even), high(v.ac_odd, v.b_odd)), w.d);
+}
+using half_rgb_v = rgb_v;
+inline half_rgb_v even_pixels(const rgb_v &v) { return v; }
 inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
 
 // Sums of neighbours, and the rounded quarters of what is at most 32767, (v + 2) >> 2.
@@ -130,6 +141,10 @@ inline rgb_v block_means(const rgb_v &p, const rgb_v &q) {
     const u8v ac = mean_of_four(p.ac_even, p.ac_odd, q.ac_even, q.ac_odd);
     const u16v b = quarter(add(add(p.b_even, p.b_odd), add(q.b_even, q.b_odd)));
     return {ac, b, ac, b};
+}
+inline u8v dots_high(const half_rgb_v &v, const channel_factors &f, const channel_factors &g,
+                     s16v c) {
+    return join_high(sub_sat(c, even_dot(v, f)), sub_sat(c, even_dot(v, g)));
 }
 
 struct channels_v {

@@ -7,7 +7,7 @@
 namespace simgp {
 
 struct simd_lists {
-    static constexpr int room = 160;
+    static constexpr int room = 192;
     int bytes;  // of a vector
     int count;
     struct {

@@ -289,25 +289,19 @@ static void any_pair_of_rows(const yuv_to_rgb &how, const uint8_t *y0, const uin
 // With the sign inverted, which adds 32768, the high byte of a lane is the sample.
 template <pixel_kind>
 struct any_yuv_matrix {
-    channel_factors y, u, v;
-    u8v black;
+    channel_weights y;
+    channel_factors u, v;
     s16v half = as_s16(set_u16(128));
 
     explicit any_yuv_matrix(const rgb_weights &w)
-        : y(set_channel_factors(w.y[0], w.y[1], w.y[2])),
+        : y(set_channel_weights(w.y[0], w.y[1], w.y[2], w.black)),
           u(set_channel_factors(-w.u[0], -w.u[1], -w.u[2])),
-          v(set_channel_factors(-w.v[0], -w.v[1], -w.v[2])),
-          black(set_u8(w.black)) {}
+          v(set_channel_factors(-w.v[0], -w.v[1], -w.v[2])) {}
 
-    u8v luma(rgb_v p) const { return add_u8(dot_high(p, y), black); }
+    u8v luma(const rgb_v &p) const { return dot_high(p, y); }
     // Pairs of U and V of the even pixels.
-    static rgb_v even_pixels(rgb_v p) { return p; }
-    u8v chroma(rgb_v p) const {
-        const auto sum = [&](const channel_factors &f) {
-            return as_u16(sub_sat(half, even_dot(p, f)));
-        };
-        return bit_xor(join_high(sum(u), sum(v)), set_u8(128));
-    }
+    static half_rgb_v evens(const rgb_v &p) { return even_pixels(p); }
+    u8v chroma(const half_rgb_v &p) const { return bit_xor(dots_high(p, u, v, half), set_u8(128)); }
 };
 template <>
 struct any_yuv_matrix<pixel_kind::four> {
@@ -321,7 +315,7 @@ struct any_yuv_matrix<pixel_kind::four> {
           v(set_quad_factors(w.alpha_first, -w.v[0], -w.v[1], -w.v[2])) {}
 
     u8v luma(const quads_v &p) const { return dot_high(p, y); }
-    static half_quads_v even_pixels(const quads_v &p) { return even_quads(p); }
+    static half_quads_v evens(const quads_v &p) { return even_quads(p); }
     u8v chroma(const half_quads_v &p) const {
         return bit_xor(dots_high(p, u, v, half), set_u8(128));
     }
@@ -407,7 +401,7 @@ static void any_yuv_lines(const rgb_weights &w, const uint8_t *src0, const uint8
                     else
                         store(u + x, chroma);
                 };
-                if (!Mean && (lines_apart || u)) put_chroma(m.even_pixels(p));
+                if (!Mean && (lines_apart || u)) put_chroma(m.evens(p));
                 if (!Mean && lines_apart) return;
                 auto below = p;
                 if (src1) {

@@ -198,6 +198,7 @@ template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, cla
             out = next<Step>(out);
         }
         if (rest == 0) return;
+        keep_behind(rest);
         in = further(in, rest - Step);
         out = further(out, rest - Step);
         steps = 1;
