@@ -78,6 +78,10 @@ PEERS = {
     "any mean of lines": {"InterpolateRow": 1},
     "any mean of blocks": {"ScaleRowDown2Box": 1},
     "any every second": {"ScaleRowDown2": 1},
+    "resize bytes, 2 to 3": {"InterpolateRow": 2 / 3, "ScaleFilterCols": 1},
+    "resize bytes, 4 to 3": {"ScaleRowDown34_1_Box": 1},
+    "resize bytes, 3 to 2": {"InterpolateRow": 3 / 2, "ScaleFilterCols": 1},
+    "resize bytes, 2 to 1": {"ScaleRowDown2Box": 1},
     "transpose bytes": {"TransposeWx8": 1},
     "reverse bytes": {"MirrorRow": 1},
     "fill": {"ARGBSetRow": 1},
@@ -188,6 +192,17 @@ def assembly(loop):
     return "\n".join(lines) + "\n"
 
 
+def access_of(processor):
+    """The name of the figure that `occupied` gives."""
+    return f"{processor}: loads and stores"
+
+
+def is_bound(ours, peer, processor):
+    """Whether moving the bytes takes more than the goal, 0.8 of the peer's cycles, in the peer's way and in ours."""
+    access = access_of(processor)
+    return min(ours[access], peer[access]) > .8 * peer[processor]
+
+
 def difference(figures):
     """Those of a loop, or what the second of two calls has more."""
     if len(figures) == 1:
@@ -196,21 +211,28 @@ def difference(figures):
 
 
 def cycles(mca, family, processor, texts, rounds):
-    """Of one more round of each loop. Instructions that have no model, such as returns, are left out."""
-    regions = "".join(f"# LLVM-MCA-BEGIN\n{text}# LLVM-MCA-END\n" for text in texts)
-    totals = []
-    for iterations in rounds:
-        if iterations == 0:
-            totals.append([0] * len(texts))
-            continue
-        out = subprocess.run([mca, f"-mtriple={family['triple']}", f"-mattr={family['attributes']}",
-                              f"-mcpu={processor}", f"-iterations={iterations}", "-all-views=false", "-summary-view",
-                              "-skip-unsupported-instructions=lack-sched"],
-                             input=regions, capture_output=True, text=True)
-        totals.append([int(total) for total in re.findall(r"Total Cycles: +(\d+)", out.stdout)])
-        if len(totals[-1]) != len(texts):
-            sys.exit(f"llvm-mca, {processor}: {out.stderr}")
+    """Of one more round of each loop."""
+    totals = [simulated(mca, family, processor, texts, n, "Total Cycles") if n else [0] * len(texts) for n in rounds]
     return [(more - less) / (rounds[1] - rounds[0]) for less, more in zip(*totals)]
+
+
+def occupied(mca, family, processor, texts):
+    """The cycles that each loop's loads and stores alone keep the processor busy, however they are ordered."""
+    accesses = ["".join(line for line in text.splitlines(True) if ACCESS.match(line)) or "nop\n" for text in texts]
+    return simulated(mca, family, processor, accesses, 100, "Block RThroughput")
+
+
+def simulated(mca, family, processor, texts, iterations, figure):
+    """That figure of each loop. Instructions that have no model, such as returns, are left out."""
+    regions = "".join(f"# LLVM-MCA-BEGIN\n{text}# LLVM-MCA-END\n" for text in texts)
+    out = subprocess.run([mca, f"-mtriple={family['triple']}", f"-mattr={family['attributes']}",
+                          f"-mcpu={processor}", f"-iterations={iterations}", "-all-views=false", "-summary-view",
+                          "-skip-unsupported-instructions=lack-sched"],
+                         input=regions, capture_output=True, text=True)
+    found = [float(value) for value in re.findall(rf"{figure}: +([\d.]+)", out.stdout)]
+    if len(found) != len(texts):
+        sys.exit(f"llvm-mca, {processor}: {out.stderr}")
+    return found
 
 
 def disassemble(objdump, program, attributes):
@@ -288,9 +310,11 @@ class Probe:
             figures = {name: difference([counts(*code) for code in codes]) for name, (_, codes) in rows.items()}
             texts = [assembly(code) for _, codes in rows.values() for code, _ in codes]
             for processor in self.family["processors"] if texts else []:
-                taken = iter(cycles(self.mca, self.family, processor, texts, (0, 1) if whole_calls else (100, 200)))
+                taken = iter(zip(cycles(self.mca, self.family, processor, texts, (0, 1) if whole_calls else (100, 200)),
+                                 occupied(self.mca, self.family, processor, texts)))
                 for name, (_, codes) in rows.items():
-                    figures[name].update(difference([{processor: next(taken)} for _ in codes]))
+                    figures[name].update(difference([dict(zip((processor, access_of(processor)), next(taken)))
+                                                     for _ in codes]))
             for name, (pixels, codes) in rows.items():
                 measured[name] = ({kind: figure / pixels for kind, figure in figures[name].items()},
                                   None if whole_calls else assembly(codes[0][0]))
@@ -331,13 +355,16 @@ def report(family, results, chosen):
           [[name, *(number(of(m, kind)) for kind in kinds for m in [*ours, peer])] for name, ours, peer in rows])
     for processor in family["processors"]:
         print(f"## {family['title']}, {processor}: cycles\n")
-        compared = [[m[processor] / peer[processor] for m in ours if m] for _, ours, peer in rows if peer]
-        ratios = sorted(ratio for row in compared for ratio in row)
-        if ratios:
-            print(f"Of {len(ratios)} comparisons, {sum(r <= .8 for r in ratios)} are at 0.8 of libyuv's cycles or below, "
-                  f"{sum(.8 < r <= 1 for r in ratios)} at 1.0 or below, {sum(r > 1 for r in ratios)} above; "
-                  f"the largest is {ratios[-1]:.2f}.\n")
-        ratio = lambda m, peer: number(m[processor] / peer[processor] if m and peer else None)
+        compared = [(m[processor] / peer[processor], is_bound(m, peer, processor))
+                    for _, ours, peer in rows if peer for m in ours if m]
+        if compared:
+            between = [bound for ratio, bound in compared if .8 < ratio <= 1]
+            print(f"Of {len(compared)} comparisons, {sum(r <= .8 for r, _ in compared)} are at 0.8 of libyuv's cycles or "
+                  f"below, {sum(between)} at 1.0 or below where no more can be had (=), "
+                  f"{len(between) - sum(between)} others at 1.0 or below, {sum(r > 1 for r, _ in compared)} above; "
+                  f"the largest is {max(compared)[0]:.2f}.\n")
+        ratio = lambda m, peer: (number(m[processor] / peer[processor]) + " =" * is_bound(m, peer, processor)
+                                 if m and peer else number(None))
         table(["per pixel", *compilers, "libyuv", *(f"{c} / libyuv" for c in compilers)],
               [[name, *(number(of(m, processor)) for m in [*ours, peer]), *(ratio(m, peer) for m in ours)]
                for name, ours, peer in rows])
