@@ -54,7 +54,7 @@ struct channels_matrix {
     s16v green(u16v l, u16v chroma) const { return add(half_difference(l, chroma), green_offset); }
 };
 // The same code for all rows.
-[[gnu::noinline]] static channels_matrix make_channels_matrix(const yuv_to_rgb &how) {
+[[gnu::noinline, maybe_unused]] static channels_matrix make_channels_matrix(const yuv_to_rgb &how) {
     const yuv_weights &w = how.weights;
     const int of_black = w.luma * w.black / 4, of_green = 32 * (w.green_u + w.green_v) + 32;
     int first = w.red, last = w.blue, green_first = w.green_v, green_last = w.green_u;
