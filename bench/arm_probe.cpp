@@ -100,6 +100,31 @@ void call_find(code address, int n) {
     as<find_code_row>(address)(a, n, 0xFF, 1);
 }
 
+// A line of the resampler, half way between two, at From source samples for To of the destination. Which
+// of its rows does that is the plan's choice; the plan is made before.
+template <int From, int To>
+resize_strip strip_of(int columns) {
+    alignas(resize_alignment) static uint8_t plan[1 << 16];
+    const resize_loops &loops = rows_of(target::neon).resize.of[size_t(resize_kind::bytes1)];
+    resize_strip s{};
+    s.step = uint32_t((From << 18) / To);
+    s.columns = columns;
+    s.row_bytes = second;
+    s.plan = plan;
+    loops.measure(s);
+    loops.plan(s);
+    return s;
+}
+template <int From, int To>
+void call_resize(code address, int n) {
+    const resize_strip s = strip_of<From, To>(n);
+    const resize_line line{s.keeps ? e : a, b, 4};
+    if (s.keeps)
+        as<resize_across_row>(address)(s, a, f, 0, &line, 1, d, 0);
+    else
+        as<resize_both_row>(address)(s, &line, 1, d, 0, 0);
+}
+
 // libyuv's, by what they take.
 using rows31 = void(const uint8_t *, const uint8_t *, const uint8_t *, uint8_t *,
                     const libyuv::YuvConstants *, int);
@@ -113,6 +138,7 @@ using plain31 = void(const uint8_t *, const uint8_t *, const uint8_t *, uint8_t 
 using two_lines = void(const uint8_t *, int, uint8_t *, uint8_t *, int);
 using scaled = void(const uint8_t *, ptrdiff_t, uint8_t *, int);
 using interpolated = void(uint8_t *, const uint8_t *, ptrdiff_t, int, int);
+using columns_filtered = void(uint8_t *, const uint8_t *, int, int, int);
 using transposed = void(const uint8_t *, int, uint8_t *, int, int);
 using filled = void(uint8_t *, uint32_t, int);
 const libyuv::YuvConstants *const matrix = &libyuv::kYuvI601Constants;
@@ -127,6 +153,7 @@ CALL(peer_plain_31, plain31, a, b, c, d, n)
 CALL(peer_lines, two_lines, a, second, d, e, n)
 CALL(peer_scaled, scaled, a, second, d, n)
 CALL(peer_interpolated, interpolated, d, a, second, n, 128)
+CALL(peer_columns, columns_filtered, d, a, n, 0, 3 << 15)
 CALL(peer_transposed, transposed, a, 2048, d, 64, n)
 CALL(peer_filled, filled, d, 0x01020304, n)
 
@@ -204,7 +231,22 @@ void list_any(const any_rows &n, const any_rows &s) {
     add("any twice", n.twice, s.twice, call_resample);
 }
 
+template <int From, int To>
+void list_resizing(const resize_loops &n, const resize_loops &s) {
+    const bool keeps = strip_of<From, To>(512).keeps;
+    const char *const name = named("resize bytes, %d to %d", From, To);
+    if (keeps)
+        add(name, n.across, s.across, call_resize<From, To>);
+    else
+        add(name, n.both, s.both, call_resize<From, To>);
+}
+
 void list_others(const row_table &n, const row_table &s) {
+    constexpr size_t bytes1 = size_t(resize_kind::bytes1);
+    list_resizing<2, 3>(n.resize.of[bytes1], s.resize.of[bytes1]);
+    list_resizing<4, 3>(n.resize.of[bytes1], s.resize.of[bytes1]);
+    list_resizing<3, 2>(n.resize.of[bytes1], s.resize.of[bytes1]);
+    list_resizing<2, 1>(n.resize.of[bytes1], s.resize.of[bytes1]);
     add("pack", n.layout.pack, s.layout.pack, call_pack);
     add("unpack", n.layout.unpack, s.layout.unpack, call_unpack);
     add("dither", n.dither.dither, s.dither.dither, call_dither);
@@ -266,6 +308,8 @@ void list_peers() {
     PEER(InterpolateRow, peer_interpolated)
     PEER(ScaleRowDown2, peer_scaled)
     PEER(ScaleRowDown2Box, peer_scaled)
+    PEER(ScaleRowDown34_1_Box, peer_scaled)
+    PEER(ScaleFilterCols, peer_columns)
     PEER(TransposeWx8, peer_transposed, 8)
     PEER(MirrorRow, peer_plain_11)
     PEER(ARGBSetRow, peer_filled, 4)

@@ -64,6 +64,7 @@ set(SIMGP_SMALL_AREAS simgp/any simgp/layout simgp/resize simgp/rgb2yuv simgp/yu
 # Areas whose rows go from line to line: GCC would keep the pointers of a line in vectors, and take them out
 # again one by one.
 set(SIMGP_AREAS_OF_LINES simgp/any simgp/yuv2rgb)
+set(SIMGP_SMALL_AREAS_neon scmn/mem simgp/dither)
 set(area_macro "#define SIMGP_AREAS(X)")
 foreach(area IN LISTS SIMGP_AREAS)
   get_filename_component(stem ${area} NAME)
@@ -83,7 +84,7 @@ function(simgp_add_vector_unit name target area)
   if(area IN_LIST SIMGP_AREAS_OF_LINES)
     target_compile_options(${name} PRIVATE -fno-tree-slp-vectorize)
   endif()
-  if(area IN_LIST SIMGP_SMALL_AREAS)
+  if(area IN_LIST SIMGP_SMALL_AREAS OR area IN_LIST SIMGP_SMALL_AREAS_${target})
     target_compile_options(${name} PRIVATE $<$<CONFIG:Release>:-O2>)
   endif()
   set_target_properties(${name} PROPERTIES POSITION_INDEPENDENT_CODE ON CXX_VISIBILITY_PRESET hidden

@@ -138,6 +138,7 @@ inline s16v min_s16(s16v a, s16v b) { return _mm512_min_epi16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return _mm512_max_epi16(a, b); }
 inline u16v mul(u16v a, u16v b) { return _mm512_mullo_epi16(a, b); }
 inline u16v avg_u16(u16v a, u16v b) { return _mm512_avg_epu16(a, b); }
+inline u16v sub_sat_u16(u16v a, u16v b) { return _mm512_subs_epu16(a, b); }
 // k v / 2 = (256 v)(128 k) >> 16.
 using half_factor = __m512i;
 inline half_factor set_half_factor(int k) { return set_u16(static_cast<uint16_t>(128 * k)); }

@@ -79,6 +79,8 @@ inline void store(uint8_t *p, u8v v) { memcpy(p, &v, bytes); }
 // Says that p has been moved by a constant to where the next load or store is.
 template <class T>
 inline void step_pointer(T *&) {}
+// Says that n is needed from here on, and not in the loop before.
+inline void keep_behind(ptrdiff_t &) {}
 // bytes / 2 bytes from p and as many from q, in turn.
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
     return make<u8v>([&](int i) {
@@ -215,9 +217,19 @@ inline s16v mul_round(s16v a, s16v b) {
     return make<s16v>([&](int i) { return (a.lane[i] * b.lane[i] + (1 << 14)) >> 15; });
 }
 
-// The mean of unsigned lanes, rounded up.
+// The mean of unsigned lanes, rounded up, and rounded down; half their difference, rounded down.
 inline u16v avg_u16(u16v a, u16v b) {
     return make<u16v>([&](int i) { return (a.lane[i] + b.lane[i] + 1) >> 1; });
+}
+inline u16v mean_down_u16(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return (a.lane[i] + b.lane[i]) >> 1; });
+}
+inline s16v half_difference(u16v a, u16v b) {
+    return make<s16v>([&](int i) { return (a.lane[i] - b.lane[i]) >> 1; });
+}
+// Differences of unsigned lanes, saturating.
+inline u16v sub_sat_u16(u16v a, u16v b) {
+    return make<u16v>([&](int i) { return clamp_to(0, 65535, a.lane[i] - b.lane[i]); });
 }
 
 // Sums and differences of bytes, saturating.
@@ -325,6 +337,10 @@ inline pairs_v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
         return from[i % (bytes / 2) / 2];
     });
 }
+// Within blocks: the lower 8 bytes as the even ones, the upper 8 as the odd ones.
+inline pairs_v load_halves(const uint8_t *p) {
+    return make<u8v>([&](int i) { return p[i / 16 * 16 + i % 2 * 8 + i % 16 / 2]; });
+}
 // The even bytes of u and v as pairs, and the odd ones.
 inline pairs_v pair_evens(pairs_v u, pairs_v v) {
     return make<u8v>([&](int i) { return (i & 1 ? v : u).lane[i / 2 * 2]; });
@@ -334,6 +350,10 @@ inline pairs_v pair_odds(pairs_v u, pairs_v v) {
 }
 // Factors of 0 ... 255 that are known at run time, and products; their low 16 bits, unsigned.
 inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+// Such a product and a sum, which wraps.
+inline u16v mul_add(u16v sum, pair_bytes a, pair_bytes b) {
+    return make<u16v>([&](int i) { return uint16_t(sum.lane[i] + a.lane[i] * b.lane[i]); });
+}
 // floor(k v / 2), with a factor that is known at run time; k is 0 ... 511.
 struct half_factor {
     int k;
@@ -396,6 +416,17 @@ inline u8v narrow(s16v low, s16v high) {
         const int block = i / 16, byte = i % 16;
         return clamp_to(0, 255, (byte < 8 ? low : high).lane[block * 8 + byte % 8]);
     });
+}
+// The same of lanes shifted right by N, unsigned ones and signed ones.
+template <int N>
+inline u8v narrow_shr(u16v low, u16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(as_s16(shr<N>(low)), as_s16(shr<N>(high)));
+}
+template <int N>
+inline u8v narrow_sar(s16v low, s16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(sar<N>(low), sar<N>(high));
 }
 
 // Within blocks: the means of two neighbouring bytes of a and the two of b at the same place, with
@@ -505,6 +536,15 @@ inline pair_u8 load_split_by4(const uint8_t *p) {
     const pair_u8 v = load_split_natural(p);
     return {natural_to_by4(v.even), natural_to_by4(v.odd)};
 }
+// Calls f(moves) with those moves, or what means the same.
+template <class F>
+inline void with_split_moves(bool exchange, F f) {
+    f(set_split_moves(exchange));
+}
+// Byte pairs, or the same with even and odd exchanged.
+inline pairs_v exchange_pairs(pairs_v v, split_moves exchange) {
+    return exchange ? make<u8v>([&](int i) { return v.lane[i ^ 1]; }) : v;
+}
 // The rounded means of blocks of four in two lines of twice `bytes` bytes, (sum + 2) >> 2.
 inline u8v load_block_means(const uint8_t *a, const uint8_t *b) {
     return make<u8v>(
@@ -596,6 +636,19 @@ inline void store_zip4(uint8_t *p, uint8_t *q, u8v a, u8v b, u8v c, u8v d) {
     memcpy(p, all, 2 * bytes);
     memcpy(q, all + 2 * bytes, 2 * bytes);
 }
+// Groups of four bytes, luma first or chroma first: from `bytes` bytes of luma at y and half as many at
+// u and at v, to twice `bytes` bytes.
+struct joined_groups {
+    u8v even, odd;
+};
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const u8v luma = load(y), chroma = load_zip(u, v);
+    return LumaFirst ? joined_groups{luma, chroma} : joined_groups{chroma, luma};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) {
+    store_zip8(p, natural_to_by8(g.even), natural_to_by8(g.odd));
+}
 
 // High bytes of 16-bit lanes: those of a and b in turn; those of a alone, bytes / 2, to memory.
 inline u8v join_high(u16v a, u16v b) { return join(shr<8>(a), shr<8>(b)); }
@@ -652,26 +705,31 @@ inline u16v even_dot(rgb_v v) {
         return A * v.c[0].lane[2 * i] + B * v.c[1].lane[2 * i] + C * v.c[2].lane[2 * i] + D;
     });
 }
-// Factors that are known at run time, in the limits of the other two, of which these are the same
-// without D: (a c0 + b c1 + c c2) >> 8 of each pixel, for factors of 0 or more, and the sum of the
-// even pixels, for factors in -128 ... 127.
+// The same with factors that are known at run time, in the limits of the other two: weights of 0 or more
+// and an offset, and factors in -128 ... 127.
 struct channel_factors {
     int a, b, c;
 };
 inline channel_factors set_channel_factors(int a, int b, int c) { return {a, b, c}; }
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
+struct channel_weights {
+    int a, b, c, d;
+};
+inline channel_weights set_channel_weights(int a, int b, int c, int d) { return {a, b, c, d}; }
+inline u8v dot_high(rgb_v v, const channel_weights &w) {
     return make<u8v>([&](int i) {
-        return (f.a * v.c[0].lane[i] + f.b * v.c[1].lane[i] + f.c * v.c[2].lane[i]) >> 8;
+        return ((w.a * v.c[0].lane[i] + w.b * v.c[1].lane[i] + w.c * v.c[2].lane[i]) >> 8) + w.d;
     });
 }
-inline s16v even_dot(rgb_v v, const channel_factors &f) {
+// Half as many pixels: the even ones, or means of blocks.
+using half_rgb_v = rgb_v;
+inline half_rgb_v even_pixels(rgb_v v) { return v; }
+inline s16v even_dot(half_rgb_v v, const channel_factors &f) {
     return make<s16v>([&](int i) {
         return f.a * v.c[0].lane[2 * i] + f.b * v.c[1].lane[2 * i] + f.c * v.c[2].lane[2 * i];
     });
 }
-// The even pixels become the rounded means of blocks of four: of pixels 2i and 2i + 1 of a and of b. The
-// odd ones have no meaning.
-inline rgb_v block_means(rgb_v a, rgb_v b) {
+// The rounded means of blocks of four: of pixels 2i and 2i + 1 of a and of b.
+inline half_rgb_v block_means(rgb_v a, rgb_v b) {
     const auto means = [&](int k) {
         return make<u8v>([&](int i) {
             const uint8_t *const p = &a.c[k].lane[i & ~1], *const q = &b.c[k].lane[i & ~1];
@@ -679,6 +737,11 @@ inline rgb_v block_means(rgb_v a, rgb_v b) {
         });
     };
     return {means(0), means(1), means(2)};
+}
+// The high bytes of c - (f0 c0 + f1 c1 + f2 c2), saturated to 16 bits, signed, with two sets of factors
+// in turn.
+inline u8v dots_high(half_rgb_v v, const channel_factors &f, const channel_factors &g, s16v c) {
+    return join_high(as_u16(sub_sat(c, even_dot(v, f))), as_u16(sub_sat(c, even_dot(v, g))));
 }
 // Words of 5, 6 and 5 bits from three channels in by8 order, the first in the highest bits; the low
 // bits of each are dropped.

@@ -39,6 +39,13 @@ template <class T>
 #endif
 }
 
+// What is computed from n alone GCC would put into the loop before, where it finds room for it.
+inline void keep_behind([[maybe_unused]] ptrdiff_t &n) {
+#if !defined __aarch64__ && !defined __clang__
+    asm volatile("" : "+r"(n));
+#endif
+}
+
 inline u8v load(const uint8_t *p) { return vld1q_u8(p); }
 inline void store(uint8_t *p, u8v v) { vst1q_u8(p, v); }
 inline u8v load_zip(const uint8_t *p, const uint8_t *q) {
@@ -109,6 +116,9 @@ inline s16v min_s16(s16v a, s16v b) { return vminq_s16(a, b); }
 inline s16v max_s16(s16v a, s16v b) { return vmaxq_s16(a, b); }
 inline u16v mul(u16v a, u16v b) { return vmulq_u16(a, b); }
 inline u16v avg_u16(u16v a, u16v b) { return vrhaddq_u16(a, b); }
+inline u16v mean_down_u16(u16v a, u16v b) { return vhaddq_u16(a, b); }
+inline s16v half_difference(u16v a, u16v b) { return as_s16(vhsubq_u16(a, b)); }
+inline u16v sub_sat_u16(u16v a, u16v b) { return vqsubq_u16(a, b); }
 inline s16v mul_round(s16v a, s16v b) { return vqrdmulhq_s16(a, b); }
 
 inline u8v add_sat_u8(u8v a, u8v b) { return vqaddq_u8(a, b); }
@@ -190,12 +200,21 @@ inline pairs_v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
     memcpy(&b, q, sizeof b);
     return {vreinterpret_u8_u32(vdup_n_u32(a)), vreinterpret_u8_u32(vdup_n_u32(b))};
 }
+inline pairs_v load_halves(const uint8_t *p) {
+#ifdef __aarch64__
+    return load_pairs(p, p + 8);
+#else
+    const u8v v = load(p);
+    return {vget_low_u8(v), vget_high_u8(v)};
+#endif
+}
 inline pairs_v pair_evens(pairs_v u, pairs_v v) { return {u.even, v.even}; }
 inline pairs_v pair_odds(pairs_v u, pairs_v v) { return {u.odd, v.odd}; }
 inline pair_bytes even(pairs_v v) { return v.even; }
 inline pair_bytes odd(pairs_v v) { return v.odd; }
 inline pair_bytes set_pair_bytes(int k) { return vdup_n_u8(static_cast<uint8_t>(k)); }
 inline u16v mul(pair_bytes a, pair_bytes b) { return vmull_u8(a, b); }
+inline u16v mul_add(u16v sum, pair_bytes a, pair_bytes b) { return vmlal_u8(sum, a, b); }
 // floor(k v / 2) = (k >> 1) v + (k & 1) (v >> 1)
 struct half_factor {
     uint8x8_t half, odd;
@@ -250,6 +269,16 @@ inline u8v narrow_join(s16v even, s16v odd) {
 inline u16v widen_low(u8v v) { return vmovl_u8(vget_low_u8(v)); }
 inline u16v widen_high(u8v v) { return vmovl_u8(vget_high_u8(v)); }
 inline u8v narrow(s16v low, s16v high) { return vcombine_u8(vqmovun_s16(low), vqmovun_s16(high)); }
+template <int N>
+inline u8v narrow_shr(u16v low, u16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return vcombine_u8(vqshrn_n_u16(low, N), vqshrn_n_u16(high, N));
+}
+template <int N>
+inline u8v narrow_sar(s16v low, s16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return vcombine_u8(vqshrun_n_s16(low, N), vqshrun_n_s16(high, N));
+}
 
 inline u8v mean_of_pairs(u8v a0, u8v b0, u8v a1, u8v b1) {
     return vcombine_u8(vrshrn_n_u16(vpadalq_u8(vpaddlq_u8(a0), b0), 2),
@@ -297,10 +326,15 @@ inline u8v shuffle(u8v v, u8v index) {
 }
 inline u8v pick(u8v v, u8v index) { return shuffle(v, index); }
 inline u8v pick_or_zero(u8v v, u8v index) { return shuffle(v, index); }
-// Each half reversed, then the halves exchanged.
+// Each half reversed, and the halves exchanged. On 32-bit ARM a half can be reversed into the other's place,
+// but GCC would move it there.
 inline u8v reverse_u8(u8v v) {
+#if defined __aarch64__ || !defined __clang__
     const u8v halves = vrev64q_u8(v);
     return vextq_u8(halves, halves, 8);
+#else
+    return vcombine_u8(vrev64_u8(vget_high_u8(v)), vrev64_u8(vget_low_u8(v)));
+#endif
 }
 inline u8v reverse_u16(u8v v) {
     const u8v halves = as_u8(vrev64q_u16(as_u16(v)));
@@ -333,6 +367,25 @@ inline pair_u8 load_split(const uint8_t *p, split_moves exchange) {
     const pair_u8 v = load_split(p);
     return {vbslq_u8(exchange, v.odd, v.even), vbslq_u8(exchange, v.even, v.odd)};
 }
+// A loop for each order.
+template <bool Exchange>
+struct known_split_moves {};
+template <class F>
+[[gnu::always_inline]] inline void with_split_moves(bool exchange, F f) {
+    if (exchange)
+        f(known_split_moves<true>{});
+    else
+        f(known_split_moves<false>{});
+}
+template <bool Exchange>
+inline pair_u8 load_split(const uint8_t *p, known_split_moves<Exchange>) {
+    const pair_u8 v = load_split(p);
+    return Exchange ? pair_u8{v.odd, v.even} : v;
+}
+inline pairs_v exchange_pairs(pairs_v v, split_moves exchange) {
+    const uint8x8_t m = vget_low_u8(exchange);
+    return {vbsl_u8(m, v.odd, v.even), vbsl_u8(m, v.even, v.odd)};
+}
 inline void store_split(uint8_t *p, uint8_t *q, u8v v) {
     vst1_u8(p, vmovn_u16(as_u16(v)));
     vst1_u8(q, vshrn_n_u16(as_u16(v), 8));
@@ -364,6 +417,25 @@ inline void store_zip8(uint8_t *p, u8v even, u8v odd) {
     const uint8x16x2_t v = {{even, odd}};
     vst2q_u8(p, v);
 }
+#ifdef __aarch64__
+using joined_groups = pair_u8;
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const u8v luma = load(y), chroma = load_zip(u, v);
+    return LumaFirst ? joined_groups{luma, chroma} : joined_groups{chroma, luma};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) { store_zip8(p, g.even, g.odd); }
+#else
+using joined_groups = uint8x8x4_t;
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const uint8x8x2_t luma = vld2_u8(y);
+    const uint8x8_t first = vld1_u8(u), second = vld1_u8(v);
+    if constexpr (LumaFirst) return {{luma.val[0], first, luma.val[1], second}};
+    return {{first, luma.val[0], second, luma.val[1]}};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) { vst4_u8(p, g); }
+#endif
 inline void store_zip16(uint8_t *p, uint8_t *q, u16v even, u16v odd) {
     const uint16x8x2_t zip = vzipq_u16(even, odd);
     vst1q_u8(p, as_u8(zip.val[0]));
@@ -452,33 +524,57 @@ inline u16v even_dot(rgb_v v) {
     sum = add_product<B>(sum, evens(v.val[1]));
     return add_product<C>(sum, evens(v.val[2]));
 }
-// The same with factors that are known at run time, each in all bytes. Those of the sum are signed;
-// of samples less 128 the products are signed as well, and the offset makes up for these.
-struct channel_factors {
+// The same with factors that are known at run time, each in all bytes, and an offset of high bytes.
+struct channel_weights {
     u8v a, b, c;
+    u16v d;
+};
+inline u8v set_factor(int k) { return vdupq_n_u8(static_cast<uint8_t>(k)); }
+inline channel_weights set_channel_weights(int a, int b, int c, int d) {
+    return {set_factor(a), set_factor(b), set_factor(c),
+            vdupq_n_u16(static_cast<uint16_t>(d << 8))};
+}
+inline u8v dot_high(rgb_v v, const channel_weights &w) {
+    return vcombine_u8(vaddhn_u16(dot_low(v, w.a, w.b, w.c), w.d),
+                       vaddhn_u16(dot_upper(v, w.a, w.b, w.c), w.d));
+}
+
+// Half as many pixels. Factors of their sum are signed; of samples less 128 the products are signed as
+// well, and the offset makes up for these.
+struct half_rgb_v {
+    uint8x8_t c[3];
+};
+inline half_rgb_v even_pixels(const rgb_v &v) {
+    const auto evens = [](u8v c) { return vmovn_u16(as_u16(c)); };
+    return {{evens(v.val[0]), evens(v.val[1]), evens(v.val[2])}};
+}
+inline half_rgb_v block_means(const rgb_v &a, const rgb_v &b) {
+    const auto means = [&](int k) { return vrshrn_n_u16(sums_of_four(a.val[k], b.val[k]), 2); };
+    return {{means(0), means(1), means(2)}};
+}
+struct channel_factors {
+    int8x8_t a, b, c;
     s16v offset;
 };
 inline channel_factors set_channel_factors(int a, int b, int c) {
-    const auto all = [](int k) { return vdupq_n_u8(static_cast<uint8_t>(k)); };
+    const auto all = [](int k) { return vdup_n_s8(static_cast<int8_t>(k)); };
     return {all(a), all(b), all(c), vdupq_n_s16(static_cast<int16_t>(128 * (a + b + c)))};
 }
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    return vcombine_u8(vshrn_n_u16(dot_low(v, f.a, f.b, f.c), 8),
-                       vshrn_n_u16(dot_upper(v, f.a, f.b, f.c), 8));
+// The sum without the offset: at most 32640 in size, as that of bytes is that fits 16 bits.
+inline s16v centred_dot(const half_rgb_v &v, const channel_factors &f) {
+    const auto centred = [](uint8x8_t c) { return vreinterpret_s8_u8(veor_u8(c, vdup_n_u8(128))); };
+    const s16v first = vmull_s8(centred(v.c[0]), f.a);
+    return vmlal_s8(vmlal_s8(first, centred(v.c[1]), f.b), centred(v.c[2]), f.c);
 }
-inline s16v even_dot(rgb_v v, const channel_factors &f) {
-    const auto low = [](u8v k) { return vreinterpret_s8_u8(vget_low_u8(k)); };
-    const auto evens = [&](u8v c) {
-        return vreinterpret_s8_u8(vmovn_u16(as_u16(veorq_u8(c, vdupq_n_u8(128)))));
+inline s16v even_dot(const half_rgb_v &v, const channel_factors &f) {
+    return vaddq_s16(centred_dot(v, f), f.offset);
+}
+inline u8v dots_high(const half_rgb_v &v, const channel_factors &f, const channel_factors &g,
+                     s16v c) {
+    const auto rest = [&](const channel_factors &k) {
+        return as_u16(sub_sat(vsubq_s16(c, k.offset), centred_dot(v, k)));
     };
-    const s16v sum = vmlal_s8(f.offset, evens(v.val[0]), low(f.a));
-    return vmlal_s8(vmlal_s8(sum, evens(v.val[1]), low(f.b)), evens(v.val[2]), low(f.c));
-}
-
-inline u8v block_means(u8v a, u8v b) { return as_u8(vrshrq_n_u16(sums_of_four(a, b), 2)); }
-inline rgb_v block_means(const rgb_v &a, const rgb_v &b) {
-    return {{block_means(a.val[0], b.val[0]), block_means(a.val[1], b.val[1]),
-             block_means(a.val[2], b.val[2])}};
+    return join_high(rest(f), rest(g));
 }
 
 struct channels_v {
@@ -558,27 +654,16 @@ template <class F>
     else
         f([](const uint8_t *p) { return load_8888<0>(p); });
 }
-struct quad_weights {
-    channel_factors factors;
-    u8v d;
-};
+using quad_weights = channel_weights;
 inline quad_weights set_quad_weights(bool, int a, int b, int c, int d) {
-    return {set_channel_factors(a, b, c), set_u8(static_cast<uint8_t>(d))};
-}
-inline u8v dot_high(const quads_v &v, const quad_weights &w) {
-    return vaddq_u8(dot_high(v, w.factors), w.d);
+    return set_channel_weights(a, b, c, d);
 }
 using quad_factors = channel_factors;
 inline quad_factors set_quad_factors(bool, int a, int b, int c) {
     return set_channel_factors(a, b, c);
 }
-// Still all of them: the even ones count.
-using half_quads_v = quads_v;
-inline half_quads_v even_quads(const quads_v &v) { return v; }
-inline u8v dots_high(const half_quads_v &v, const quad_factors &f, const quad_factors &g, s16v c) {
-    const auto dot = [&](const quad_factors &k) { return as_u16(sub_sat(c, even_dot(v, k))); };
-    return join_high(dot(f), dot(g));
-}
+using half_quads_v = half_rgb_v;
+inline half_quads_v even_quads(const quads_v &v) { return even_pixels(v); }
 
 }  // namespace simgp::neon
 

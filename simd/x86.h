@@ -15,14 +15,41 @@ namespace simgp::SIMD_TARGET {
 
 template <class T>
 inline void step_pointer(T *&) {}
+inline void keep_behind(ptrdiff_t &) {}
 
 // Byte pairs are best left in vectors.
 inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
 inline pairs_v load_pair_halves(const uint8_t *p, const uint8_t *q) { return load_halves(p, q); }
+inline u8v zip_halves(u8v v) { return zip_low<1>(v, zip_high<8>(v, v)); }
+inline pairs_v load_halves(const uint8_t *p) { return zip_halves(load(p)); }
+// What takes pairs apart has the even bytes' places first.
+inline pairs_v exchange_pairs(pairs_v v, split_moves moves) {
+    return shuffle(v, zip_halves(moves));
+}
 inline pairs_v pair_evens(pairs_v u, pairs_v v) { return join(even(u), even(v)); }
 inline pairs_v pair_odds(pairs_v u, pairs_v v) { return join(odd(u), odd(v)); }
 inline pair_bytes set_pair_bytes(int k) { return set_u16(static_cast<uint16_t>(k)); }
+inline u16v mul_add(u16v sum, pair_bytes a, pair_bytes b) { return add(sum, mul(a, b)); }
+
+// The mean that is rounded up, less one where the sum is odd; and (a - b + 2^16) / 2.
+inline u16v mean_down_u16(u16v a, u16v b) {
+    return sub(avg_u16(a, b), bit_and(bit_xor(a, b), set_u16(1)));
+}
+inline s16v half_difference(u16v a, u16v b) {
+    return bit_xor(avg_u16(a, bit_not(b)), set_u16(0x8000));
+}
+
+template <int N>
+inline u8v narrow_shr(u16v low, u16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(shr<N>(low), shr<N>(high));
+}
+template <int N>
+inline u8v narrow_sar(s16v low, s16v high) {
+    static_assert(limits::narrowing_shift<N>);
+    return narrow(sar<N>(low), sar<N>(high));
+}
 struct luma_chroma {
     pairs_v y, pairs;
 };
@@ -33,6 +60,14 @@ inline luma_chroma load_groups_natural(const uint8_t *p) {
 }
 inline luma_chroma load_groups_by4(const uint8_t *p) { return groups_of(load_split_by4(p)); }
 inline luma_chroma exchanged(const luma_chroma &v) { return {v.pairs, v.y}; }
+
+using joined_groups = pair_u8;
+template <bool LumaFirst>
+inline joined_groups gather_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v) {
+    const u8v luma = natural_to_by8(load(y)), chroma = natural_to_by8(load_zip(u, v));
+    return LumaFirst ? joined_groups{luma, chroma} : joined_groups{chroma, luma};
+}
+inline void store_groups(uint8_t *p, const joined_groups &g) { store_zip8(p, g.even, g.odd); }
 
 // The pair of products fits 16 bits; the sum with the third wraps.
 template <int A, int B, int C>
@@ -72,9 +107,19 @@ inline channel_factors set_channel_factors(int a, int b, int c) {
 inline u16v dot(u8v ac, u16v b, const channel_factors &f) {
     return add(dot_pairs(ac, f.ac), mul(b, f.b));
 }
-inline u8v dot_high(rgb_v v, const channel_factors &f) {
-    return join_high(dot(v.ac_even, v.b_even, f), dot(v.ac_odd, v.b_odd, f));
+struct channel_weights {
+    channel_factors factors;
+    u8v d;
+};
+inline channel_weights set_channel_weights(int a, int b, int c, int d) {
+    return {set_channel_factors(a, b, c), set_u8(static_cast<uint8_t>(d))};
 }
+inline u8v dot_high(rgb_v v, const channel_weights &w) {
+    const auto high = [&](u8v ac, u16v b) { return dot(ac, b, w.factors); };
+    return add_u8(join_high(high(v.ac_even, v.b_even), high(v.ac_odd, v.b_odd)), w.d);
+}
+using half_rgb_v = rgb_v;
+inline half_rgb_v even_pixels(const rgb_v &v) { return v; }
 inline s16v even_dot(rgb_v v, const channel_factors &f) { return dot(v.ac_even, v.b_even, f); }
 
 // Sums of neighbours, and the rounded quarters of what is at most 32767, (v + 2) >> 2.
@@ -99,6 +144,10 @@ inline rgb_v block_means(const rgb_v &p, const rgb_v &q) {
     const u16v b = quarter(add(add(p.b_even, p.b_odd), add(q.b_even, q.b_odd)));
     return {ac, b, ac, b};
 }
+inline u8v dots_high(const half_rgb_v &v, const channel_factors &f, const channel_factors &g,
+                     s16v c) {
+    return join_high(sub_sat(c, even_dot(v, f)), sub_sat(c, even_dot(v, g)));
+}
 
 struct channels_v {
     u8v c[3];
@@ -117,6 +166,10 @@ inline void store_565(uint8_t *p, u8v a, u8v b, u8v c) {
 }
 
 // A shuffle is the same code for all orders.
+template <class F>
+[[gnu::always_inline]] inline void with_split_moves(bool swap, F f) {
+    f(set_split_moves(swap));
+}
 template <class F>
 [[gnu::always_inline]] inline void with_widen_moves(bool swap, bool to_alpha_first, F f) {
     f(set_widen_moves(swap, to_alpha_first));

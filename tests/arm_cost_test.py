@@ -1,10 +1,12 @@
 """What bench/arm_cost.py makes of made-up code: arm_cost_test.py FOLDER, where arm_cost.py is."""
+import re
 import sys
 import unittest
 
 sys.dont_write_bytecode = True
 sys.path.insert(0, sys.argv.pop())
-from arm_cost import PEERS, SUMS, Stack, assembly, counts, inner_loop, ranges, weighted  # noqa: E402
+from arm_cost import (BINDS, PEERS, SUMS, Stack, assembly, counts, difference, inner_loop, is_bound, ranges,  # noqa: E402
+                      weighted)
 
 
 def call(rounds, body, before=(1, 2), after=(90, 91)):
@@ -56,6 +58,21 @@ class Sums(unittest.TestCase):
         self.assertEqual(weighted(rows, {"a": 1, "b": .5}), dict(moves=2.5))
         self.assertIsNone(weighted(rows, {"a": 1, "c": 1}))
         self.assertTrue(SUMS.keys() <= PEERS.keys())
+
+    def test_whole_calls(self):
+        self.assertEqual(difference([dict(moves=2)]), dict(moves=2))
+        self.assertEqual(difference([dict(moves=2), dict(moves=7)]), dict(moves=5))
+
+    def test_bound_by_loads_and_stores(self):
+        def figures(cycles, accesses):
+            return {"p": cycles, "p: loads and stores": accesses}
+        self.assertTrue(is_bound(figures(9, 9), figures(10, 9), "p"))
+        self.assertFalse(is_bound(figures(9, 8), figures(10, 9), "p"))  # ours are less: 0.8 can be had
+        self.assertFalse(is_bound(figures(9, 9), figures(10, 8), "p"))
+
+    def test_reasons_are_for_rows_that_are_compared(self):
+        for rows in BINDS:
+            self.assertTrue(any(re.fullmatch(rows, name) for name in PEERS), rows)
 
     def test_ranges(self):
         self.assertEqual(ranges([0x1000, 0x14, 0x10]), "0x10..0x14,0x1000..0x1000")

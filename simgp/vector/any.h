@@ -1,7 +1,8 @@
 // Rows between any two formats, with weights that are known at run time. Those that need none are in
 // any_bytes.h.
 //
-// YUV to RGB is computed at half scale, 7 fractional bits, as in matrix.h. With L, KR, KGU, KGV and
+// Where products of bytes widen, YUV to RGB is what any_channels.h does. Elsewhere it is computed at half
+// scale, 7 fractional bits, as in matrix.h. With L, KR, KGU, KGV and
 // KB the weights, `offset` 3248 in the limited ranges (L = 298) and 0 in the full ones (L = 256),
 // and the rounding constant 64:
 //
@@ -28,6 +29,7 @@
 
 #include "rows/any.h"
 #include "simgp/vector/any_bytes.h"
+#include "simgp/vector/any_channels.h"
 #include "simgp/vector/packer.h"
 #include "simgp/vector/source.h"
 #include "simgp/vector/steps.h"
@@ -172,23 +174,29 @@ struct any_source<chroma_in::groups> {
 
 template <chroma_in In, pixel_kind Kind>
 static void any_rows_alone(const lines_to_rgb &lines) {
-    using to = any_packer<Kind>;
-    const any_matrix m(*lines.how);
-    const any_source<In> from(*lines.how);
-    const ptrdiff_t width = lines.width;
-    for_each_line(lines, [&](const line_to_rgb &l) {
-        whole_steps_ahead(
-            width,
-            [&](ptrdiff_t x) {
-                return from.template load<to::order>(samples{l.y[0], l.u, l.v}, x);
-            },
-            [&](ptrdiff_t x, const yuv_half &p) {
-                const any_chroma c = from.chroma(p.pairs);
-                const any_terms t = m.terms(c.u, c.v);
-                to::store(l.dst[0] + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t),
-                          m.order);
-            });
-    });
+    if constexpr (products_widen) {
+        for_each_line(lines, [&](const line_to_rgb &l) {
+            channels_row<In, Kind>(*lines.how, l.y[0], l.u, l.v, l.dst[0], lines.width);
+        });
+    } else {
+        using to = any_packer<Kind>;
+        const any_matrix m(*lines.how);
+        const any_source<In> from(*lines.how);
+        const ptrdiff_t width = lines.width;
+        for_each_line(lines, [&](const line_to_rgb &l) {
+            whole_steps_ahead(
+                width,
+                [&](ptrdiff_t x) {
+                    return from.template load<to::order>(samples{l.y[0], l.u, l.v}, x);
+                },
+                [&](ptrdiff_t x, const yuv_half &p) {
+                    const any_chroma c = from.chroma(p.pairs);
+                    const any_terms t = m.terms(c.u, c.v);
+                    to::store(l.dst[0] + x * to::size, m.apply(even(p.y), t), m.apply(odd(p.y), t),
+                              m.order);
+                });
+        });
+    }
 }
 
 // Pairs of rows that are shorter than a vector, each in a half of it.
@@ -213,57 +221,73 @@ template <chroma_in In, pixel_kind Kind>
 static void any_row_pairs(const lines_to_rgb &lines) {
     if constexpr (pairs_in_halves)
         if (lines.width < bytes) return any_row_halves<In, Kind>(lines);
-    using to = any_packer<Kind>;
-    struct pixels_pair {
-        yuv_half first;
-        pairs_v second_y;
-    };
-    const any_matrix m(*lines.how);
-    const any_source<In> from(*lines.how);
-    const ptrdiff_t width = lines.width;
-    for_each_line(lines, [&](const line_to_rgb &l) {
-        whole_steps_ahead(
-            width,
-            [&](ptrdiff_t x) {
-                return pixels_pair{from.template load<to::order>(samples{l.y[0], l.u, l.v}, x),
-                                   load_luma<to::order>(l.y[1], x)};
-            },
-            [&](ptrdiff_t x, const pixels_pair &p) {
-                const any_chroma c = from.chroma(p.first.pairs);
-                const any_terms t = m.terms(c.u, c.v);
-                to::store(l.dst[0] + x * to::size, m.apply(even(p.first.y), t),
-                          m.apply(odd(p.first.y), t), m.order);
-                to::store(l.dst[1] + x * to::size, m.apply(even(p.second_y), t),
-                          m.apply(odd(p.second_y), t), m.order);
-            });
-    });
+    if constexpr (products_widen) {
+        for_each_line(lines, [&](const line_to_rgb &l) {
+            channels_row_pair<In, Kind>(*lines.how, l.y[0], l.y[1], l.u, l.v, l.dst[0], l.dst[1],
+                                        lines.width);
+        });
+    } else {
+        using to = any_packer<Kind>;
+        struct pixels_pair {
+            yuv_half first;
+            pairs_v second_y;
+        };
+        const any_matrix m(*lines.how);
+        const any_source<In> from(*lines.how);
+        const ptrdiff_t width = lines.width;
+        for_each_line(lines, [&](const line_to_rgb &l) {
+            whole_steps_ahead(
+                width,
+                [&](ptrdiff_t x) {
+                    return pixels_pair{from.template load<to::order>(samples{l.y[0], l.u, l.v}, x),
+                                       load_luma<to::order>(l.y[1], x)};
+                },
+                [&](ptrdiff_t x, const pixels_pair &p) {
+                    const any_chroma c = from.chroma(p.first.pairs);
+                    const any_terms t = m.terms(c.u, c.v);
+                    to::store(l.dst[0] + x * to::size, m.apply(even(p.first.y), t),
+                              m.apply(odd(p.first.y), t), m.order);
+                    to::store(l.dst[1] + x * to::size, m.apply(even(p.second_y), t),
+                              m.apply(odd(p.second_y), t), m.order);
+                });
+        });
+    }
 }
 
 // Rows with chroma for each pixel, alone or in pairs: chroma that two rows share is computed for each.
 template <pixel_kind Kind>
 static void any_rows_full(const lines_to_rgb &lines) {
-    using to = any_packer<Kind>;
-    const any_matrix m(*lines.how);
-    const ptrdiff_t width = lines.width;
-    const auto half = [&](pair_bytes luma, pairs_v pairs) {
-        return m.apply(luma, m.terms(even(pairs), odd(pairs)));
+    // Calls row(l, k) for the first row and for the second, if there is one.
+    const auto for_each_row = [&](auto row) __attribute__((always_inline)) {
+        for_each_line(lines, [&](const line_to_rgb &l) {
+            for (int k = 0; k == 0 || (k == 1 && l.y[1] != l.y[0]); k++) row(l, k);
+        });
     };
-    for_each_line(lines, [&](const line_to_rgb &l) {
-        const uint8_t *y = l.y[0];
-        for (uint8_t *dst = l.dst[0];; y = l.y[1], dst = l.dst[1]) {
+    if constexpr (products_widen) {
+        for_each_row([&](const line_to_rgb &l, int k) {
+            channels_row<chroma_in::full, Kind>(*lines.how, l.y[k], l.u, l.v, l.dst[k],
+                                                lines.width);
+        });
+    } else {
+        using to = any_packer<Kind>;
+        const any_matrix m(*lines.how);
+        const ptrdiff_t width = lines.width;
+        const auto half = [&](pair_bytes luma, pairs_v pairs) {
+            return m.apply(luma, m.terms(even(pairs), odd(pairs)));
+        };
+        for_each_row([&](const line_to_rgb &l, int k) {
             whole_steps_ahead(
                 width,
                 [&](ptrdiff_t x) {
-                    return source<yuv_layout::full>::template load<to::order>(samples{y, l.u, l.v},
-                                                                              x);
+                    return source<yuv_layout::full>::template load<to::order>(
+                        samples{l.y[k], l.u, l.v}, x);
                 },
                 [&](ptrdiff_t x, const yuv_full &p) {
-                    to::store(dst + x * to::size, half(even(p.y), p.pairs_even),
+                    to::store(l.dst[k] + x * to::size, half(even(p.y), p.pairs_even),
                               half(odd(p.y), p.pairs_odd), m.order);
                 });
-            if (y == l.y[1]) break;
-        }
-    });
+        });
+    }
 }
 
 // RGB to YUV
@@ -275,25 +299,19 @@ static void any_rows_full(const lines_to_rgb &lines) {
 // With the sign inverted, which adds 32768, the high byte of a lane is the sample.
 template <pixel_kind>
 struct any_yuv_matrix {
-    channel_factors y, u, v;
-    u8v black;
+    channel_weights y;
+    channel_factors u, v;
     s16v half = as_s16(set_u16(128));
 
     explicit any_yuv_matrix(const rgb_weights &w)
-        : y(set_channel_factors(w.y[0], w.y[1], w.y[2])),
+        : y(set_channel_weights(w.y[0], w.y[1], w.y[2], w.black)),
           u(set_channel_factors(-w.u[0], -w.u[1], -w.u[2])),
-          v(set_channel_factors(-w.v[0], -w.v[1], -w.v[2])),
-          black(set_u8(w.black)) {}
+          v(set_channel_factors(-w.v[0], -w.v[1], -w.v[2])) {}
 
-    u8v luma(rgb_v p) const { return add_u8(dot_high(p, y), black); }
+    u8v luma(const rgb_v &p) const { return dot_high(p, y); }
     // Pairs of U and V of the even pixels.
-    static rgb_v even_pixels(rgb_v p) { return p; }
-    u8v chroma(rgb_v p) const {
-        const auto sum = [&](const channel_factors &f) {
-            return as_u16(sub_sat(half, even_dot(p, f)));
-        };
-        return bit_xor(join_high(sum(u), sum(v)), set_u8(128));
-    }
+    static half_rgb_v evens(const rgb_v &p) { return even_pixels(p); }
+    u8v chroma(const half_rgb_v &p) const { return bit_xor(dots_high(p, u, v, half), set_u8(128)); }
 };
 template <>
 struct any_yuv_matrix<pixel_kind::four> {
@@ -307,7 +325,7 @@ struct any_yuv_matrix<pixel_kind::four> {
           v(set_quad_factors(w.alpha_first, -w.v[0], -w.v[1], -w.v[2])) {}
 
     u8v luma(const quads_v &p) const { return dot_high(p, y); }
-    static half_quads_v even_pixels(const quads_v &p) { return even_quads(p); }
+    static half_quads_v evens(const quads_v &p) { return even_quads(p); }
     u8v chroma(const half_quads_v &p) const {
         return bit_xor(dots_high(p, u, v, half), set_u8(128));
     }
@@ -349,7 +367,7 @@ static void any_yuv_lines(const rgb_weights &w, const lines_to_yuv &l) {
                     else
                         store(u + x, chroma);
                 };
-                if (!Mean && (lines_apart || u)) put_chroma(m.even_pixels(p));
+                if (!Mean && (lines_apart || u)) put_chroma(m.evens(p));
                 if (!Mean && lines_apart) return;
                 auto below = p;
                 if (src1) {

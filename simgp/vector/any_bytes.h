@@ -175,27 +175,43 @@ inline void in_double_steps(ptrdiff_t count, Vector vector) {
 }
 
 enum class groups_to { luma, planes, pairs };
-template <groups_to To, bool Mean>
+template <groups_to To, bool Mean, class Moves>
 static void split_line(const uint8_t *src, const uint8_t *other, uint8_t *y, uint8_t *u, uint8_t *v,
-                       ptrdiff_t pairs, split_moves order) {
-    const auto vector = [&](ptrdiff_t i) {
-        const pair_u8 p = load_split(src + 4 * i, order);
-        store(y + 2 * i, by8_to_natural(p.even));
-        if constexpr (To == groups_to::luma) return;
-        u8v c = p.odd;
-        if constexpr (Mean) c = avg_u8(c, load_split(other + 4 * i, order).odd);
-        c = by8_to_natural(c);
-        if constexpr (To == groups_to::planes)
-            store_split(u + i, v + i, c);
-        else
-            store(u + 2 * i, c);
+                       ptrdiff_t pairs, const Moves &moves) {
+    constexpr bool planes = To == groups_to::planes;
+    const auto loaded = [&](const uint8_t *p, const uint8_t *q) {
+        pair_u8 a = load_split(p, moves);
+        if constexpr (Mean) a.odd = avg_u8(a.odd, load_split(q, moves).odd);
+        return a;
     };
-    in_double_steps<bytes / 2>(pairs, vector);
+    const auto put_chroma = [](uint8_t *to_u, uint8_t *to_v, u8v c) {
+        if constexpr (planes)
+            store_split(to_u, to_v, by8_to_natural(c));
+        else
+            store(to_u, by8_to_natural(c));
+    };
+    // A line that is not there stands where another is.
+    if constexpr (moves_pointers)
+        move_steps<2, bytes / 2>(
+            pairs, lines_in<4, 4>{{src, Mean ? other : src}}, lines_out < 2, planes ? 1 : 2,
+            planes ? 1 : 2 > {{y, To == groups_to::luma ? y : u, planes ? v : y}},
+            [&](const uint8_t *const *p) { return loaded(p[0], p[1]); },
+            [&](uint8_t *const *q, const pair_u8 &p) {
+                store(q[0], by8_to_natural(p.even));
+                if constexpr (To != groups_to::luma) put_chroma(q[1], q[2], p.odd);
+            });
+    else
+        in_double_steps<bytes / 2>(pairs, [&](ptrdiff_t i) {
+            const pair_u8 p = loaded(src + 4 * i, (Mean ? other : src) + 4 * i);
+            store(y + 2 * i, by8_to_natural(p.even));
+            if constexpr (planes) put_chroma(u + i, v + i, p.odd);
+            if constexpr (To == groups_to::pairs) put_chroma(u + 2 * i, nullptr, p.odd);
+        });
 }
 // One line after the other, a mean with the second of two: in cache that is faster than two at once.
-static void any_split_groups(const groups_split &s) {
+template <class Moves>
+static void split_lines(const groups_split &s, const Moves &moves) {
     using to = groups_to;
-    const split_moves order = set_split_moves(!s.luma_first);
     for (ptrdiff_t row = 0; row < s.rows; row++) {
         const bool second = s.shared && row & 1;
         const bool gives = s.shared && s.mean ? second || row + 1 == s.rows : !second;
@@ -208,16 +224,19 @@ static void any_split_groups(const groups_split &s) {
         if (s.pairs < bytes / 2)
             split_few_groups(src, other, y, u, v, s.pairs, s.luma_first);
         else if (!u)
-            split_line<to::luma, false>(src, other, y, u, v, s.pairs, order);
+            split_line<to::luma, false>(src, other, y, u, v, s.pairs, moves);
         else if (other && v)
-            split_line<to::planes, true>(src, other, y, u, v, s.pairs, order);
+            split_line<to::planes, true>(src, other, y, u, v, s.pairs, moves);
         else if (other)
-            split_line<to::pairs, true>(src, other, y, u, v, s.pairs, order);
+            split_line<to::pairs, true>(src, other, y, u, v, s.pairs, moves);
         else if (v)
-            split_line<to::planes, false>(src, other, y, u, v, s.pairs, order);
+            split_line<to::planes, false>(src, other, y, u, v, s.pairs, moves);
         else
-            split_line<to::pairs, false>(src, other, y, u, v, s.pairs, order);
+            split_line<to::pairs, false>(src, other, y, u, v, s.pairs, moves);
     }
+}
+static void any_split_groups(const groups_split &s) {
+    with_split_moves(!s.luma_first, [&](const auto &moves) { split_lines(s, moves); });
 }
 // Groups of two pixels, luma first or chroma first: rows of those, in steps of `bytes` pixels.
 constexpr int groups_of_step = bytes / 2;
@@ -227,12 +246,8 @@ static void join_groups(const uint8_t *y, const uint8_t *u, const uint8_t *v, ui
                         ptrdiff_t pairs) {
     move_line<2, groups_of_step>(
         pairs, lines_in<2, 1, 1>{{y, u, v}}, lines_out<4>{{dst}},
-        [](const uint8_t *const *p) {
-            const u8v luma = natural_to_by8(load(p[0]));
-            const u8v chroma = natural_to_by8(load_zip(p[1], p[2]));
-            return LumaFirst ? pair_u8{luma, chroma} : pair_u8{chroma, luma};
-        },
-        [](uint8_t *const *q, const pair_u8 &p) { store_zip8(q[0], p.even, p.odd); },
+        [](const uint8_t *const *p) { return gather_groups<LumaFirst>(p[0], p[1], p[2]); },
+        [](uint8_t *const *q, const joined_groups &p) { store_groups(q[0], p); },
         [](uint8_t *const *q, const uint8_t *const *p) {
             uint8_t *const luma = q[0] + !LumaFirst, *const chroma = q[0] + LumaFirst;
             luma[0] = p[0][0];
@@ -260,12 +275,18 @@ static void any_mean_of_blocks(const uint8_t *a, const uint8_t *b, ptrdiff_t ste
     for (ptrdiff_t y = 0; y < rows; y++) {
         const uint8_t *const p = a + y * step, *const q = b + y * step;
         uint8_t *const to = dst + y * dst_step;
-        in_steps(
-            count, [=](ptrdiff_t x) { store(to + x, load_block_means(p + 2 * x, q + 2 * x)); },
-            [=](ptrdiff_t x) {
-                const int sum = p[2 * x] + p[2 * x + 1] + q[2 * x] + q[2 * x + 1];
-                to[x] = static_cast<uint8_t>((sum + 2) >> 2);
-            });
+        if (moves_pointers && count >= bytes)
+            move_steps<2>(
+                count, lines_in<2, 2>{{p, q}}, lines_out<1>{{to}},
+                [](const uint8_t *const *in) { return load_block_means(in[0], in[1]); },
+                [](uint8_t *const *out, u8v v) { store(out[0], v); });
+        else
+            in_steps(
+                count, [=](ptrdiff_t x) { store(to + x, load_block_means(p + 2 * x, q + 2 * x)); },
+                [=](ptrdiff_t x) {
+                    const int sum = p[2 * x] + p[2 * x + 1] + q[2 * x] + q[2 * x + 1];
+                    to[x] = static_cast<uint8_t>((sum + 2) >> 2);
+                });
     }
 }
 

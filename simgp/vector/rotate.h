@@ -232,19 +232,24 @@ static void reverse(const uint8_t *src, uint8_t *dst, ptrdiff_t count) {
             memcpy(dst + i * size, src + (count - 1 - i) * size, size_t(size));
         return;
     }
-    uint8_t *const last = dst + length - bytes;
-    ptrdiff_t x = 0;
-    for (; x + 4 * bytes <= length; x += 4 * bytes) {
-        const u8v a = load_reversed<S>(src + x), b = load_reversed<S>(src + x + bytes);
-        const u8v c = load_reversed<S>(src + x + 2 * bytes),
-                  d = load_reversed<S>(src + x + 3 * bytes);
-        store(last - x, a);
-        store(last - x - bytes, b);
-        store(last - x - 2 * bytes, c);
-        store(last - x - 3 * bytes, d);
+    const uint8_t *from = src;
+    uint8_t *to = dst + length;
+    const auto next = [&] {
+        const u8v v = load_reversed<S>(from);
+        from += bytes, step_pointer(from);
+        return v;
+    };
+    const auto put = [&](u8v v) {
+        to -= bytes, step_pointer(to);
+        store(to, v);
+    };
+    const size_t vectors = size_t(length) / bytes;
+    for (size_t fours = vectors / 4; fours != 0; fours--) {
+        const u8v a = next(), b = next(), c = next(), d = next();
+        put(a), put(b), put(c), put(d);
     }
-    for (; x + bytes <= length; x += bytes) store(last - x, load_reversed<S>(src + x));
-    if (x < length) store(dst, load_reversed<S>(src + length - bytes));
+    for (size_t rest = vectors % 4; rest != 0; rest--) put(next());
+    if (from < src + length) store(dst, load_reversed<S>(src + length - bytes));
 }
 
 void fill_rotate(rotate_rows &t) {

@@ -189,10 +189,37 @@ template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, cla
             out = next<Step>(out);
         }
         if (rest == 0) return;
+        keep_behind(rest);
         in = further(in, rest - Step);
         out = further(out, rest - Step);
         steps = 1;
         rest = 0;
+    }
+}
+
+// put(out.p, compute(pixels)) for every Step of `count` >= Step samples, where load(in.p) gives the pixels.
+// Those of the next step are loaded when these have been computed and before they are stored, which keeps
+// the row right where output lies over samples, as in row_of_steps. The last step ends at the last sample
+// and may do some again.
+template <int Step, class In, class Out, class Load, class Compute, class Put>
+[[gnu::always_inline]] inline void move_steps_ahead(ptrdiff_t count, In in, Out out, Load load,
+                                                    Compute compute, Put put) {
+    const ptrdiff_t rest = ptrdiff_t(size_t(count) % Step);
+    auto pixels = load(in.p);
+    size_t steps = size_t(count) / Step - 1;
+    // All whole steps but the last; that one, behind which the last samples are loaded; these.
+    for (int part = 0;; part++) {
+        for (; steps != 0; steps--) {
+            in = next<Step>(in);
+            const auto done = compute(pixels);
+            pixels = load(in.p);
+            put(out.p, done);
+            out = next<Step>(out);
+        }
+        if (part == 2 || (part == 1 && rest == 0)) return;
+        in = further(in, part == 0 && rest != 0 ? rest - Step : -Step);
+        if (part == 1) out = further(out, rest - Step);
+        steps = 1;
     }
 }
 
