@@ -119,7 +119,9 @@ TEST(resize_csc, tiled_pictures_of_many_sizes) {
 // Tiles of planes beyond the caches are asked for ahead, which changes nothing.
 TEST(resize_csc, large_tiled_pictures) {
     rig::check_jobs(name_of(t64x32), {.max_width = 0, .rounds = 1, .large = {{410, 90}}},
-                    [](int w, int h) { return make_job(t64x32, {8100, 520}, {w, h}); });
+                    [](int w, int h) {
+                        return make_job(t64x32, {8100, 520}, {w, h});
+                    });
 }
 
 // Every decimation across with every one down, and so strong ones that columns come alone.
