@@ -258,10 +258,12 @@ void check(const rig::format &from, const rig::format &to, const rig::sweep &siz
 
 TEST(csc_any, every_pair_at_small_sizes_and_beyond_any_strip) {
     for_pairs([](const rig::format &from, const rig::format &to) {
-        check(from, to,
-              {.max_width = 13,
-               .rounds = 6,
-               .large = {{33, 3}, {65, 4}, {130, 3}, {263, 2}, {517, 3}, {1031, 2}, {2050, 3}}});
+        check(
+            from, to,
+            {.max_width = 13,
+             .rounds = 6,
+             .large = {
+                 {33, 3}, {65, 133}, {9, 67}, {130, 3}, {263, 2}, {517, 3}, {1031, 2}, {2050, 3}}});
     });
 }
 

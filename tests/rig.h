@@ -276,8 +276,9 @@ struct sweep {
     int max_width = 2 * 64 + 1;
     int max_height = 5;
     int rounds = 2;
-    // The last has one pixel more than whole vectors, and more lines than a column has pixels.
-    std::vector<std::pair<int, int>> large = {{640, 6}, {1918, 5}, {259, 5}, {257, 67}};
+    // The last two have more lines, and pairs of them, than are converted side by side: of one the last pixels,
+    // as it has one more than whole vectors, the other as a whole (simgp/column.h).
+    std::vector<std::pair<int, int>> large = {{640, 6}, {1918, 5}, {259, 5}, {257, 133}, {9, 67}};
 };
 
 // Runs the jobs of all sizes with the rows of every target, on the same inputs, with planes flush
