@@ -194,9 +194,9 @@ TEST_F(convert_test, stills_come_one_by_one_or_numbered) {
     shell("rm n00.png");
     good("n%02d.png -o rest.rgb888");  // from number 1 on
     EXPECT_EQ(read("rest.rgb888"), read("whole.rgb888").substr(40 * 30 * 3));
-    write("grey.pgm", "P5 # a comment\n2\t1\n255\n\x10\xEB");
+    write("grey.pgm", "P5 # a comment\n2\t2\n255\n\x10\xEB\x20\x30");
     good("grey.pgm -o grey.rgb888");
-    EXPECT_EQ(read("grey.rgb888"), "\x10\x10\x10\xEB\xEB\xEB");
+    EXPECT_EQ(read("grey.rgb888"), "\x10\x10\x10\xEB\xEB\xEB\x20\x20\x20\x30\x30\x30");
     shell("cp one.ppm n02.png");  // of the same size: kinds may be mixed
     good("n%02d.png -o mixed.rgb888");
     EXPECT_EQ(read("mixed.rgb888").size(), 2u * 40 * 30 * 3);
@@ -545,6 +545,18 @@ TEST_F(convert_test, headers_of_edited_video_are_right) {
               "YUV4MPEG2 W4 H2 F25:1 Ip A" + aspect + " Cmono\nFRAME\n" + std::string(8, 'x'));
         EXPECT_EQ(header("--resize 8x2"), "YUV4MPEG2 W8 H2 F25:1 Ip A" + aspect + " Cmono");
     }
+}
+
+// Between YUV formats all of the last column and line, the first of its pixels or their mean.
+TEST_F(convert_test, chroma_of_pixels_that_share_it) {
+    const std::string luma = "luma luma", u = "\x0A\x14\x1E\x28\x32\x3C\x46\x50\x5A";
+    write("in.yuv444", luma + u + std::string(u.rbegin(), u.rend()));
+    const auto shared = [&](const std::string &options) {
+        good("in.yuv444 --size 3x3 -o out.yuv420 -q " + options);
+        return read("out.yuv420");
+    };
+    EXPECT_EQ(shared(""), luma + "\x0A\x1E\x46\x5A" + "\x5A\x46\x1E\x0A");
+    EXPECT_EQ(shared("--chroma mean"), luma + "\x1E\x2D\x4B\x5A" + "\x46\x37\x19\x0A");
 }
 
 // In every colour the card is drawn, written, read and shown as what it is, and as nothing else.

@@ -122,8 +122,10 @@ class play_test : public testing::Test {
                 setenv("DISPLAY", display.c_str(), 1);
                 setenv("SDL_VIDEODRIVER", "x11", 1);
             });
-        const std::string found =
-            shell("timeout 20 xdotool search --sync --onlyvisible --name '^simgp-play:'");
+        // xdotool ends in an error if a window goes while it is asked for its name.
+        const std::string found = shell(
+            "for again in 1 2 3 4 5; do timeout 20 xdotool search --sync --onlyvisible --name "
+            "'^simgp-play:' && break; done");
         window = found.substr(0, found.find('\n'));
         ASSERT_FALSE(window.empty()) << place.read("complained");
         shell("xdotool windowfocus --sync " + window);

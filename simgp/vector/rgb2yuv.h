@@ -57,9 +57,10 @@ struct yuv_row_sizes {
     row(pixels, y, u, v, bytes);
     copy_few(out.y + x, y, count);
     const int chroma = count / 2;
+    // A part behind whole steps is the last pixel, which has none.
     if (of.chroma_size == 0 || chroma == 0) return;
-    copy_few(out.u + of.chroma_size * (x / 2), u, ptrdiff_t(of.chroma_size) * chroma);
-    if (of.chroma_size == 1) copy_few(out.v + x / 2, v, chroma);
+    copy_few(out.u, u, ptrdiff_t(of.chroma_size) * chroma);
+    if (of.chroma_size == 1) copy_few(out.v, v, chroma);
 }
 
 // Chroma goes to plane u in samples or pairs of `chroma_size` bytes, and to plane v where there are
