@@ -206,13 +206,14 @@ template <int Step, class In, class Out, class Load, class Compute, class Put>
                                                     Compute compute, Put put) {
     const ptrdiff_t rest = ptrdiff_t(size_t(count) % Step);
     auto pixels = load(in.p);
+    in = next<Step>(in);
     size_t steps = size_t(count) / Step - 1;
     // All whole steps but the last; that one, behind which the last samples are loaded; these.
     for (int part = 0;; part++) {
         for (; steps != 0; steps--) {
-            in = next<Step>(in);
             const auto done = compute(pixels);
             pixels = load(in.p);
+            in = next<Step>(in);
             put(out.p, done);
             out = next<Step>(out);
         }
