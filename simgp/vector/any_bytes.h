@@ -138,8 +138,12 @@ static void reorder_four(const repacking &order, const lines_to_repack &l) {
         uint8_t *const dst = l.dst + y * l.dst_step;
         const auto vector = [=](ptrdiff_t i) { store(dst + i, shuffle(load(src + i), index)); };
         ptrdiff_t i = 0;
-        for (; i + 4 * bytes <= size; i += 4 * bytes)
-            for (int k = 0; k < 4; k++) vector(i + k * bytes);
+        for (; i + 4 * bytes <= size; i += 4 * bytes) {
+            vector(i);
+            vector(i + bytes);
+            vector(i + 2 * bytes);
+            vector(i + 3 * bytes);
+        }
         for (; i + bytes < size; i += bytes) vector(i);
         vector(size - bytes);
     }
