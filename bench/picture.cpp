@@ -388,7 +388,11 @@ comparison compare(conversion c) {
             const operation convert = p.make(b.src, b.dst);
             memset(b.dst.memory.get(), 0xA5, b.dst.bytes);
             b.run(convert);
-            if (c.tolerance > 0) expect_alike(c.name + " by " + p.name, ours, b.dst, c.tolerance);
+            // Of an icon the borders, where peers interpolate otherwise, are most of the picture; which of
+            // its modes swscale takes is decided by their times.
+            const bool icon = to.width * to.height < 1024;
+            if (c.tolerance > 0)
+                expect_alike(c.name + " by " + p.name, ours, b.dst, c.tolerance * (icon ? 1.5 : 1));
             m.peers.push_back({p.name, [=] { convert(b.src, b.dst); }});
         }
         m.limit = c.in_place
