@@ -65,6 +65,8 @@ set(SIMGP_SMALL_AREAS simgp/any simgp/layout simgp/resize simgp/rgb2yuv simgp/yu
 # again one by one.
 set(SIMGP_AREAS_OF_LINES simgp/any simgp/yuv2rgb)
 set(SIMGP_SMALL_AREAS_neon scmn/mem simgp/dither)
+# Areas of loops so short that on x86 it shows, by a third, where they lie in their lines of the cache.
+set(SIMGP_ALIGNED_AREAS scmn/keyframe)
 set(area_macro "#define SIMGP_AREAS(X)")
 foreach(area IN LISTS SIMGP_AREAS)
   get_filename_component(stem ${area} NAME)
@@ -83,6 +85,9 @@ function(simgp_add_vector_unit name target area)
   target_compile_options(${name} PRIVATE ${${target}_flags})
   if(area IN_LIST SIMGP_AREAS_OF_LINES)
     target_compile_options(${name} PRIVATE -fno-tree-slp-vectorize)
+  endif()
+  if(area IN_LIST SIMGP_ALIGNED_AREAS AND NOT target STREQUAL neon)
+    target_compile_options(${name} PRIVATE -falign-functions=64 -falign-loops=64)
   endif()
   if(area IN_LIST SIMGP_SMALL_AREAS OR area IN_LIST SIMGP_SMALL_AREAS_${target})
     target_compile_options(${name} PRIVATE $<$<CONFIG:Release>:-O2>)
