@@ -338,7 +338,7 @@ inline pairs_v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
     });
 }
 // Within blocks: the lower 8 bytes as the even ones, the upper 8 as the odd ones.
-inline pairs_v load_halves(const uint8_t *p) {
+inline pairs_v load_block_halves(const uint8_t *p) {
     return make<u8v>([&](int i) { return p[i / 16 * 16 + i % 2 * 8 + i % 16 / 2]; });
 }
 // The even bytes of u and v as pairs, and the odd ones.

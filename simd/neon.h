@@ -200,7 +200,7 @@ inline pairs_v load_pairs_twice(const uint8_t *p, const uint8_t *q) {
     memcpy(&b, q, sizeof b);
     return {vreinterpret_u8_u32(vdup_n_u32(a)), vreinterpret_u8_u32(vdup_n_u32(b))};
 }
-inline pairs_v load_halves(const uint8_t *p) {
+inline pairs_v load_block_halves(const uint8_t *p) {
 #ifdef __aarch64__
     return load_pairs(p, p + 8);
 #else

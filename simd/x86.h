@@ -22,7 +22,7 @@ inline pairs_v load_pairs(const uint8_t *p) { return load(p); }
 inline pairs_v load_pairs(const uint8_t *p, const uint8_t *q) { return load_zip(p, q); }
 inline pairs_v load_pair_halves(const uint8_t *p, const uint8_t *q) { return load_halves(p, q); }
 inline u8v zip_halves(u8v v) { return zip_low<1>(v, zip_high<8>(v, v)); }
-inline pairs_v load_halves(const uint8_t *p) { return zip_halves(load(p)); }
+inline pairs_v load_block_halves(const uint8_t *p) { return zip_halves(load(p)); }
 // What takes pairs apart has the even bytes' places first.
 inline pairs_v exchange_pairs(pairs_v v, split_moves moves) {
     return shuffle(v, zip_halves(moves));

@@ -141,7 +141,8 @@ template <pixel_kind Kind>
             move_steps_ahead<bytes>(
                 whole, lines_in<1, 1, 1>{{y, c.first, c.last}}, lines_out<size>{{dst}},
                 [](const uint8_t *const *p) {
-                    return full_pixels{load_halves(p[0]), load_halves(p[1]), load_halves(p[2])};
+                    return full_pixels{load_block_halves(p[0]), load_block_halves(p[1]),
+                                       load_block_halves(p[2])};
                 },
                 [&](const full_pixels &p) { return channels_of_full(m, p); },
                 [&](uint8_t *const *q, const channels_v &p) {

@@ -64,7 +64,9 @@ inline void whole_steps(ptrdiff_t count, F step) {
     }
 }
 
-// The same with step(x, pixels), for which load(x) is called one step ahead.
+// The same with step(x, pixels), for which load(x) is called one step ahead: that hides the loads' latency, and
+// keeps a row right whose output lies over samples. Whatever was stored by then lies before the pixels that a
+// load is for.
 template <int Step = bytes, class Load, class F>
 inline void whole_steps_ahead(ptrdiff_t count, Load load, F step) {
     const ptrdiff_t last = count - Step;
@@ -95,28 +97,6 @@ inline void whole_steps_ahead(ptrdiff_t count, Load load, F step) {
         x = next;
         pixels = ahead;
     }
-}
-
-// Converts `width` >= 1 pixels, `bytes` at a time:
-//   load(x)         the samples of pixels x ... x + bytes - 1
-//   write(x, those) computes the pixels and stores them at their places
-//   part(x, n)      converts n <= bytes pixels from x on and touches nothing else
-// Reads the samples of the pixels and writes the pixels, nothing else.
-//
-// A row of at least a vector takes whole steps. The last one ends at the last pixel and may do some
-// pixels again. Samples are loaded one step ahead of the stores, which hides the loads' latency and
-// keeps the row right where output lies over samples: whatever was stored by then lies before the
-// pixels that a load is for. Where steps begin at even pixels, the last pixel of an odd row stands
-// alone.
-template <bool PixelsInPairs, class Load, class Write, class Part>
-inline void row_of_steps(ptrdiff_t width, Load load, Write write, Part part) {
-    const ptrdiff_t whole = PixelsInPairs ? width & ~ptrdiff_t(1) : width;
-    ptrdiff_t done = 0;
-    if (whole >= bytes) {
-        whole_steps_ahead(whole, load, write);
-        done = whole;
-    }
-    if (done < width) part(done, int(width - done));
 }
 
 // Samples in steps of `Step`: vector(x) does so many of them from x on, one(x) one. The last step
@@ -199,7 +179,7 @@ template <int AtOnce = 1, int Step = bytes, class In, class Out, class Load, cla
 
 // put(out.p, compute(pixels)) for every Step of `count` >= Step samples, where load(in.p) gives the pixels.
 // Those of the next step are loaded when these have been computed and before they are stored, which keeps
-// the row right where output lies over samples, as in row_of_steps. The last step ends at the last sample
+// the row right where output lies over samples, as in whole_steps_ahead. The last step ends at the last sample
 // and may do some again.
 template <int Step, class In, class Out, class Load, class Compute, class Put>
 [[gnu::always_inline]] inline void move_steps_ahead(ptrdiff_t count, In in, Out out, Load load,

@@ -101,7 +101,7 @@ static const operation operations[] = {
     VECTOR("mean_down_u16", u16, mean_down_u16(a, b)),
     VECTOR("half_difference", u16, half_difference(a, b)),
     VECTOR("sub_sat_u16", u16, sub_sat_u16(a, b)),
-    MEMORY("load_halves, mul_add", bytes, const pairs_v v = load_halves(in - bytes); put(out, mul_add(mul(even(v), set_pair_bytes(in[-bytes])), odd(v), set_pair_bytes(255)))),
+    MEMORY("load_block_halves, mul_add", bytes, const pairs_v v = load_block_halves(in - bytes); put(out, mul_add(mul(even(v), set_pair_bytes(in[-bytes])), odd(v), set_pair_bytes(255)))),
     MEMORY("exchange_pairs", bytes, put(out, pair_dot<100, 7, 0>(exchange_pairs(load_pairs(in - bytes), set_split_moves(true))))),
     MEMORY("exchange_pairs, in order", bytes, put(out, pair_dot<100, 7, 0>(exchange_pairs(load_pairs(in - bytes), set_split_moves(false))))),
     MEMORY("load_pairs, mul", bytes, put(out, mul(odd(load_pairs(in - bytes / 2, in - 3 * bytes)), set_pair_bytes(in[-bytes])))),
